@@ -1,0 +1,16 @@
+# Flags that every target gets.
+add_library(plexor_flags INTERFACE)
+target_compile_options(plexor_flags INTERFACE
+    -Wall -Wextra -Wpedantic -Wshadow -Wformat=2 -fstack-protector-strong)
+target_link_libraries(plexor_flags INTERFACE Threads::Threads)
+
+if(PLEXOR_SANITIZE)
+    add_compile_options(-fsanitize=${PLEXOR_SANITIZE} -fno-omit-frame-pointer -fno-sanitize-recover=all)
+    add_link_options(-fsanitize=${PLEXOR_SANITIZE})
+elseif(CMAKE_BUILD_TYPE STREQUAL "Release")
+    target_compile_definitions(plexor_flags INTERFACE _FORTIFY_SOURCE=2)
+endif()
+if(PLEXOR_COVERAGE)
+    add_compile_options(--coverage -O0)
+    add_link_options(--coverage)
+endif()

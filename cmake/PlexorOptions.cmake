@@ -1,0 +1,11 @@
+# What an integrator chooses when configuring.
+option(PLEXOR_CONTEXT_FLUSH
+       "The host's CMPI context table has the entry 'flush' after 'addEntry' (OFF: any standard manager)" ON)
+option(PLEXOR_BUILD_TESTBED "Build the test bed (object manager with a simulated vendor)" ON)
+option(PLEXOR_BUILD_TESTS "Build the tests" ON)
+set(PLEXOR_CMPI_INCLUDE_DIR "" CACHE PATH
+    "Directory of an installed CMPI header set (empty: the declarations in cim/cmpi)")
+set(PLEXOR_HOSTCONFIG "" CACHE STRING
+    "Library of the host's option store (empty: the file-backed stand-in in cim/hostconfig)")
+set(PLEXOR_SANITIZE "" CACHE STRING "Sanitizers for every target, as -fsanitize takes them")
+option(PLEXOR_COVERAGE "Instrument for coverage" OFF)

@@ -1,0 +1,2 @@
+/* The same checks in the other language. */
+#include "stubs.c"
