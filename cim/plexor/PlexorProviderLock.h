@@ -1,0 +1,45 @@
+// Scoped locks and lock-free reads of the provider's shared words.
+//
+// Lock order, outermost first:
+//   1. PlexorThreadMutex            state of the workers
+//   2. a class's *CfgMutex          one refresh or build of a device class at a time
+//   3. a controller's CtrlMutex     its device lists and changing fields
+//   4. Fifo_t::Mutex                the work queue
+// The factory's own initialisation mutex is taken before all of them. Work functions run with
+// PlexorThreadMutex released. No broker query is made while CtrlMutex is held.
+#pragma once
+
+#include <pthread.h>
+#include <time.h>
+
+/// Holds a mutex for a scope, or until Unlock.
+class MutexGuard {
+public:
+    explicit MutexGuard(pthread_mutex_t& mutex) : mutex_(&mutex) {
+        locked_ = pthread_mutex_lock(mutex_) == 0;
+    }
+    ~MutexGuard() { Unlock(); }
+    MutexGuard(const MutexGuard&) = delete;
+    MutexGuard& operator=(const MutexGuard&) = delete;
+
+    /// False when the mutex could not be taken.
+    bool Locked() const { return locked_; }
+    void Unlock() {
+        if (locked_) pthread_mutex_unlock(mutex_);
+        locked_ = false;
+    }
+
+private:
+    pthread_mutex_t* mutex_;
+    bool locked_;
+};
+
+// Times that are read on request threads without a lock. Only their own value matters, so relaxed.
+inline time_t LoadTime(const time_t& time) { return __atomic_load_n(&time, __ATOMIC_RELAXED); }
+inline void StoreTime(time_t& time, time_t value) { __atomic_store_n(&time, value, __ATOMIC_RELAXED); }
+
+/// Stamps `field`, an update time of the controller that owns `ctrlMutex`, under that mutex.
+inline void StampTime(pthread_mutex_t& ctrlMutex, time_t& field) {
+    MutexGuard lock(ctrlMutex);
+    StoreTime(field, time(nullptr));
+}

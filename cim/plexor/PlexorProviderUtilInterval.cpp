@@ -1,0 +1,28 @@
+// The polling interval from the host's option store.
+#include <KerncfgAdvancedOption.h>
+#include <NodecfgAdvancedIntegerOption.h>
+
+#include "PlexorProviderUtil.h"
+
+namespace {
+
+constexpr int kDefaultIntervalSeconds = 20;
+constexpr const char kIntervalOption[] = "/UserVars/CIMtvx_plexorProviderPollingInterval";
+
+}  // namespace
+
+int GetSampelInterval() {
+    try {
+        const auto option = Kerncfg::Adv::AdvancedOptionImpl::FindOption(kIntervalOption);
+        if (option == nullptr) {
+            syslog(LOG_ERR, "%s: %s not found", __func__, kIntervalOption);
+            return kDefaultIntervalSeconds;
+        }
+        if (option->IsDefault()) return kDefaultIntervalSeconds;
+        auto* integer = dynamic_cast<Nodecfg::Adv::AdvancedIntegerOption*>(option.get());
+        return integer != nullptr ? integer->GetValue() : kDefaultIntervalSeconds;
+    } catch (...) {
+        // The option store is another component's: whatever it throws stays here.
+        return kDefaultIntervalSeconds;
+    }
+}

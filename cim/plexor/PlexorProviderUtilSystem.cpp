@@ -1,0 +1,80 @@
+// The identity of the host that contains everything the provider serves.
+#include <stdlib.h>
+
+#include "PlexorProviderUtil.h"
+
+char* __SystemName = nullptr;
+char* __HostName = nullptr;
+char* __SystemClassName = nullptr;
+
+namespace {
+
+/// First instance of the host class, the broker's; null when there is none, which is logged.
+CMPIInstance* FindHostInstance(const CMPIContext* ctx, const CMPIObjectPath* path) {
+    CMPIStatus status = {CMPI_RC_OK, nullptr};
+    const CMPIBroker* broker = CurrentBroker();
+    CMPIEnumeration* hosts = nullptr;
+    if (path != nullptr) {
+        hosts = broker->bft->enumerateInstances(broker, ctx, path, nullptr, &status);
+    }
+    CMPIInstance* host = nullptr;
+    if (status.rc == CMPI_RC_OK && HasNext(hosts)) host = NextInstance(hosts);
+    if (host != nullptr) return host;
+
+    const char* message = StringText(status.msg);
+    if (message != nullptr) {
+        syslog(LOG_ERR, "%s: no instance found. rc %d, msg %s\n", "InitSystemInfo", status.rc,
+               message);
+    } else {
+        syslog(LOG_ERR, "%s: no instance found. rc %d\n", "InitSystemInfo", status.rc);
+    }
+    return nullptr;
+}
+
+void StoreName(char*& field, const CMPIInstance* host, const char* property) {
+    const char* text = ReadString(host, property);
+    if (text != nullptr) field = StringClone(text);
+}
+
+void ReleaseName(char*& field) {
+    free(field);
+    field = nullptr;
+}
+
+}  // namespace
+
+int InitSystemInfo(const CMPIInstanceMI*, const CMPIContext* ctx) {
+    syslog(LOG_DEBUG, "%s: entering...\n", __func__);
+    if (__SystemName != nullptr) return RESULT_OK;
+
+    CMPIStatus status = {CMPI_RC_OK, nullptr};
+    const CMPIBroker* broker = CurrentBroker();
+    CMPIObjectPath* path = broker->eft->newObjectPath(broker, "root/cimv2",
+                                                      "OMC_UnitaryComputerSystem", &status);
+    if (status.rc != CMPI_RC_OK) {
+        syslog(LOG_ERR, "%s: rc %d, msg %s\n", __func__, status.rc, StatusText(status));
+        return RESULT_NO_MEMORY;
+    }
+    syslog(LOG_DEBUG, "%s, CIM Query - EnumInstances: %s", __func__, PathText(LOG_DEBUG, path));
+    const CMPIInstance* host = FindHostInstance(ctx, path);
+    if (host == nullptr) return RESULT_NOTHING;
+
+    // A name that an earlier, incomplete reading left is replaced, not leaked.
+    ReleaseSystemInfo();
+    StoreName(__SystemName, host, "Name");
+    StoreName(__HostName, host, "ElementName");
+    StoreName(__SystemClassName, host, "CreationClassName");
+    syslog(LOG_DEBUG, "SYSTEM INFO: HostName %s, SystemName %s, SystemClassName %s\n", __HostName,
+           __SystemName, __SystemClassName);
+    return RESULT_OK;
+}
+
+void ReleaseSystemInfo() {
+    ReleaseName(__SystemClassName);
+    ReleaseName(__HostName);
+    ReleaseName(__SystemName);
+}
+
+const char* GetHostName() { return __HostName; }
+const char* GetSystemName() { return __SystemName; }
+const char* GetSystemClassName() { return __SystemClassName; }
