@@ -1,0 +1,62 @@
+// What the inventory's files share: broker queries and the quiet stop of the workers.
+#pragma once
+
+#include <stdlib.h>
+
+#include "PlexorProviderUtil.h"
+
+/// A query of the broker: everything that its call and its log lines name.
+struct Query_t {
+    const char* Caller;            ///< name of the function that asks
+    const CMPIContext* Context;    ///< context of the calling thread
+    const CMPIObjectPath* Source;  ///< path it is made on
+    const char* AssocClass;        ///< null: any
+    const char* ResultClass;       ///< null: any
+};
+
+// Each of these logs the query. The queries below them do so themselves; a caller that must log
+// something between the two uses LogAssociators and RunAssociators.
+void LogAssociators(const Query_t& query);
+void LogAssociatorNames(const Query_t& query);
+
+// Each logs the query, makes it, and logs its failure. The result is the broker's; null when the
+// query failed or there is nothing. Made without CtrlMutex. While the workers are being stopped,
+// nothing is asked and the answer is null. `failed`, when given, is set if the query failed.
+CMPIEnumeration* QueryInstances(const char* caller, const CMPIContext* ctx,
+                                const CMPIObjectPath* path);
+CMPIEnumeration* QueryAssociators(const Query_t& query);
+CMPIEnumeration* QueryAssociatorNames(const Query_t& query);
+CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx, const CMPIObjectPath* path);
+
+// The same without the line before the query.
+CMPIEnumeration* RunAssociators(const Query_t& query);
+CMPIEnumeration* RunAssociatorNames(const Query_t& query);
+
+/// The first instance (path) of a query's result; null when it has none.
+CMPIInstance* FirstInstance(const CMPIEnumeration* enumeration);
+CMPIObjectPath* FirstPath(const CMPIEnumeration* enumeration);
+
+/// Appends `record` to `list` and stamps `updateTime` when that worked. The list's code. The caller
+/// holds CtrlMutex.
+int AppendRecord(List_t* list, void* record, time_t& updateTime);
+
+/// A zero-filled record or work item; null without memory. Released with free().
+template <typename Record>
+Record* NewRecord() {
+    return static_cast<Record*>(calloc(1, sizeof(Record)));
+}
+
+/// Frees a work item of ProcessBuildLogicalDeviceInfo with the clones in it.
+void ReleaseDeviceItem(Thread_Args_t* item);
+
+// Stopping the workers before the inventory is released.
+
+/// Takes back an earlier QuiesceWorkers; called before an inventory is begun.
+void AdmitWork();
+
+/// True from the start of QuiesceWorkers: work functions come to an end soon, asking nothing more.
+bool StopRequested();
+
+/// Waits until no work function is running and lets none start. False when one is still running
+/// after the time limit: then nothing that it may use can be released.
+bool QuiesceWorkers();

@@ -1,0 +1,172 @@
+// Building the controllers behind the profiles, and their (empty) update.
+#include <stdlib.h>
+
+#include "PlexorProviderCfg.h"
+#include "PlexorProviderLock.h"
+
+namespace {
+
+constexpr const char kBuilder[] = "BuildControllerInfo";
+
+/// CIM_SoftwareIdentity.Classifications, as far as it names a field of the record.
+char** VersionField(RaidController_t* ctrl, CMPIUint16 classification) {
+    switch (classification) {
+        case 10:
+            return &ctrl->FirmwareVersion;
+        case 11:
+            return &ctrl->BiosVersion;
+        case 2:
+            return &ctrl->DriverVersion;
+        case 0:
+        case 13:
+            return &ctrl->BundleVersion;
+        default:
+            return nullptr;
+    }
+}
+
+void InitLocksAndLists(RaidController_t* ctrl) {
+    pthread_mutex_init(&ctrl->CtrlMutex, nullptr);
+    pthread_mutex_init(&ctrl->DiskCfgMutex, nullptr);
+    pthread_mutex_init(&ctrl->VolumeCfgMutex, nullptr);
+    pthread_mutex_init(&ctrl->PortCfgMutex, nullptr);
+    pthread_mutex_init(&ctrl->BatteryCfgMutex, nullptr);
+    pthread_mutex_init(&ctrl->PoolCfgMutex, nullptr);
+    pthread_mutex_init(&ctrl->ChassisCfgMutex, nullptr);
+    ctrl->VolumeList = &ctrl->__VolumeList;
+    ctrl->DiskList = &ctrl->__DiskList;
+    ctrl->PoolList = &ctrl->__PoolList;
+    ctrl->BatteryList = &ctrl->__BatteryList;
+    ctrl->ChassisList = &ctrl->__ChassisList;
+    ctrl->PortList = &ctrl->__PortList;
+}
+
+/// The port controller itself. False without DeviceID.
+bool ReadPortController(RaidController_t* ctrl, const CMPIInstance* inst) {
+    ctrl->PortControllerOp = ClonePath(InstancePath(inst));
+    ctrl->DeviceID = StringClone(ReadString(inst, "DeviceID"));
+    if (ctrl->DeviceID != nullptr) return true;
+    syslog(LOG_ERR, "NULL DeviceID for PortController: %s\n",
+           PathText(LOG_ERR, ctrl->PortControllerOp));
+    return false;
+}
+
+/// The computer system that stands for the controller. False without one.
+bool ReadComputerSystem(RaidController_t* ctrl, const CMPIContext* ctx) {
+    const Query_t query = {kBuilder, ctx, ctrl->PortControllerOp, "CIM_LogicalIdentity",
+                           "CIM_ComputerSystem"};
+    LogAssociators(query);
+    syslog(LOG_DEBUG, "PortController: %s\n", PathText(LOG_DEBUG, ctrl->PortControllerOp));
+    const CMPIInstance* system = FirstInstance(RunAssociators(query));
+    if (system == nullptr) return false;
+    ctrl->ControllerOp = ClonePath(InstancePath(system));
+    ctrl->OperationalStatus = GetOperationalStatus(system);
+    return true;
+}
+
+void ReadPackage(RaidController_t* ctrl, const CMPIContext* ctx) {
+    const CMPIInstance* package = FirstInstance(QueryAssociators(
+        {kBuilder, ctx, ctrl->PortControllerOp, "CIM_Realizes", "CIM_PhysicalPackage"}));
+    if (package == nullptr) return;
+    ctrl->Model = StringClone(ReadString(package, "Model"));
+    ctrl->HealthState = ReadUint16(package, "HealthState");
+}
+
+void ReadSoftware(RaidController_t* ctrl, const CMPIContext* ctx) {
+    CMPIEnumeration* identities = QueryAssociators(
+        {kBuilder, ctx, ctrl->ControllerOp, "CIM_ElementSoftwareIdentity", "CIM_SoftwareIdentity"});
+    while (HasNext(identities)) {
+        const CMPIInstance* identity = NextInstance(identities);
+        if (identity == nullptr) continue;
+        const CMPIUint16 classification = ReadArrayUint16(identity, "Classifications");
+        char* version = StringClone(ReadString(identity, "VersionString"));
+        syslog(LOG_DEBUG, "%s: ctrl %s, swClass %d, versionStr %s\n", kBuilder, ctrl->DeviceID,
+               classification, version);
+        char** field = VersionField(ctrl, classification);
+        if (field == nullptr) {
+            free(version);
+            continue;
+        }
+        free(*field);
+        *field = version;
+    }
+}
+
+void DumpController(const RaidController_t* ctrl) {
+    syslog(LOG_INFO,
+           "\nPortControllerOp: %s\nControllerOp:     %s\n\tDeviceID          - %s\n"
+           "\tModel             - %s\n\tFirmwareVersion   - %s\n\tBiosVersion       - %s\n"
+           "\tDriverVersion     - %s\n\tBundleVersion     - %s\n\tHealthState       - %d\n"
+           "\tOperationalStatus - %d\n",
+           PathText(LOG_INFO, ctrl->PortControllerOp), PathText(LOG_INFO, ctrl->ControllerOp),
+           ctrl->DeviceID, ctrl->Model, ctrl->FirmwareVersion, ctrl->BiosVersion,
+           ctrl->DriverVersion, ctrl->BundleVersion, ctrl->HealthState, ctrl->OperationalStatus);
+}
+
+/// Builds and appends one controller. Not 0 only when memory is short; an unusable port controller
+/// is skipped with 0.
+int BuildController(const CMPIContext* ctx, const CMPIInstance* inst) {
+    auto* ctrl = NewRecord<RaidController_t>();
+    if (ctrl == nullptr) {
+        syslog(LOG_ERR, "%s, failed to allocate memory for RaidController_t\n", kBuilder);
+        return RESULT_NO_MEMORY;
+    }
+    InitLocksAndLists(ctrl);
+    if (!ReadPortController(ctrl, inst) || !ReadComputerSystem(ctrl, ctx)) {
+        FreeController(ctrl);
+        return RESULT_OK;
+    }
+    ReadPackage(ctrl, ctx);
+    ReadSoftware(ctrl, ctx);
+    StoreTime(ctrl->ControllerUpdateTime, time(nullptr));
+    DumpController(ctrl);
+
+    const int rc = AddEntryAtListTail(RaidControllerList, ctrl);
+    if (rc != RESULT_OK) {
+        syslog(LOG_ERR, "%s: failed to add controller to list, rc %d.\n", kBuilder, rc);
+        FreeController(ctrl);
+        return rc;
+    }
+    syslog(LOG_DEBUG, "%s: controller %p added to the list\n", kBuilder, static_cast<void*>(ctrl));
+    return RESULT_OK;
+}
+
+int BuildControllersOfProfile(const CMPIContext* ctx, const CMPIInstance* profile) {
+    const CMPIObjectPath* path = InstancePath(profile);
+    if (path == nullptr) return RESULT_OK;
+    CMPIEnumeration* found = QueryAssociators(
+        {kBuilder, ctx, path, "CIM_ElementConformsToProfile", "CIM_PortController"});
+    while (HasNext(found)) {
+        const CMPIInstance* inst = NextInstance(found);
+        if (inst == nullptr) continue;
+        const int rc = BuildController(ctx, inst);
+        if (rc != RESULT_OK) return rc;
+    }
+    return RESULT_OK;
+}
+
+}  // namespace
+
+int BuildControllerInfo(const CMPIInstanceMI*, const CMPIContext* ctx, Array_t* profiles) {
+    syslog(LOG_DEBUG, "%s, enter...\n", __func__);
+    int rc = RESULT_OK;
+    for (unsigned int i = 0; i < profiles->Count && rc == RESULT_OK; i++) {
+        rc = BuildControllersOfProfile(ctx, static_cast<CMPIInstance*>(profiles->Array[i]));
+    }
+    // Short of memory, half an inventory would pass for the whole: have none.
+    if (rc != RESULT_OK) FreeList(RaidControllerList, FreeController);
+    syslog(LOG_DEBUG, "%s, EXIT(%d).\n", __func__, rc);
+    return rc;
+}
+
+int NeedUpdate(time_t, unsigned char) { return 1; }
+
+int CheckAndUpdateControllerInfo(const CMPIInstanceMI*, const CMPIContext*, RaidController_t* ctrl,
+                                 void*, CMPIInstance*) {
+    syslog(LOG_DEBUG, "%s, enter...\n", __func__);
+    if (NeedUpdate(LoadTime(ctrl->ControllerUpdateTime), ctrl->UpdateEnabled)) {
+        StampTime(ctrl->CtrlMutex, ctrl->ControllerUpdateTime);
+    }
+    syslog(LOG_DEBUG, "%s, exit.\n", __func__);
+    return RESULT_OK;
+}

@@ -1,0 +1,175 @@
+// Storage pools and enclosures: the two walks that a worker does inline, and their builders.
+#include <stdlib.h>
+
+#include "PlexorProviderCfg.h"
+#include "PlexorProviderLock.h"
+
+namespace {
+
+/// What differs between the walk over the pools and the walk over the chassis.
+struct Walk {
+    const char* caller;
+    const char* assocClass;
+    const char* resultClass;
+    pthread_mutex_t RaidController_t::*classMutex;
+    BuildFunc_t build;
+};
+
+/// Builds every device of the walk, up to the first that fails. Its code, or 0.
+int BuildAll(const Walk& walk, const CMPIInstanceMI* mi, const CMPIContext* ctx,
+             RaidController_t* ctrl) {
+    CMPIEnumeration* found = QueryAssociators(
+        {walk.caller, ctx, ctrl->ControllerOp, walk.assocClass, walk.resultClass});
+    if (found == nullptr) return RESULT_OK;
+
+    MutexGuard lock(ctrl->*walk.classMutex);
+    while (HasNext(found)) {
+        const CMPIInstance* inst = NextInstance(found);
+        if (inst == nullptr) continue;
+        const int rc = walk.build(mi, ctx, ctrl, inst, InstancePath(inst));
+        if (rc != RESULT_OK) return rc;
+    }
+    return RESULT_OK;
+}
+
+/// The tag without the controller's DeviceID and the underscores behind it; null when it does not
+/// begin with the DeviceID or nothing is left.
+const char* InternalTagOf(const char* tag, const char* controllerId) {
+    const size_t length = strlen(controllerId);
+    if (strncmp(tag, controllerId, length) != 0) return nullptr;
+    const char* rest = tag + length + strspn(tag + length, "_");
+    return *rest != '\0' ? rest : nullptr;
+}
+
+int BuildPool(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObjectPath* op) {
+    constexpr const char kCaller[] = "BuildSinglePoolInfo";
+    auto* pool = NewRecord<StoragePool_t>();
+    if (pool == nullptr) {
+        syslog(LOG_ERR, "%s, failed to allocate memory for StoragePool_t\n", kCaller);
+        return RESULT_NO_MEMORY;
+    }
+    pool->Drives = &pool->_Drives;
+    pool->PoolOp = ClonePath(op);
+    pool->InstanceID = StringClone(ReadString(inst, "InstanceID"));
+    pool->PoolID = StringClone(ReadString(inst, "PoolID"));
+    if (pool->InstanceID == nullptr || pool->PoolID == nullptr) {
+        syslog(LOG_ERR, "NULL InstanceID or PoolID for pool %s\n", PathText(LOG_ERR, pool->PoolOp));
+        FreePool(pool);
+        return RESULT_BAD_ARGUMENT;
+    }
+    pool->TotalManagedSpace = ReadUint64(inst, "TotalManagedSpace");
+    pool->RemainingManagedSpace = ReadUint64(inst, "RemainingManagedSpace");
+    pool->Primordial = ReadBoolean(inst, "Primordial");
+    pool->OperationalStatus = GetOperationalStatus(inst);
+    pool->LastUpdateTime = time(nullptr);
+    syslog(LOG_INFO,
+           "\nPoolOp: %s\n\tInstanceID            - %s\n\tPoolId                - %s\n"
+           "\tPrimordial            - %d\n\tTotalManagedSpace     - %llu\n"
+           "\tRemainingManagedSpace - %llu\n\tOperationalStatus     - %d\n",
+           PathText(LOG_INFO, pool->PoolOp), pool->InstanceID, pool->PoolID, pool->Primordial,
+           pool->TotalManagedSpace, pool->RemainingManagedSpace, pool->OperationalStatus);
+
+    MutexGuard lock(ctrl->CtrlMutex);
+    const int rc = AppendRecord(ctrl->PoolList, pool, ctrl->PoolUpdateTime);
+    lock.Unlock();
+    if (rc != RESULT_OK) {
+        syslog(LOG_ERR, "%s: failed to add pool to list, rc %d.\n", kCaller, rc);
+        FreePool(pool);
+        return rc;
+    }
+    syslog(LOG_DEBUG, "%s: pool %p added to the list\n", kCaller, static_cast<void*>(pool));
+    return RESULT_OK;
+}
+
+int BuildChassis(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObjectPath* op) {
+    constexpr const char kCaller[] = "BuildSingleChassisInfo";
+    auto* chassis = NewRecord<Chassis_t>();
+    if (chassis == nullptr) {
+        syslog(LOG_ERR, "%s, failed to allocate memory for Chassis_t\n", kCaller);
+        return RESULT_NO_MEMORY;
+    }
+    chassis->ChassisOp = ClonePath(op);
+    chassis->Tag = StringClone(ReadString(inst, "Tag"));
+    if (chassis->Tag == nullptr) {
+        syslog(LOG_ERR, "NULL tag for chassis %s\n", PathText(LOG_ERR, chassis->ChassisOp));
+        FreeChassis(chassis);
+        return RESULT_BAD_ARGUMENT;
+    }
+    chassis->OperationalStatus = GetOperationalStatus(inst);
+    chassis->InternalTag = StringClone(InternalTagOf(chassis->Tag, ctrl->DeviceID));
+    chassis->LastUpdateTime = time(nullptr);
+    syslog(LOG_DEBUG,
+           "\nChassisOp: %s\n\tTag               - %s\n\tInternalTag       - %s\n"
+           "\tOperationalStatus - %d\n",
+           PathText(LOG_DEBUG, chassis->ChassisOp), chassis->Tag, chassis->InternalTag,
+           chassis->OperationalStatus);
+
+    MutexGuard lock(ctrl->CtrlMutex);
+    const int rc = AppendRecord(ctrl->ChassisList, chassis, ctrl->ChassisUpdateTime);
+    lock.Unlock();
+    if (rc != RESULT_OK) {
+        syslog(LOG_ERR, "%s: failed to add chassis to list, rc %d.\n", kCaller, rc);
+        FreeChassis(chassis);
+        return rc;
+    }
+    syslog(LOG_DEBUG, "%s: chassis %p added to the list\n", kCaller, static_cast<void*>(chassis));
+    return RESULT_OK;
+}
+
+}  // namespace
+
+int BuildPoolInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx, RaidController_t* ctrl) {
+    constexpr Walk kWalk = {"BuildPoolInfo", "CIM_HostedStoragePool", "CIM_StoragePool",
+                            &RaidController_t::PoolCfgMutex, BuildSinglePoolInfo};
+    syslog(LOG_DEBUG, "%s, ENTER...\n", __func__);
+    const int rc = BuildAll(kWalk, mi, ctx, ctrl);
+    syslog(LOG_DEBUG, "%s, EXIT(%d).\n", __func__, rc);
+    return rc;
+}
+
+int BuildChassisInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx, RaidController_t* ctrl) {
+    constexpr Walk kWalk = {"BuildChassisInfo", "CIM_SystemPackaging", "CIM_Chassis",
+                            &RaidController_t::ChassisCfgMutex, BuildSingleChassisInfo};
+    syslog(LOG_DEBUG, "%s, enter...\n", __func__);
+    const int rc = BuildAll(kWalk, mi, ctx, ctrl);
+    syslog(LOG_DEBUG, "%s, EXIT(%d).\n", __func__, rc);
+    return rc;
+}
+
+int BuildSinglePoolInfo(const CMPIInstanceMI*, const CMPIContext*, RaidController_t* ctrl,
+                        const CMPIInstance* poolInstance, const CMPIObjectPath* poolOp) {
+    syslog(LOG_DEBUG, "%s, enter...\n", __func__);
+    const int rc = BuildPool(ctrl, poolInstance, poolOp);
+    syslog(LOG_DEBUG, "%s, EXIT(%d).\n", __func__, rc);
+    return rc;
+}
+
+int BuildSingleChassisInfo(const CMPIInstanceMI*, const CMPIContext*, RaidController_t* ctrl,
+                           const CMPIInstance* chassisInstance, const CMPIObjectPath* chassisOp) {
+    syslog(LOG_DEBUG, "%s, enter...\n", __func__);
+    const int rc = BuildChassis(ctrl, chassisInstance, chassisOp);
+    syslog(LOG_DEBUG, "%s, EXIT(%d).\n", __func__, rc);
+    return rc;
+}
+
+int CheckAndUpdatePoolInfo(const CMPIInstanceMI*, const CMPIContext*, RaidController_t* ctrl,
+                           void* device, CMPIInstance*) {
+    const auto* pool = static_cast<StoragePool_t*>(device);
+    syslog(LOG_DEBUG, "%s: ENTER. pool - %s\n", __func__, pool->InstanceID);
+    if (NeedUpdate(pool->LastUpdateTime, pool->UpdateEnabled)) {
+        StampTime(ctrl->CtrlMutex, ctrl->PoolUpdateTime);
+    }
+    syslog(LOG_DEBUG, "%s, exit.\n", __func__);
+    return RESULT_OK;
+}
+
+int CheckAndUpdateChassisInfo(const CMPIInstanceMI*, const CMPIContext*, RaidController_t* ctrl,
+                              void* device, CMPIInstance*) {
+    const auto* chassis = static_cast<Chassis_t*>(device);
+    syslog(LOG_DEBUG, "%s, enter...\n", __func__);
+    if (NeedUpdate(chassis->LastUpdateTime, chassis->UpdateEnabled)) {
+        StampTime(ctrl->CtrlMutex, ctrl->ChassisUpdateTime);
+    }
+    syslog(LOG_DEBUG, "%s, exit.\n", __func__);
+    return RESULT_OK;
+}
