@@ -23,8 +23,7 @@ std::string Trim(const std::string& text) {
 
 bool IsNumber(const std::string& text) {
     const std::size_t start = text[0] == '-' || text[0] == '+' ? 1 : 0;
-    return text.size() > start &&
-           text.find_first_not_of("0123456789", start) == std::string::npos;
+    return text.size() > start && text.find_first_not_of("0123456789", start) == std::string::npos;
 }
 
 std::unique_ptr<Kerncfg::Adv::AdvancedOption> MakeOption(const std::string& value) {
@@ -78,7 +77,11 @@ std::unique_ptr<AdvancedOption> AdvancedOptionImpl::FindOption(const std::string
 namespace Nodecfg::Adv {
 
 AdvancedIntegerOption::~AdvancedIntegerOption() = default;
-bool AdvancedIntegerOption::IsDefault() const { return isDefault_; }
-int AdvancedIntegerOption::GetValue() const { return value_; }
+bool AdvancedIntegerOption::IsDefault() const {
+    return isDefault_;
+}
+int AdvancedIntegerOption::GetValue() const {
+    return value_;
+}
 
 }  // namespace Nodecfg::Adv

@@ -1,8 +1,9 @@
 // The stand-in for the host's option store: a text file.
 //
-// One option a line, `path = value`. Empty lines and lines that begin with `#` are comments. A value
-// is a decimal number (an integer option), the word `default` (an integer option at its default) or
-// anything else (a text option). The last line for a path counts. A missing file has no options.
+// One option a line, `path = value`. Empty lines and lines that begin with `#` are comments. A
+// value is a decimal number (an integer option), the word `default` (an integer option at its
+// default) or anything else (a text option). The last line for a path counts. A missing file has no
+// options.
 #pragma once
 
 #include <string>

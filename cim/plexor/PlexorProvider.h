@@ -1,9 +1,9 @@
 // The provider's shared header: records, enumerations, lists, work items and the functions that its
-// units (Ifc, Cfg, Util) call in each other. Dependencies point one way, Ifc -> Cfg -> Util; the only
-// references back are `Broker` and `InitCompleteTime`.
+// units (Ifc, Cfg, Util) call in each other. Dependencies point one way, Ifc -> Cfg -> Util; the
+// only references back are `Broker` and `InitCompleteTime`.
 //
-// Everything declared here with C linkage is exported under its plain name. Strings and object paths
-// in records are owned by the record; what the broker returned belongs to the broker.
+// Everything declared here with C linkage is exported under its plain name. Strings and object
+// paths in records are owned by the record; what the broker returned belongs to the broker.
 //
 // A comment "guarded by X" names the mutex that readers and writers of a field hold. The lock order
 // stands in PlexorProviderLock.h.
@@ -117,7 +117,7 @@ struct StorageVolume_t {
     CMPIUint16 NameFormat;
     CMPIUint16 NameNameSpace;
     CMPIUint16 ExtentStripeLength;
-    CMPIUint16 ExtentStatus;      ///< guarded by CtrlMutex
+    CMPIUint16 ExtentStatus;       ///< guarded by CtrlMutex
     CMPIUint16 OperationalStatus;  ///< guarded by CtrlMutex
     CMPIUint64 NumberOfBlocks;     ///< guarded by CtrlMutex
     CMPIUint64 ConsumableBlocks;   ///< guarded by CtrlMutex
@@ -293,8 +293,8 @@ enum ActionCode : int {
 // ---------------------------------------------------------------------------------------------
 // Util: lists, host identity, settings
 
-PLEXOR_API Fifo_t __FIFO;  ///< the one queue between requests and workers, limit 20
-PLEXOR_API char* __SystemName;       ///< also the mark that the identity has been read
+PLEXOR_API Fifo_t __FIFO;       ///< the one queue between requests and workers, limit 20
+PLEXOR_API char* __SystemName;  ///< also the mark that the identity has been read
 PLEXOR_API char* __HostName;
 PLEXOR_API char* __SystemClassName;
 
@@ -376,8 +376,8 @@ PLEXOR_API Chassis_t* FindChassisByTag(const RaidController_t* ctrl, const char*
 // ---------------------------------------------------------------------------------------------
 // Cfg: inventory
 
-/// Collects the vendor's registrations of the RAID profile. Number found (0 to 8), -1 null argument,
-/// -2 no object path, -5 more instances than slots.
+/// Collects the vendor's registrations of the RAID profile. Number found (0 to 8), -1 null
+/// argument, -2 no object path, -5 more instances than slots.
 PLEXOR_API int GetHHRCProfiles(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                Array_t* profileArray);
 /// Caches every usable controller behind the profiles. 0, or a negative code after which the list

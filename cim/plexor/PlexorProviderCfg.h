@@ -21,7 +21,7 @@ void LogAssociatorNames(const Query_t& query);
 
 // Each logs the query, makes it, and logs its failure. The result is the broker's; null when the
 // query failed or there is nothing. Made without CtrlMutex. While the workers are being stopped,
-// nothing is asked and the answer is null. `failed`, when given, is set if the query failed.
+// nothing is asked and the answer is null.
 CMPIEnumeration* QueryInstances(const char* caller, const CMPIContext* ctx,
                                 const CMPIObjectPath* path);
 CMPIEnumeration* QueryAssociators(const Query_t& query);
@@ -31,10 +31,6 @@ CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx, const CM
 // The same without the line before the query.
 CMPIEnumeration* RunAssociators(const Query_t& query);
 CMPIEnumeration* RunAssociatorNames(const Query_t& query);
-
-/// The first instance (path) of a query's result; null when it has none.
-CMPIInstance* FirstInstance(const CMPIEnumeration* enumeration);
-CMPIObjectPath* FirstPath(const CMPIEnumeration* enumeration);
 
 /// Appends `record` to `list` and stamps `updateTime` when that worked. The list's code. The caller
 /// holds CtrlMutex.

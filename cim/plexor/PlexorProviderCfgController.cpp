@@ -57,7 +57,7 @@ bool ReadComputerSystem(RaidController_t* ctrl, const CMPIContext* ctx) {
                            "CIM_ComputerSystem"};
     LogAssociators(query);
     syslog(LOG_DEBUG, "PortController: %s\n", PathText(LOG_DEBUG, ctrl->PortControllerOp));
-    const CMPIInstance* system = FirstInstance(RunAssociators(query));
+    const CMPIInstance* system = NextInstance(RunAssociators(query));
     if (system == nullptr) return false;
     ctrl->ControllerOp = ClonePath(InstancePath(system));
     ctrl->OperationalStatus = GetOperationalStatus(system);
@@ -65,7 +65,7 @@ bool ReadComputerSystem(RaidController_t* ctrl, const CMPIContext* ctx) {
 }
 
 void ReadPackage(RaidController_t* ctrl, const CMPIContext* ctx) {
-    const CMPIInstance* package = FirstInstance(QueryAssociators(
+    const CMPIInstance* package = NextInstance(QueryAssociators(
         {kBuilder, ctx, ctrl->PortControllerOp, "CIM_Realizes", "CIM_PhysicalPackage"}));
     if (package == nullptr) return;
     ctrl->Model = StringClone(ReadString(package, "Model"));
@@ -75,9 +75,7 @@ void ReadPackage(RaidController_t* ctrl, const CMPIContext* ctx) {
 void ReadSoftware(RaidController_t* ctrl, const CMPIContext* ctx) {
     CMPIEnumeration* identities = QueryAssociators(
         {kBuilder, ctx, ctrl->ControllerOp, "CIM_ElementSoftwareIdentity", "CIM_SoftwareIdentity"});
-    while (HasNext(identities)) {
-        const CMPIInstance* identity = NextInstance(identities);
-        if (identity == nullptr) continue;
+    while (const CMPIInstance* identity = NextInstance(identities)) {
         const CMPIUint16 classification = ReadArrayUint16(identity, "Classifications");
         char* version = StringClone(ReadString(identity, "VersionString"));
         syslog(LOG_DEBUG, "%s: ctrl %s, swClass %d, versionStr %s\n", kBuilder, ctrl->DeviceID,
@@ -136,9 +134,7 @@ int BuildControllersOfProfile(const CMPIContext* ctx, const CMPIInstance* profil
     if (path == nullptr) return RESULT_OK;
     CMPIEnumeration* found = QueryAssociators(
         {kBuilder, ctx, path, "CIM_ElementConformsToProfile", "CIM_PortController"});
-    while (HasNext(found)) {
-        const CMPIInstance* inst = NextInstance(found);
-        if (inst == nullptr) continue;
+    while (const CMPIInstance* inst = NextInstance(found)) {
         const int rc = BuildController(ctx, inst);
         if (rc != RESULT_OK) return rc;
     }
@@ -159,7 +155,9 @@ int BuildControllerInfo(const CMPIInstanceMI*, const CMPIContext* ctx, Array_t* 
     return rc;
 }
 
-int NeedUpdate(time_t, unsigned char) { return 1; }
+int NeedUpdate(time_t, unsigned char) {
+    return 1;
+}
 
 int CheckAndUpdateControllerInfo(const CMPIInstanceMI*, const CMPIContext*, RaidController_t* ctrl,
                                  void*, CMPIInstance*) {

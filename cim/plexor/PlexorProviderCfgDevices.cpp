@@ -1,4 +1,5 @@
-// The walk over a controller's logical devices: classify each, hand it to the workers, wait for them.
+// The walk over a controller's logical devices: classify each, hand it to the workers, wait for
+// them.
 #include <stdlib.h>
 #include <unistd.h>
 
@@ -127,9 +128,9 @@ int BuildLogicalDeviceInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
     ClassCache cache;
     CMPIEnumeration* devices =
         QueryAssociators({kCaller, ctx, ctrl->ControllerOp, "CIM_SystemDevice", nullptr});
-    while (HasNext(devices) && !StopRequested()) {
-        const CMPIInstance* inst = NextInstance(devices);
-        if (inst != nullptr) QueueDevice(mi, ctrl, inst, cache);
+    while (const CMPIInstance* inst = NextInstance(devices)) {
+        if (StopRequested()) break;
+        QueueDevice(mi, ctrl, inst, cache);
     }
     WaitUntilDone();
     syslog(LOG_DEBUG, "%s, DONE...\n", __func__);

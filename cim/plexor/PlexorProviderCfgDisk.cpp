@@ -23,8 +23,7 @@ bool ReadDrive(DiskDrive_t* disk, const CMPIInstance* inst) {
 
 /// The extent that stands for the drive's media. False without one.
 bool ReadMedia(DiskDrive_t* disk, const CMPIContext* ctx, const CMPIObjectPath* devOp) {
-    CMPIEnumeration* media =
-        QueryAssociators({kBuilder, ctx, devOp, "CIM_MediaPresent", nullptr});
+    CMPIEnumeration* media = QueryAssociators({kBuilder, ctx, devOp, "CIM_MediaPresent", nullptr});
     if (media == nullptr) return false;
     if (!HasNext(media)) {
         syslog(LOG_ERR, "Disk %s no media present\n", disk->DeviceID);
@@ -53,18 +52,18 @@ void ReadFirmware(DiskDrive_t* disk, const CMPIContext* ctx, const CMPIObjectPat
 
 /// Slot and enclosure, as far as the chain package, slot, chassis goes.
 void ReadLocation(DiskDrive_t* disk, const CMPIContext* ctx, const CMPIObjectPath* devOp) {
-    const CMPIObjectPath* package = FirstPath(
+    const CMPIObjectPath* package = NextPath(
         QueryAssociatorNames({kBuilder, ctx, devOp, "CIM_Realizes", "CIM_PhysicalPackage"}));
     if (package == nullptr) return;
     syslog(LOG_DEBUG, "CIM_PhysicalPackage(Physical Drive): %s\n", PathText(LOG_DEBUG, package));
 
-    const CMPIInstance* slot = FirstInstance(
+    const CMPIInstance* slot = NextInstance(
         QueryAssociators({kBuilder, ctx, package, "CIM_PackageInConnector", "CIM_Slot"}));
     if (slot == nullptr) return;
     disk->SlotNumber = ReadUint16(slot, "Number");
 
-    const CMPIObjectPath* chassis = FirstPath(QueryAssociatorNames(
-        {kBuilder, ctx, InstancePath(slot), "CIM_Container", "CIM_Chassis"}));
+    const CMPIObjectPath* chassis = NextPath(
+        QueryAssociatorNames({kBuilder, ctx, InstancePath(slot), "CIM_Container", "CIM_Chassis"}));
     disk->Chassis = StringClone(ReadKey(chassis, "Tag"));
 }
 
@@ -94,8 +93,8 @@ CMPIEnumeration* CandidatePools(const DiskDrive_t* disk, const CMPIContext* ctx)
 int Insert(RaidController_t* ctrl, DiskDrive_t* disk, StoragePool_t* pool) {
     const int rc = AppendRecord(ctrl->DiskList, disk, ctrl->DiskUpdateTime);
     if (rc == RESULT_OK) {
-        syslog(LOG_DEBUG, "%s: disk %p added to the list %p\n", kBuilder,
-               static_cast<void*>(disk), static_cast<void*>(ctrl->DiskList));
+        syslog(LOG_DEBUG, "%s: disk %p added to the list %p\n", kBuilder, static_cast<void*>(disk),
+               static_cast<void*>(ctrl->DiskList));
         return rc;
     }
     syslog(LOG_ERR, "%s: failed to add disk %p to list %p, rc %d.\n", kBuilder,
@@ -128,9 +127,7 @@ bool JoinAndInsert(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIObjectPa
 /// the list's code.
 int Place(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx) {
     CMPIEnumeration* pools = CandidatePools(disk, ctx);
-    while (HasNext(pools)) {
-        const CMPIObjectPath* candidate = NextPath(pools);
-        if (candidate == nullptr) continue;
+    while (const CMPIObjectPath* candidate = NextPath(pools)) {
         int rc = RESULT_OK;
         if (JoinAndInsert(ctrl, disk, candidate, rc)) return rc;
     }

@@ -37,7 +37,7 @@ void MoveToPool(RaidController_t* ctrl, DiskDrive_t* disk, const char* newPool) 
 void UpdatePool(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx) {
     CMPIEnumeration* pools = QueryAssociatorNames(
         {kUpdater, ctx, disk->ExtentOp, "CIM_ConcreteComponent", "CIM_StoragePool"});
-    const char* newPool = ReadKey(FirstPath(pools), "InstanceID");
+    const char* newPool = ReadKey(NextPath(pools), "InstanceID");
     if (newPool == nullptr) return;
     if (disk->Pool == nullptr || strcmp(disk->Pool, newPool) != 0) MoveToPool(ctrl, disk, newPool);
 

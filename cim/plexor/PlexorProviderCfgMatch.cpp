@@ -62,9 +62,7 @@ int CollectFresh(Matching& matching, const CMPIEnumeration* enums) {
         }
     }
     size_t count = 0;
-    while (HasNext(enums)) {
-        CMPIInstance* inst = NextInstance(enums);
-        if (inst == nullptr) continue;
+    while (CMPIInstance* inst = NextInstance(enums)) {
         if (!MakeRoom(matching.fresh, count, capacity)) break;
         CMPIObjectPath* op = InstancePath(inst);
         matching.fresh[count] = {op, inst};

@@ -18,14 +18,12 @@ struct Walk {
 /// Builds every device of the walk, up to the first that fails. Its code, or 0.
 int BuildAll(const Walk& walk, const CMPIInstanceMI* mi, const CMPIContext* ctx,
              RaidController_t* ctrl) {
-    CMPIEnumeration* found = QueryAssociators(
-        {walk.caller, ctx, ctrl->ControllerOp, walk.assocClass, walk.resultClass});
+    CMPIEnumeration* found =
+        QueryAssociators({walk.caller, ctx, ctrl->ControllerOp, walk.assocClass, walk.resultClass});
     if (found == nullptr) return RESULT_OK;
 
     MutexGuard lock(ctrl->*walk.classMutex);
-    while (HasNext(found)) {
-        const CMPIInstance* inst = NextInstance(found);
-        if (inst == nullptr) continue;
+    while (const CMPIInstance* inst = NextInstance(found)) {
         const int rc = walk.build(mi, ctx, ctrl, inst, InstancePath(inst));
         if (rc != RESULT_OK) return rc;
     }

@@ -66,18 +66,17 @@ constexpr Builder<SASSATAPort_t> kPortBuilder = {
     "%s: port %p added to the list\n",
     "%s: failed to add port to list, rc %d.\n"};
 
-constexpr Builder<Battery_t> kBatteryBuilder = {
-    "BuildBatteryInfo",
-    &Battery_t::BatteryOp,
-    &RaidController_t::BatteryList,
-    &RaidController_t::BatteryUpdateTime,
-    ReadBattery,
-    DumpBattery,
-    FreeBattery,
-    "%s, failed to allocate memory for Battery_t\n",
-    "NULL DeviceID for battery %s\n",
-    "%s: battery %p added to the list\n",
-    "%s: failed to add battery to list, rc %d.\n"};
+constexpr Builder<Battery_t> kBatteryBuilder = {"BuildBatteryInfo",
+                                                &Battery_t::BatteryOp,
+                                                &RaidController_t::BatteryList,
+                                                &RaidController_t::BatteryUpdateTime,
+                                                ReadBattery,
+                                                DumpBattery,
+                                                FreeBattery,
+                                                "%s, failed to allocate memory for Battery_t\n",
+                                                "NULL DeviceID for battery %s\n",
+                                                "%s: battery %p added to the list\n",
+                                                "%s: failed to add battery to list, rc %d.\n"};
 
 // The formats are the constants of the tables above.
 #pragma GCC diagnostic push
@@ -121,8 +120,8 @@ int Build(const Builder<Record>& builder, RaidController_t* ctrl, const CMPIInst
 #pragma GCC diagnostic pop
 
 template <typename Record>
-int TracedBuild(const Builder<Record>& builder, RaidController_t* ctrl,
-                const CMPIInstance* devInst, const CMPIObjectPath* devOp) {
+int TracedBuild(const Builder<Record>& builder, RaidController_t* ctrl, const CMPIInstance* devInst,
+                const CMPIObjectPath* devOp) {
     syslog(LOG_DEBUG, "%s, ENTER...\n", builder.caller);
     const int rc = Build(builder, ctrl, devInst, devOp);
     syslog(LOG_DEBUG, "%s, EXIT(%d).\n", builder.caller, rc);
@@ -171,8 +170,8 @@ int CheckAndUpdatePortInfo(const CMPIInstanceMI*, const CMPIContext*, RaidContro
     return RESULT_OK;
 }
 
-int CheckAndUpdateBatteryInfo(const CMPIInstanceMI*, const CMPIContext* ctx,
-                              RaidController_t* ctrl, void* device, CMPIInstance* devInst) {
+int CheckAndUpdateBatteryInfo(const CMPIInstanceMI*, const CMPIContext* ctx, RaidController_t* ctrl,
+                              void* device, CMPIInstance* devInst) {
     auto* battery = static_cast<Battery_t*>(device);
     syslog(LOG_DEBUG, "%s: ENTER. battery - %s\n", __func__, battery->DeviceID);
     if (NeedUpdate(battery->LastUpdateTime, battery->UpdateEnabled)) {

@@ -40,7 +40,8 @@ int CollectProfiles(const CMPIContext* ctx, Array_t* profiles) {
             return RESULT_ARRAY_FULL;
         }
         CMPIInstance* inst = NextInstance(found);
-        if (inst != nullptr) ExamineProfile(inst, profiles);
+        if (inst == nullptr) break;
+        ExamineProfile(inst, profiles);
     }
     return static_cast<int>(profiles->Count);
 }

@@ -4,10 +4,14 @@
 
 namespace {
 
-const char* OrNull(const char* text) { return text != nullptr ? text : "NULL"; }
+const char* OrNull(const char* text) {
+    return text != nullptr ? text : "NULL";
+}
 
 /// Whether a query may be made at all: there is a path to make it on, and nobody waits for us.
-bool MayAsk(const CMPIObjectPath* path) { return path != nullptr && !StopRequested(); }
+bool MayAsk(const CMPIObjectPath* path) {
+    return path != nullptr && !StopRequested();
+}
 
 }  // namespace
 
@@ -69,8 +73,7 @@ CMPIEnumeration* QueryInstances(const char* caller, const CMPIContext* ctx,
     if (!MayAsk(path)) return nullptr;
     CMPIStatus status = {CMPI_RC_OK, nullptr};
     const CMPIBroker* broker = CurrentBroker();
-    CMPIEnumeration* found =
-        broker->bft->enumerateInstances(broker, ctx, path, nullptr, &status);
+    CMPIEnumeration* found = broker->bft->enumerateInstances(broker, ctx, path, nullptr, &status);
     if (status.rc == CMPI_RC_OK) return found;
     syslog(LOG_ERR, "EnumInstances %s failed, status: rc %d, msg %s", PathText(LOG_ERR, path),
            status.rc, StatusText(status));
@@ -88,14 +91,6 @@ CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx,
     syslog(LOG_ERR, "GetInstance %s failed, status: rc %d, msg %s", PathText(LOG_ERR, path),
            status.rc, StatusText(status));
     return nullptr;
-}
-
-CMPIInstance* FirstInstance(const CMPIEnumeration* enumeration) {
-    return HasNext(enumeration) ? NextInstance(enumeration) : nullptr;
-}
-
-CMPIObjectPath* FirstPath(const CMPIEnumeration* enumeration) {
-    return HasNext(enumeration) ? NextPath(enumeration) : nullptr;
 }
 
 int AppendRecord(List_t* list, void* record, time_t& updateTime) {

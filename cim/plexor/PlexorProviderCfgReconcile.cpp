@@ -120,8 +120,8 @@ void ApplyResults(const Refresh& refresh, const CMPIEnumeration* results) {
     int removeCount = 0;
     int addCount = 0;
     const int rc = CrossoutDuplicatedEntries(refresh.ctrl->*refresh.fields->list, results,
-                                             refresh.row->GetOpFunc, refresh.row->KeyName,
-                                             &devices, &ops, &removeCount, &addCount);
+                                             refresh.row->GetOpFunc, refresh.row->KeyName, &devices,
+                                             &ops, &removeCount, &addCount);
     if (rc == RESULT_OK) {
         syslog(LOG_DEBUG, "%s, removecount %d, addcount %d\n", kProcess, removeCount, addCount);
         if (devices != nullptr) UpdateOrDelete(refresh, devices, removeCount);
@@ -152,10 +152,9 @@ void ReconcileRow(const Refresh& refresh) {
     if (!lock.Locked()) return;
     if (!IsDue(refresh, classMutex, LoadTime(updateTime), time(nullptr))) return;
 
-    CMPIEnumeration* results = QueryAssociators({kProcess, refresh.ctx,
-                                                 refresh.ctrl->ControllerOp,
-                                                 refresh.row->AssociationClassName,
-                                                 refresh.row->AssociatedClassName});
+    CMPIEnumeration* results =
+        QueryAssociators({kProcess, refresh.ctx, refresh.ctrl->ControllerOp,
+                          refresh.row->AssociationClassName, refresh.row->AssociatedClassName});
     if (results != nullptr) ApplyResults(refresh, results);
     // Also after a failure: the vendor is not asked again before the next interval.
     StoreTime(updateTime, time(nullptr));

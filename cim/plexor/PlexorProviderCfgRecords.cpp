@@ -29,12 +29,24 @@ void Release(char*& text) {
 
 }  // namespace
 
-CMPIObjectPath* GetVolumeOp(const void* device) { return FirstFieldPath(device); }
-CMPIObjectPath* GetDiskOp(const void* device) { return FirstFieldPath(device); }
-CMPIObjectPath* GetPortOp(const void* device) { return FirstFieldPath(device); }
-CMPIObjectPath* GetBatteryOp(const void* device) { return FirstFieldPath(device); }
-CMPIObjectPath* GetPoolOp(const void* device) { return FirstFieldPath(device); }
-CMPIObjectPath* GetChassisOp(const void* device) { return FirstFieldPath(device); }
+CMPIObjectPath* GetVolumeOp(const void* device) {
+    return FirstFieldPath(device);
+}
+CMPIObjectPath* GetDiskOp(const void* device) {
+    return FirstFieldPath(device);
+}
+CMPIObjectPath* GetPortOp(const void* device) {
+    return FirstFieldPath(device);
+}
+CMPIObjectPath* GetBatteryOp(const void* device) {
+    return FirstFieldPath(device);
+}
+CMPIObjectPath* GetPoolOp(const void* device) {
+    return FirstFieldPath(device);
+}
+CMPIObjectPath* GetChassisOp(const void* device) {
+    return FirstFieldPath(device);
+}
 CMPIObjectPath* GetControllerOp(const void* device) {
     return static_cast<const RaidController_t*>(device)->ControllerOp;
 }

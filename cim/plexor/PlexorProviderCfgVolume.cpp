@@ -34,8 +34,8 @@ void ReadProperties(StorageVolume_t* volume, const CMPIInstance* inst) {
 }
 
 void ReadRaidLevel(StorageVolume_t* volume, const CMPIContext* ctx, const CMPIObjectPath* devOp) {
-    const CMPIInstance* setting = FirstInstance(QueryAssociators(
-        {kBuilder, ctx, devOp, "CIM_ElementSettingData", "CIM_StorageSetting"}));
+    const CMPIInstance* setting = NextInstance(
+        QueryAssociators({kBuilder, ctx, devOp, "CIM_ElementSettingData", "CIM_StorageSetting"}));
     volume->RaidLevel = StringClone(ReadString(setting, "ElementName"));
 }
 
@@ -65,8 +65,7 @@ void ReadPool(StorageVolume_t* volume, const CMPIContext* ctx) {
 /// Puts the volume into the controller's list. 0, -1 without a pool, or the list's code.
 int Insert(RaidController_t* ctrl, StorageVolume_t* volume) {
     if (volume->FromPool == nullptr) {
-        syslog(LOG_ERR, "No pool associated with volume %s\n",
-               PathText(LOG_ERR, volume->VolumeOp));
+        syslog(LOG_ERR, "No pool associated with volume %s\n", PathText(LOG_ERR, volume->VolumeOp));
         return RESULT_BAD_ARGUMENT;
     }
     MutexGuard lock(ctrl->CtrlMutex);
@@ -112,8 +111,8 @@ void UpdateStatus(StorageVolume_t* volume, CMPIUint16 operational, CMPIUint16 ex
     if (operational == volume->OperationalStatus && extentStatus == volume->ExtentStatus) return;
     syslog(LOG_DEBUG,
            "%s: volume %s status changed. Old opStat %d extStat %d, new opStat %d extStat %d\n",
-           kUpdater, volume->DeviceID, volume->OperationalStatus, volume->ExtentStatus,
-           operational, extentStatus);
+           kUpdater, volume->DeviceID, volume->OperationalStatus, volume->ExtentStatus, operational,
+           extentStatus);
     volume->OperationalStatus = operational;
     volume->ExtentStatus = extentStatus;
 }

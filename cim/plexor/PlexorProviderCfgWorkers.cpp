@@ -26,9 +26,9 @@ constexpr time_t kQuiesceLimitSeconds = 30;  // what a work function gets to end
 constexpr time_t kJoinLimitSeconds = 1;
 constexpr time_t kMissedSignalSeconds = 1;
 
-bool __Started[kThreadCount];         // workers to join; factory and cleanup only
-unsigned int __RunningItems;          // work functions running; guarded by PlexorThreadMutex
-unsigned int __StopRequested;         // written under PlexorThreadMutex, read as relaxed atomic
+bool __Started[kThreadCount];  // workers to join; factory and cleanup only
+unsigned int __RunningItems;   // work functions running; guarded by PlexorThreadMutex
+unsigned int __StopRequested;  // written under PlexorThreadMutex, read as relaxed atomic
 pthread_cond_t __ItemEnded = PTHREAD_COND_INITIALIZER;  // with PlexorThreadMutex
 
 timespec DeadlineIn(time_t seconds) {
@@ -145,9 +145,13 @@ bool JoinWorkers() {
 
 }  // namespace
 
-bool StopRequested() { return __atomic_load_n(&__StopRequested, __ATOMIC_RELAXED) != 0; }
+bool StopRequested() {
+    return __atomic_load_n(&__StopRequested, __ATOMIC_RELAXED) != 0;
+}
 
-void AdmitWork() { SetStopRequested(0); }
+void AdmitWork() {
+    SetStopRequested(0);
+}
 
 bool QuiesceWorkers() {
     const timespec deadline = DeadlineIn(kQuiesceLimitSeconds);

@@ -7,8 +7,8 @@
 
 #include "PlexorProviderUtil.h"
 
-// Each sets one property; the broker's answer is not looked at. The array forms make an array of one
-// element and set nothing when the broker gives no array.
+// Each sets one property; the broker's answer is not looked at. The array forms make an array of
+// one element and set nothing when the broker gives no array.
 void SetChars(CMPIInstance* inst, const char* name, const char* value);
 void SetUint8(CMPIInstance* inst, const char* name, CMPIUint8 value);
 void SetUint16(CMPIInstance* inst, const char* name, CMPIUint16 value);

@@ -68,7 +68,7 @@ struct Request {
     const CMPIObjectPath* path;
     const char** properties;  ///< null: all
     bool namesOnly;
-    const CMPIString* className;    ///< the client's spelling
+    const CMPIString* className;  ///< the client's spelling
     const char* nameSpace;
     const ServedClass* served;  ///< null: a class that is not ours
 };

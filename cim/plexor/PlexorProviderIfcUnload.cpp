@@ -11,7 +11,9 @@ constexpr unsigned int kMaxIdleMinutes = 10;
 constexpr time_t kSecondsPerMinute = 60;
 
 /// Whether the provider has been idle for long enough.
-int CanUnload() { return time(nullptr) >= LoadTime(NextUnloadTime) ? 1 : 0; }
+int CanUnload() {
+    return time(nullptr) >= LoadTime(NextUnloadTime) ? 1 : 0;
+}
 
 /// Releases every controller. Where a worker is still busy with one, they are given up instead:
 /// what it uses must outlive it.

@@ -35,8 +35,12 @@ private:
 };
 
 // Times that are read on request threads without a lock. Only their own value matters, so relaxed.
-inline time_t LoadTime(const time_t& time) { return __atomic_load_n(&time, __ATOMIC_RELAXED); }
-inline void StoreTime(time_t& time, time_t value) { __atomic_store_n(&time, value, __ATOMIC_RELAXED); }
+inline time_t LoadTime(const time_t& time) {
+    return __atomic_load_n(&time, __ATOMIC_RELAXED);
+}
+inline void StoreTime(time_t& time, time_t value) {
+    __atomic_store_n(&time, value, __ATOMIC_RELAXED);
+}
 
 /// Stamps `field`, an update time of the controller that owns `ctrlMutex`, under that mutex.
 inline void StampTime(pthread_mutex_t& ctrlMutex, time_t& field) {

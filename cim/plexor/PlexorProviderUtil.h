@@ -1,5 +1,5 @@
-// Reading what the broker hands out, for the units above Util. Nothing here follows a pointer out of
-// a value whose type says that it is a scalar, and every reader copes with null objects.
+// Reading what the broker hands out, for the units above Util. Nothing here follows a pointer out
+// of a value whose type says that it is a scalar, and every reader copes with null objects.
 #pragma once
 
 #include "PlexorProvider.h"
@@ -48,7 +48,8 @@ void ReleaseInstance(CMPIInstance*& inst);
 
 /// Whether the enumeration has a further element; false for a null enumeration.
 bool HasNext(const CMPIEnumeration* enumeration);
-/// Next element; null when it is not an instance (or not a path).
+/// Next instance (path); elements of another type are passed over. Null at the end and for a null
+/// enumeration.
 CMPIInstance* NextInstance(const CMPIEnumeration* enumeration);
 CMPIObjectPath* NextPath(const CMPIEnumeration* enumeration);
 

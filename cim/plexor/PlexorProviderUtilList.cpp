@@ -114,7 +114,9 @@ int RemoveEntryFromListByKey(List_t* list, void* data) {
     return RESULT_OK;
 }
 
-int IsListEmpty(List_t* list) { return list->Size == 0 ? 1 : 0; }
+int IsListEmpty(List_t* list) {
+    return list->Size == 0 ? 1 : 0;
+}
 
 int PutItem(Fifo_t* fifo, void* item) {
     MutexGuard lock(fifo->Mutex);

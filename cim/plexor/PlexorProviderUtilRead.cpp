@@ -1,9 +1,13 @@
 // Reading the broker's objects without trusting them.
 #include "PlexorProviderUtil.h"
 
-const CMPIBroker* CurrentBroker() { return __atomic_load_n(&Broker, __ATOMIC_RELAXED); }
+const CMPIBroker* CurrentBroker() {
+    return __atomic_load_n(&Broker, __ATOMIC_RELAXED);
+}
 
-bool LogEnabled(int priority) { return (setlogmask(0) & LOG_MASK(priority)) != 0; }
+bool LogEnabled(int priority) {
+    return (setlogmask(0) & LOG_MASK(priority)) != 0;
+}
 
 const char* StringText(const CMPIString* string) {
     return string != nullptr ? string->ft->getCharPtr(string, nullptr) : nullptr;
@@ -65,6 +69,15 @@ CMPIUint64 ScalarNumber(const CMPIData& data) {
         default:
             return 0;
     }
+}
+
+/// Takes the next element. False at the end, and when the enumeration cannot give it: asking such a
+/// one again might never end.
+bool NextElement(const CMPIEnumeration* enumeration, CMPIData& data) {
+    if (!HasNext(enumeration)) return false;
+    CMPIStatus status = {CMPI_RC_OK, nullptr};
+    data = enumeration->ft->getNext(enumeration, &status);
+    return status.rc == CMPI_RC_OK;
 }
 
 /// Element 0 of an array property; a null value when there is no array.
@@ -154,11 +167,17 @@ bool HasNext(const CMPIEnumeration* enumeration) {
 }
 
 CMPIInstance* NextInstance(const CMPIEnumeration* enumeration) {
-    const CMPIData data = enumeration->ft->getNext(enumeration, nullptr);
-    return data.type == CMPI_instance ? data.value.inst : nullptr;
+    CMPIData data = NullData();
+    while (NextElement(enumeration, data)) {
+        if (data.type == CMPI_instance && data.value.inst != nullptr) return data.value.inst;
+    }
+    return nullptr;
 }
 
 CMPIObjectPath* NextPath(const CMPIEnumeration* enumeration) {
-    const CMPIData data = enumeration->ft->getNext(enumeration, nullptr);
-    return data.type == CMPI_ref ? data.value.ref : nullptr;
+    CMPIData data = NullData();
+    while (NextElement(enumeration, data)) {
+        if (data.type == CMPI_ref && data.value.ref != nullptr) return data.value.ref;
+    }
+    return nullptr;
 }

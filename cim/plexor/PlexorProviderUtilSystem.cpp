@@ -18,7 +18,7 @@ CMPIInstance* FindHostInstance(const CMPIContext* ctx, const CMPIObjectPath* pat
         hosts = broker->bft->enumerateInstances(broker, ctx, path, nullptr, &status);
     }
     CMPIInstance* host = nullptr;
-    if (status.rc == CMPI_RC_OK && HasNext(hosts)) host = NextInstance(hosts);
+    if (status.rc == CMPI_RC_OK) host = NextInstance(hosts);
     if (host != nullptr) return host;
 
     const char* message = StringText(status.msg);
@@ -49,8 +49,8 @@ int InitSystemInfo(const CMPIInstanceMI*, const CMPIContext* ctx) {
 
     CMPIStatus status = {CMPI_RC_OK, nullptr};
     const CMPIBroker* broker = CurrentBroker();
-    CMPIObjectPath* path = broker->eft->newObjectPath(broker, "root/cimv2",
-                                                      "OMC_UnitaryComputerSystem", &status);
+    CMPIObjectPath* path =
+        broker->eft->newObjectPath(broker, "root/cimv2", "OMC_UnitaryComputerSystem", &status);
     if (status.rc != CMPI_RC_OK) {
         syslog(LOG_ERR, "%s: rc %d, msg %s\n", __func__, status.rc, StatusText(status));
         return RESULT_NO_MEMORY;
@@ -75,6 +75,12 @@ void ReleaseSystemInfo() {
     ReleaseName(__SystemName);
 }
 
-const char* GetHostName() { return __HostName; }
-const char* GetSystemName() { return __SystemName; }
-const char* GetSystemClassName() { return __SystemClassName; }
+const char* GetHostName() {
+    return __HostName;
+}
+const char* GetSystemName() {
+    return __SystemName;
+}
+const char* GetSystemClassName() {
+    return __SystemClassName;
+}
