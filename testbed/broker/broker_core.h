@@ -1,0 +1,34 @@
+// What the entries of all tables of one broker share.
+#pragma once
+
+#include <cmpidt.h>
+#include <cmpift.h>
+
+#include <mutex>
+
+#include "arena.h"
+#include "books.h"
+#include "broker.h"
+#include "faults.h"
+#include "repository.h"
+
+namespace testbed {
+
+/// Everything that an entry needs of its broker. Lives as long as the Broker; the `hdl` of the
+/// broker's handle points to it.
+struct BrokerCore {
+    Repository& repository;
+    const BrokerOptions& options;
+    Books& books;
+    Faults& faults;
+    ThreadArenas arenas;
+    Quarantine quarantine;
+    std::mutex queryMutex;  ///< held by each query when options.serialQueries
+
+    /// Whether entries of objects have to be described to books and faults.
+    bool watchesObjectCalls() const {
+        return books.recordsObjectCalls() || faults.hasObjectRules();
+    }
+};
+
+}  // namespace testbed

@@ -1,0 +1,126 @@
+#include "cim_object.h"
+
+#include <algorithm>
+
+namespace testbed {
+
+namespace {
+
+char foldCharacter(char character) {
+    return character >= 'A' && character <= 'Z' ? static_cast<char>(character - 'A' + 'a')
+                                                : character;
+}
+
+/// Iterator to the value of that name; works on constant and other lists.
+template <class Values>
+auto findNamed(Values& values, std::string_view name) {
+    return std::find_if(values.begin(), values.end(),
+                        [&](const NamedValue& value) { return sameName(value.first, name); });
+}
+
+void assign(std::vector<NamedValue>& values, std::string_view name, CimValue value) {
+    const auto found = findNamed(values, name);
+    if (found != values.end()) {
+        found->second = std::move(value);
+    } else {
+        values.emplace_back(std::string(name), std::move(value));
+    }
+}
+
+const CimValue* findValue(const std::vector<NamedValue>& values, std::string_view name) {
+    const auto found = findNamed(values, name);
+    return found == values.end() ? nullptr : &found->second;
+}
+
+std::string quoted(const std::string& text, bool escape) {
+    std::string result = "\"";
+    for (char character : text) {
+        if (escape && (character == '"' || character == '\\')) result += '\\';
+        result += character;
+    }
+    return result + '"';
+}
+
+bool isText(const CimValue& value) {
+    return std::holds_alternative<std::string>(value.data);
+}
+
+/// A key value that is equal for equal content: integers compare by number, whatever their width.
+std::string keyIdentity(const CimValue& value) {
+    if (value.isNull) return "<null>";
+    if (isText(value)) return quoted(value.asString(), true);
+    if (const auto* path = std::get_if<std::shared_ptr<const ObjectPath>>(&value.data)) {
+        return quoted((*path)->identity(), true);
+    }
+    return value.text();
+}
+
+}  // namespace
+
+bool sameName(std::string_view left, std::string_view right) {
+    return std::equal(left.begin(), left.end(), right.begin(), right.end(),
+                      [](char a, char b) { return foldCharacter(a) == foldCharacter(b); });
+}
+
+std::string foldName(std::string_view name) {
+    std::string folded(name);
+    std::transform(folded.begin(), folded.end(), folded.begin(), foldCharacter);
+    return folded;
+}
+
+ObjectPath& ObjectPath::key(std::string_view name, CimValue value) {
+    assign(keys, name, std::move(value));
+    return *this;
+}
+
+const CimValue* ObjectPath::findKey(std::string_view name) const {
+    return findValue(keys, name);
+}
+
+bool ObjectPath::operator==(const ObjectPath& other) const {
+    return keys.size() == other.keys.size() && sameName(className, other.className) &&
+           identity() == other.identity();
+}
+
+std::string ObjectPath::text() const {
+    std::string result = nameSpace + ":" + className;
+    char separator = '.';
+    for (const auto& [name, value] : keys) {
+        result += separator + name + "=";
+        result += isText(value) ? quoted(value.asString(), false) : value.text();
+        separator = ',';
+    }
+    return result;
+}
+
+std::string ObjectPath::identity() const {
+    std::vector<std::string> parts;
+    for (const auto& [name, value] : keys) {
+        parts.push_back(foldName(name) + "=" + keyIdentity(value));
+    }
+    std::sort(parts.begin(), parts.end());
+
+    std::string result = foldName(nameSpace) + ":" + foldName(className);
+    char separator = '.';
+    for (const std::string& part : parts) {
+        result += separator + part;
+        separator = ',';
+    }
+    return result;
+}
+
+Instance& Instance::set(std::string_view name, CimValue value) {
+    assign(properties, name, std::move(value));
+    return *this;
+}
+
+void Instance::erase(std::string_view name) {
+    const auto found = findNamed(properties, name);
+    if (found != properties.end()) properties.erase(found);
+}
+
+const CimValue* Instance::find(std::string_view name) const {
+    return findValue(properties, name);
+}
+
+}  // namespace testbed

@@ -1,0 +1,118 @@
+#include "object_context.h"
+
+#include <algorithm>
+
+#include "broker_calls.h"
+#include "conversions.h"
+#include "object_string.h"
+
+namespace testbed {
+
+namespace {
+
+CMPIData getEntry(const CMPIContext* ctx, const char* name, CMPIStatus* status) {
+    return answerOn<CMPIData>(ctx, Entry::OtherObjectCall, name, status,
+                              [&](ContextObject& object, CMPIStatus& outcome) {
+                                  for (const auto& [entryKey, value] : object.entries()) {
+                                      if (name && entryKey == name) return toData(object, value);
+                                  }
+                                  outcome.rc = CMPI_RC_ERR_NOT_FOUND;
+                                  return dataWithout(CMPI_notFound);
+                              });
+}
+
+CMPIData getEntryAt(const CMPIContext* ctx, CMPICount index, CMPIString** name,
+                    CMPIStatus* status) {
+    return answerOn<CMPIData>(ctx, Entry::OtherObjectCall, nullptr, status,
+                              [&](ContextObject& object, CMPIStatus& outcome) {
+                                  const std::vector<NamedValue> entries = object.entries();
+                                  if (index >= entries.size()) {
+                                      outcome.rc = CMPI_RC_ERR_NOT_FOUND;
+                                      return dataWithout(CMPI_notFound);
+                                  }
+                                  if (name != nullptr)
+                                      *name = derivedString(object, entries[index].first);
+                                  return toData(object, entries[index].second);
+                              });
+}
+
+CMPICount getEntryCount(const CMPIContext* ctx, CMPIStatus* status) {
+    return answerOn<CMPICount>(ctx, Entry::OtherObjectCall, nullptr, status,
+                               [](ContextObject& object, CMPIStatus&) {
+                                   return static_cast<CMPICount>(object.entries().size());
+                               });
+}
+
+CMPIStatus addEntry(const CMPIContext* ctx, const char* name, const CMPIValue* value,
+                    CMPIType type) {
+    return statusOn(ctx, Entry::OtherObjectCall, name, [&](ContextObject& object) {
+        if (name == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
+        CimValue entry;
+        const CMPIrc rc = readValue(value, type, entry);
+        if (rc == CMPI_RC_OK) object.setEntry(name, std::move(entry));
+        return rc;
+    });
+}
+
+#if defined(PLEXOR_CONTEXT_FLUSH) && PLEXOR_CONTEXT_FLUSH
+CMPIStatus flush(const CMPIContext* ctx) {
+    return statusOn(ctx, Entry::ContextFlush, nullptr, [&](ContextObject& object) {
+        if (!admitUpCall(object.core(), ctx, Entry::ContextFlush)) {
+            return CMPI_RC_ERR_INVALID_HANDLE;
+        }
+        const std::shared_ptr<Arena> arena = object.core().arenas.current();
+        if (arena) arena->flush();
+        return CMPI_RC_OK;
+    });
+}
+#endif
+
+const CMPIContextFT contextTable = {
+    .ftVersion = CMPI_VERSION,
+    .release = releaseEntry<CMPIContext>,
+    .clone = cloneEntry<CMPIContext>,
+    .getEntry = getEntry,
+    .getEntryAt = getEntryAt,
+    .getEntryCount = getEntryCount,
+    .addEntry = addEntry,
+#if defined(PLEXOR_CONTEXT_FLUSH) && PLEXOR_CONTEXT_FLUSH
+    .flush = flush,
+#endif
+};
+
+}  // namespace
+
+ContextObject::ContextObject(BrokerCore& brokerCore, std::vector<NamedValue> entries)
+    : Object(brokerCore, ObjectKind::Context),
+      CMPIContext{nullptr, &contextTable},
+      user_(threadNumber()),
+      entries_(std::move(entries)) {
+    hdl = this;
+}
+
+std::shared_ptr<ContextObject> ContextObject::copy() const {
+    return std::make_shared<ContextObject>(core(), entries());
+}
+
+std::vector<NamedValue> ContextObject::entries() const {
+    const std::lock_guard lock(mutex_);
+    return entries_;
+}
+
+void ContextObject::setEntry(const char* name, CimValue value) {
+    const std::lock_guard lock(mutex_);
+    const auto found = std::find_if(entries_.begin(), entries_.end(),
+                                    [&](const NamedValue& entry) { return entry.first == name; });
+    if (found != entries_.end()) {
+        found->second = std::move(value);
+    } else {
+        entries_.emplace_back(name, std::move(value));
+    }
+}
+
+void ContextObject::drop() {
+    const std::lock_guard lock(mutex_);
+    entries_.clear();
+}
+
+}  // namespace testbed

@@ -1,0 +1,53 @@
+#include "provider_library.h"
+
+#include <dlfcn.h>
+
+namespace testbed {
+
+ProviderLibrary::ProviderLibrary(Broker& broker, const std::string& file,
+                                 const std::string& providerName)
+    : broker_(broker), factoryName_(providerName + "_Create_InstanceMI") {
+    library_ = dlopen(file.c_str(), RTLD_NOW | RTLD_LOCAL);
+    if (library_ == nullptr) throw LoadError("cannot load " + file + ": " + dlerror());
+
+    factory_ = reinterpret_cast<decltype(factory_)>(dlsym(library_, factoryName_.c_str()));
+    if (factory_ == nullptr) {
+        dlclose(library_);
+        throw LoadError(file + " has no factory " + factoryName_);
+    }
+    mi_ = callFactory();
+    if (mi_ == nullptr) {
+        dlclose(library_);
+        throw LoadError(factoryName_ + " returned no instance interface");
+    }
+}
+
+ProviderLibrary::~ProviderLibrary() {
+    if (library_ != nullptr) dlclose(library_);
+}
+
+InstanceClient ProviderLibrary::client() {
+    return InstanceClient(broker_, mi_);
+}
+
+CMPIInstanceMI* ProviderLibrary::callFactory() {
+    const Broker::CallScope scope(broker_);
+    CMPIStatus status = {CMPI_RC_OK, nullptr};
+    return factory_(broker_.handle(), scope.context(), &status);
+}
+
+CMPIrc ProviderLibrary::unload(bool terminating) {
+    const CMPIrc rc = client().cleanup(terminating);
+    if (rc != CMPI_RC_OK) return rc;
+    dlclose(library_);
+    library_ = nullptr;
+    factory_ = nullptr;
+    mi_ = nullptr;
+    return rc;
+}
+
+void* ProviderLibrary::symbol(const char* name) const {
+    return library_ ? dlsym(library_, name) : nullptr;
+}
+
+}  // namespace testbed
