@@ -57,16 +57,17 @@ void Faults::setLatency(std::chrono::milliseconds minimum, std::chrono::millisec
 
 FaultEffect Faults::match(const CallRecord& call) {
     const std::lock_guard lock(mutex_);
-    for (Entry_& entry : rules_) {
-        if (!applies(entry.rule, call)) continue;
-        if (entry.seen < entry.rule.skip) {
-            ++entry.seen;
+    for (auto entry = rules_.begin(); entry != rules_.end(); ++entry) {
+        if (!applies(entry->rule, call)) continue;
+        if (entry->seen < entry->rule.skip) {
+            ++entry->seen;
             continue;
         }
-        const bool ranOut = entry.rule.times >= 0 && entry.applied >= entry.rule.times;
-        if (ranOut) continue;
-        ++entry.applied;
-        return entry.rule;
+        if (entry->rule.times == 0) continue;
+        const FaultRule rule = entry->rule;
+        // A rule that has run out is forgotten, so that long runs do not drag them along.
+        if (++entry->applied == rule.times) rules_.erase(entry);
+        return rule;
     }
     return std::nullopt;
 }
