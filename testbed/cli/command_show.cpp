@@ -1,0 +1,99 @@
+#include "command_show.h"
+
+#include <syslog.h>
+
+#include <CLI/CLI.hpp>
+#include <iostream>
+#include <memory>
+
+#include "inventory.h"
+#include "json_view.h"
+#include "library_locator.h"
+#include "provider_log.h"
+#include "provider_session.h"
+#include "scenario_parser.h"
+#include "tree_view.h"
+
+namespace testbed {
+namespace {
+
+constexpr int kProviderFailed = 3;
+
+struct ShowOptions {
+    std::string scenario;
+    std::string library;
+    std::string provider = "PlexorProvider";
+    std::string className;
+    std::string nameSpace = "root/cimv2";
+    unsigned timeoutSeconds = 60;
+    bool json = false;
+    bool log = false;
+};
+
+/// The provider's lines go to standard error too, or are masked as managers mask them.
+void directLog(bool show) {
+    directProviderLog(show ? LOG_DEBUG : LOG_ERR, [show](int, const std::string& line) {
+        if (show) std::cerr << line << "\n";
+    });
+}
+
+std::vector<std::string> classesToShow(const ShowOptions& options) {
+    if (!options.className.empty()) return {options.className};
+    std::vector<std::string> names;
+    for (const ServedClass& served : servedClasses()) names.push_back(served.name);
+    return names;
+}
+
+bool reportFailures(const Inventory& inventory) {
+    bool failed = false;
+    for (const ClassAnswer& answer : inventory) {
+        if (answer.response.rc == CMPI_RC_OK) continue;
+        std::cerr << "plexor-testbed: " << answer.className << ": the provider answered status "
+                  << answer.response.rc << "\n";
+        failed = true;
+    }
+    return failed;
+}
+
+int show(const ShowOptions& options) {
+    const Scenario scenario = readScenario(options.scenario);
+    directLog(options.log);
+    ProviderSession session(scenario, locateLibrary(options.library), options.provider);
+    const bool complete =
+        session.waitForInventory(std::chrono::seconds(options.timeoutSeconds), options.nameSpace);
+    if (!complete)
+        std::cerr << "plexor-testbed: the inventory is not complete after "
+                  << options.timeoutSeconds << " s\n";
+    InstanceClient client = session.client();
+    const Inventory inventory = collectInventory(client, classesToShow(options), options.nameSpace);
+    std::cout << (options.json ? jsonView(inventory) : treeView(inventory)) << std::flush;
+    const bool failed = reportFailures(inventory);
+    return complete && !failed ? 0 : kProviderFailed;
+}
+
+std::vector<std::string> knownClasses() {
+    return classesToShow({});
+}
+
+}  // namespace
+
+void addShowCommand(CLI::App& app, int& status) {
+    const auto options = std::make_shared<ShowOptions>();
+    CLI::App* command = app.add_subcommand("show", "Shows what a client sees of a scenario");
+    command->add_option("--scenario", options->scenario, "scenario file")->required();
+    command->add_option("--library", options->library, "the provider's shared library")
+        ->envname("PLEXOR_PROVIDER_LIBRARY");
+    command->add_option("--provider", options->provider, "name that the factory begins with")
+        ->capture_default_str();
+    command->add_option("--class", options->className, "show this class only")
+        ->check(CLI::IsMember(knownClasses()));
+    command->add_option("--namespace", options->nameSpace, "namespace of the requests")
+        ->capture_default_str();
+    command->add_option("--timeout", options->timeoutSeconds, "seconds to wait for the inventory")
+        ->capture_default_str();
+    command->add_flag("--json", options->json, "print JSON instead of a tree");
+    command->add_flag("--log", options->log, "print the provider's log lines on standard error");
+    command->callback([options, &status] { status = show(*options); });
+}
+
+}  // namespace testbed

@@ -1,0 +1,40 @@
+// What a client sees: the provider's classes and its answers for them.
+#pragma once
+
+#include <span>
+#include <string>
+#include <vector>
+
+#include "instance_client.h"
+
+namespace testbed {
+
+/// A class that the provider serves, and how its instances name the controller they belong to.
+struct ServedClass {
+    const char* name;
+    const char* heading;      ///< for people
+    const char* identityKey;  ///< the key that has the controller's id
+    const char* prefix;       ///< what stands before the id in that key
+    bool isDevice;            ///< "_" and the device's id follow the controller's id
+};
+
+/// Controllers first.
+std::span<const ServedClass> servedClasses();
+/// NULL for a class that is not served.
+const ServedClass* findServedClass(const std::string& name);
+
+struct ClassAnswer {
+    std::string className;
+    Response response;
+};
+
+using Inventory = std::vector<ClassAnswer>;
+
+/// Enumerates the classes one after the other.
+Inventory collectInventory(InstanceClient& client, const std::vector<std::string>& classNames,
+                           const std::string& nameSpace);
+
+/// True when both hold the same instances with the same values in the same order.
+bool sameAnswers(const Inventory& left, const Inventory& right);
+
+}  // namespace testbed

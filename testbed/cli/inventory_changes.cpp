@@ -1,0 +1,52 @@
+#include "inventory_changes.h"
+
+namespace testbed {
+namespace {
+
+std::string nameOf(const Instance& instance) {
+    const CimValue* name = instance.find("ElementName");
+    return name != nullptr && !name->isNull ? name->asString() : instance.path.text();
+}
+
+const Instance* findPath(const ClassAnswer& answer, const ObjectPath& path) {
+    for (const Instance& instance : answer.response.instances)
+        if (instance.path == path) return &instance;
+    return nullptr;
+}
+
+/// "HealthState 5 -> 30, …"; names are shown once, so Caption is left out.
+std::string differences(const Instance& before, const Instance& after) {
+    std::string text;
+    for (const auto& [name, value] : after.properties) {
+        const CimValue* old = before.find(name);
+        if (sameName(name, "Caption") || (old != nullptr && *old == value)) continue;
+        text += text.empty() ? "" : ", ";
+        text += name + " " + (old != nullptr ? old->text() : "-") + " -> " + value.text();
+    }
+    return text;
+}
+
+void compareClass(const ClassAnswer& before, const ClassAnswer& after,
+                  std::vector<std::string>& lines) {
+    for (const Instance& old : before.response.instances)
+        if (findPath(after, old.path) == nullptr) lines.push_back("- " + nameOf(old));
+    for (const Instance& now : after.response.instances) {
+        const Instance* old = findPath(before, now.path);
+        if (old == nullptr) {
+            lines.push_back("+ " + nameOf(now));
+        } else if (const std::string text = differences(*old, now); !text.empty()) {
+            lines.push_back("~ " + text);
+        }
+    }
+}
+
+}  // namespace
+
+std::vector<std::string> changeLines(const Inventory& before, const Inventory& after) {
+    std::vector<std::string> lines;
+    for (std::size_t i = 0; i < before.size() && i < after.size(); i++)
+        compareClass(before[i], after[i], lines);
+    return lines;
+}
+
+}  // namespace testbed

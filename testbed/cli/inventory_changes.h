@@ -1,0 +1,15 @@
+// What differs between two answers of a provider, in lines for people.
+#pragma once
+
+#include <string>
+#include <vector>
+
+#include "inventory.h"
+
+namespace testbed {
+
+/// One line for each instance that has come ("+ "), gone ("- ") or changed ("~ ", with the old and
+/// the new values of its properties), in the order of the new answer, those that have gone first.
+std::vector<std::string> changeLines(const Inventory& before, const Inventory& after);
+
+}  // namespace testbed

@@ -1,0 +1,35 @@
+#include "library_locator.h"
+
+#include <filesystem>
+
+#include "provider_library.h"
+
+namespace testbed {
+namespace {
+
+namespace fs = std::filesystem;
+
+constexpr const char* kLibraryName = "libPlexorProvider.so";
+constexpr const char* kDirectories[] = {".", BUILT_PROVIDER_DIR, INSTALLED_PROVIDER_DIR};
+
+fs::path toolDirectory() {
+    std::error_code error;
+    const fs::path tool = fs::read_symlink("/proc/self/exe", error);
+    return error ? fs::current_path() : tool.parent_path();
+}
+
+}  // namespace
+
+std::string locateLibrary(const std::string& chosen) {
+    // A bare file name would be searched for in the system's directories.
+    if (!chosen.empty()) return fs::absolute(chosen).string();
+    const fs::path here = toolDirectory();
+    for (const char* directory : kDirectories) {
+        const fs::path file = (here / directory / kLibraryName).lexically_normal();
+        if (fs::exists(file)) return file.string();
+    }
+    throw LoadError(std::string(kLibraryName) + " not found beside " + here.string() +
+                    "; name it with --library");
+}
+
+}  // namespace testbed

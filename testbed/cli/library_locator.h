@@ -1,0 +1,12 @@
+// Finds the provider's shared library.
+#pragma once
+
+#include <string>
+
+namespace testbed {
+
+/// `chosen` when it is not empty; else the library beside the tool: in the tool's own directory,
+/// where the build puts it, or where it is installed. Throws LoadError when there is none.
+std::string locateLibrary(const std::string& chosen);
+
+}  // namespace testbed

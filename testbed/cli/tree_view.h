@@ -1,0 +1,13 @@
+// An inventory as a tree for people: controllers, and beneath each what belongs to it.
+#pragma once
+
+#include <string>
+
+#include "inventory.h"
+
+namespace testbed {
+
+/// Instances whose controller is not in the inventory come last, by class.
+std::string treeView(const Inventory& inventory);
+
+}  // namespace testbed

@@ -1,0 +1,141 @@
+#include "json_reader.h"
+
+#include <charconv>
+
+namespace testbed {
+
+using nlohmann::json;
+
+void JsonPlace::fail(const std::string& what) const {
+    throw ScenarioError(file + ": " + (place.empty() ? what : place + ": " + what));
+}
+
+JsonPlace JsonPlace::member(const std::string& name) const {
+    return {&value->at(name), file, place.empty() ? name : place + "." + name};
+}
+
+JsonPlace JsonPlace::element(std::size_t index) const {
+    return {&value->at(index), file, place + "[" + std::to_string(index) + "]"};
+}
+
+std::string readText(const JsonPlace& place) {
+    if (place.value->is_string()) return place.value->get<std::string>();
+    if (place.value->is_number_unsigned()) return place.value->dump();
+    place.fail("a text is needed here");
+}
+
+std::uint64_t readNumber(const JsonPlace& place, std::uint64_t maximum) {
+    std::uint64_t number = 0;
+    bool whole = false;
+    if (place.value->is_number_unsigned()) {
+        number = place.value->get<std::uint64_t>();
+        whole = true;
+    } else if (place.value->is_string()) {
+        const std::string& text = place.value->get_ref<const std::string&>();
+        const char* end = text.data() + text.size();
+        const auto [rest, error] = std::from_chars(text.data(), end, number);
+        whole = !text.empty() && error == std::errc() && rest == end;
+    }
+    if (whole && number <= maximum) return number;
+    place.fail("a whole number from 0 to " + std::to_string(maximum) + " is needed here");
+}
+
+JsonReader::JsonReader(JsonPlace place) : place_(std::move(place)) {
+    if (!place_.value->is_object()) place_.fail("an object is needed here");
+}
+
+bool JsonReader::has(const std::string& name) const {
+    return place_.value->contains(name);
+}
+
+std::optional<JsonPlace> JsonReader::take(const std::string& name) {
+    known_.insert(name);
+    if (!has(name)) return std::nullopt;
+    return place_.member(name);
+}
+
+std::string JsonReader::text(const std::string& name) {
+    const auto member = take(name);
+    if (!member) fail("\"" + name + "\" is missing");
+    return readText(*member);
+}
+
+std::optional<std::string> JsonReader::optionalText(const std::string& name) {
+    const auto member = take(name);
+    if (!member) return std::nullopt;
+    return readText(*member);
+}
+
+std::string JsonReader::text(const std::string& name, const std::string& absent) {
+    return optionalText(name).value_or(absent);
+}
+
+bool JsonReader::flag(const std::string& name, bool absent) {
+    const auto member = take(name);
+    if (!member) return absent;
+    if (!member->value->is_boolean()) member->fail("true or false is needed here");
+    return member->value->get<bool>();
+}
+
+std::optional<std::uint64_t> JsonReader::number(const std::string& name, std::uint64_t maximum) {
+    const auto member = take(name);
+    if (!member) return std::nullopt;
+    return readNumber(*member, maximum);
+}
+
+std::uint16_t JsonReader::number16(const std::string& name, std::uint16_t absent) {
+    return static_cast<std::uint16_t>(number(name, UINT16_MAX).value_or(absent));
+}
+
+std::int64_t JsonReader::signedNumber(const std::string& name, std::int64_t absent) {
+    const auto member = take(name);
+    if (!member) return absent;
+    if (!member->value->is_number_integer()) member->fail("a whole number is needed here");
+    return member->value->get<std::int64_t>();
+}
+
+std::vector<std::string> JsonReader::texts(const std::string& name) {
+    const auto member = take(name);
+    if (!member) return {};
+    if (!member->value->is_array()) return {readText(*member)};
+    std::vector<std::string> result;
+    for (std::size_t i = 0; i < member->value->size(); ++i)
+        result.push_back(readText(member->element(i)));
+    return result;
+}
+
+std::uint16_t JsonReader::code(const std::string& name, CodeWords words, std::uint16_t absent) {
+    const auto member = take(name);
+    if (!member) return absent;
+    if (!member->value->is_string())
+        return static_cast<std::uint16_t>(readNumber(*member, UINT16_MAX));
+    const std::string word = member->value->get<std::string>();
+    const auto code = codeOf(words, word);
+    if (!code) member->fail("unknown word \"" + word + "\" (known: " + listOf(words) + ")");
+    return *code;
+}
+
+const StateWord* JsonReader::state(const std::string& name, StateWords states) {
+    const auto member = take(name);
+    if (!member) return nullptr;
+    const std::string word = readText(*member);
+    const StateWord* state = findState(states, word);
+    if (!state) fail("unknown " + name + " \"" + word + "\" (known: " + listOf(states) + ")");
+    return state;
+}
+
+std::vector<JsonPlace> JsonReader::list(const std::string& name) {
+    const auto member = take(name);
+    if (!member) return {};
+    if (!member->value->is_array()) member->fail("a list is needed here");
+    std::vector<JsonPlace> elements;
+    for (std::size_t i = 0; i < member->value->size(); ++i) elements.push_back(member->element(i));
+    return elements;
+}
+
+void JsonReader::finish() const {
+    for (const auto& [name, value] : place_.value->items())
+        if (!known_.contains(name)) fail("unknown member \"" + name + "\"");
+}
+
+}  // namespace testbed

@@ -1,0 +1,55 @@
+// The pieces of which the scenario parser is made; for its own files only.
+#pragma once
+
+#include <initializer_list>
+#include <string>
+
+#include "json_reader.h"
+#include "scenario.h"
+
+namespace testbed {
+
+/// A further object behind a described one, and the CIM class that it has.
+struct PartName {
+    const char* name;
+    const char* cimClass;
+};
+
+/// Reads "properties", "keys", "omit", "omitKeys", "class", and the same below each part's name.
+void readTweaks(JsonReader& reader, Described& described, const char* cimClass,
+                std::initializer_list<PartName> parts = {});
+
+/// Reads "status" (a word) or "operationalStatus" (a number) of an object without finer states.
+std::uint16_t readStatus(JsonReader& reader);
+
+/// Reads the list `name` of a controller with one of the functions below; ids must differ.
+template <typename Description>
+std::vector<Description> readList(JsonReader& reader, const std::string& name,
+                                  Description (*read)(const JsonPlace&,
+                                                      const ControllerDescription&),
+                                  const ControllerDescription& controller) {
+    std::vector<Description> list;
+    for (const JsonPlace& place : reader.list(name)) {
+        list.push_back(read(place, controller));
+        const Description& latest = list.back();
+        if (findById(list, latest.id) != &latest) place.fail("second \"" + latest.id + "\"");
+    }
+    return list;
+}
+
+// One element each. The controller is as far as it has been read: pools and enclosures are read
+// before what refers to them.
+PoolDescription readPool(const JsonPlace& place, const ControllerDescription& controller);
+EnclosureDescription readEnclosure(const JsonPlace& place, const ControllerDescription& controller);
+DriveDescription readDrive(const JsonPlace& place, const ControllerDescription& controller);
+VolumeDescription readVolume(const JsonPlace& place, const ControllerDescription& controller);
+PortDescription readPort(const JsonPlace& place, const ControllerDescription& controller);
+BatteryDescription readBattery(const JsonPlace& place, const ControllerDescription& controller);
+OtherDescription readOther(const JsonPlace& place, const ControllerDescription& controller);
+
+/// The software list of a controller: an object by kind, or a list.
+std::vector<SoftwareDescription> readSoftware(JsonReader& reader);
+
+FaultRule readFault(const JsonPlace& place);
+
+}  // namespace testbed
