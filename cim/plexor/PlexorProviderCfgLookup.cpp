@@ -62,8 +62,8 @@ constexpr Lookup<DiskDrive_t> kDiskLookup = {"FindDiskByDeviceID",
                                              "%s: found disk %p with %s in list %p\n",
                                              "%s: can not find disk %s in list %p\n",
                                              false};
-// Callers never obtain a chassis, on purpose: clients have come to rely on drives being named by
-// their DeviceID, not by slot and enclosure.
+// Callers never obtain a chassis, on purpose: drives are shown by their DeviceID, not by slot and
+// enclosure.
 constexpr Lookup<Chassis_t> kChassisLookup = {"FindChassisByTag",
                                               &Chassis_t::Tag,
                                               "%s: checking chassis %p (tag: %s)\n",

@@ -43,7 +43,7 @@ const char* FindSeparator(const char* key, const char* rest) {
         syslog(LOG_ERR, "Device ID not found in key %s\n", key);
         return nullptr;
     }
-    // A one-character controller is refused, an empty one is not: clients have seen both for long.
+    // A one-character controller is refused, an empty one is not; both are part of the format.
     if (separator == rest + 1) {
         syslog(LOG_ERR, "Controller ID not found in key %s\n", key);
         return nullptr;

@@ -49,7 +49,7 @@ const DiskDrive_t* WaitForDisk(const RaidController_t* ctrl, const char* deviceI
 
 void AppendMembers(VolumeText& text, const RaidController_t* ctrl, const StoragePool_t* pool) {
     text.Append(", Drives(");
-    // Without members the parenthesis stays open; clients know the text so.
+    // Without members the parenthesis stays open: that is the text's form.
     const List_Entry_t* entry = pool->Drives->Head;
     for (; entry != nullptr; entry = entry->Next) {
         const DiskDrive_t* disk = WaitForDisk(ctrl, static_cast<char*>(entry->Data));

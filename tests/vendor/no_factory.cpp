@@ -1,0 +1,4 @@
+// A shared library like any other.
+extern "C" int answer() {
+    return 42;
+}
