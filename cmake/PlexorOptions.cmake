@@ -3,6 +3,7 @@ option(PLEXOR_CONTEXT_FLUSH
        "The host's CMPI context table has the entry 'flush' after 'addEntry' (OFF: any standard manager)" ON)
 option(PLEXOR_BUILD_TESTBED "Build the test bed (object manager with a simulated vendor)" ON)
 option(PLEXOR_BUILD_TESTS "Build the tests" ON)
+option(PLEXOR_BUILD_BENCH "Build the benchmarks" ON)
 set(PLEXOR_CMPI_INCLUDE_DIR "" CACHE PATH
     "Directory of an installed CMPI header set (empty: the declarations in cim/cmpi)")
 set(PLEXOR_HOSTCONFIG "" CACHE STRING

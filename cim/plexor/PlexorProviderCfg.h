@@ -26,7 +26,9 @@ CMPIEnumeration* QueryInstances(const char* caller, const CMPIContext* ctx,
                                 const CMPIObjectPath* path);
 CMPIEnumeration* QueryAssociators(const Query_t& query);
 CMPIEnumeration* QueryAssociatorNames(const Query_t& query);
-CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx, const CMPIObjectPath* path);
+/// The instance counts even if it came with a failure; `failed`, when given, tells.
+CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx, const CMPIObjectPath* path,
+                            bool* failed = nullptr);
 
 // The same without the line before the query.
 CMPIEnumeration* RunAssociators(const Query_t& query);

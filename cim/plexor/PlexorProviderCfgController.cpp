@@ -79,7 +79,7 @@ void ReadSoftware(RaidController_t* ctrl, const CMPIContext* ctx) {
         const CMPIUint16 classification = ReadArrayUint16(identity, "Classifications");
         char* version = StringClone(ReadString(identity, "VersionString"));
         syslog(LOG_DEBUG, "%s: ctrl %s, swClass %d, versionStr %s\n", kBuilder, ctrl->DeviceID,
-               classification, version);
+               classification, OrNull(version));
         char** field = VersionField(ctrl, classification);
         if (field == nullptr) {
             free(version);

@@ -11,8 +11,9 @@ constexpr const char kUpdater[] = "CheckAndUpdateDiskInfo";
 void UpdateStatus(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx,
                   const CMPIInstance* inst) {
     const CMPIUint16 operational = GetOperationalStatus(inst);
-    const CMPIInstance* extent = QueryInstance(kUpdater, ctx, disk->ExtentOp);
-    if (extent == nullptr) return;
+    bool failed = false;
+    const CMPIInstance* extent = QueryInstance(kUpdater, ctx, disk->ExtentOp, &failed);
+    if (extent == nullptr || failed) return;
     const CMPIUint16 extentStatus = ReadArrayUint16(extent, "ExtentStatus");
     if (operational == disk->OperationalStatus && extentStatus == disk->ExtentStatus) return;
 

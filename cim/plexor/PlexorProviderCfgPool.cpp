@@ -99,7 +99,7 @@ int BuildChassis(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObj
     syslog(LOG_DEBUG,
            "\nChassisOp: %s\n\tTag               - %s\n\tInternalTag       - %s\n"
            "\tOperationalStatus - %d\n",
-           PathText(LOG_DEBUG, chassis->ChassisOp), chassis->Tag, chassis->InternalTag,
+           PathText(LOG_DEBUG, chassis->ChassisOp), chassis->Tag, OrNull(chassis->InternalTag),
            chassis->OperationalStatus);
 
     MutexGuard lock(ctrl->CtrlMutex);

@@ -14,7 +14,7 @@ void ExamineProfile(CMPIInstance* inst, Array_t* profiles) {
     syslog(LOG_DEBUG,
            "CIM_RegisteredProfile: RegisteredName %s, RegisteredVersion: %s, "
            "RegisteredOrganization: %d\n",
-           name, version, organization);
+           OrNull(name), OrNull(version), organization);
     if (name == nullptr || strcmp(name, kProfileName) != 0) return;
     syslog(LOG_INFO, "Found a HHRC profile: %s\n",
            LogEnabled(LOG_INFO) ? PathText(LOG_INFO, InstancePath(inst)) : "");

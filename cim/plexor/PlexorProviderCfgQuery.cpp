@@ -4,10 +4,6 @@
 
 namespace {
 
-const char* OrNull(const char* text) {
-    return text != nullptr ? text : "NULL";
-}
-
 /// Whether a query may be made at all: there is a path to make it on, and nobody waits for us.
 bool MayAsk(const CMPIObjectPath* path) {
     return path != nullptr && !StopRequested();
@@ -80,17 +76,18 @@ CMPIEnumeration* QueryInstances(const char* caller, const CMPIContext* ctx,
     return nullptr;
 }
 
-CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx,
-                            const CMPIObjectPath* path) {
+CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx, const CMPIObjectPath* path,
+                            bool* failed) {
     syslog(LOG_DEBUG, "%s, CIM Query - GetInstance: %s", caller, PathText(LOG_DEBUG, path));
     if (!MayAsk(path)) return nullptr;
     CMPIStatus status = {CMPI_RC_OK, nullptr};
     const CMPIBroker* broker = CurrentBroker();
     CMPIInstance* found = broker->bft->getInstance(broker, ctx, path, nullptr, &status);
+    if (failed != nullptr) *failed = status.rc != CMPI_RC_OK;
     if (status.rc == CMPI_RC_OK) return found;
     syslog(LOG_ERR, "GetInstance %s failed, status: rc %d, msg %s", PathText(LOG_ERR, path),
            status.rc, StatusText(status));
-    return nullptr;
+    return found;
 }
 
 int AppendRecord(List_t* list, void* record, time_t& updateTime) {

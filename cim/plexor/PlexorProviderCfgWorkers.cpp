@@ -56,9 +56,10 @@ void RunItem(Thread_Args_t* item, CMPIContext* ctx, long index) {
 
 /// Waits until it is woken. The producers signal without PlexorThreadMutex, so a signal can fall
 /// between an empty GetItem and the wait; work that is queued then is found at the next look, not
-/// at the next signal, which might never come. The caller holds PlexorThreadMutex.
-void WaitForWork() {
-    for (;;) {
+/// at the next signal, which might never come. So is a stop, unless the worker was busy when it was
+/// asked for: then it waits for the next wake-up. The caller holds PlexorThreadMutex.
+void WaitForWork(bool wasBusyAtStop) {
+    while (!TerminateThread || wasBusyAtStop) {
         const timespec deadline = DeadlineIn(kMissedSignalSeconds);
         const int rc = pthread_cond_clockwait(&PlexorThreadCond, &PlexorThreadMutex,
                                               CLOCK_MONOTONIC, &deadline);
@@ -69,15 +70,20 @@ void WaitForWork() {
 
 /// Takes items until it is woken to terminate. The caller holds PlexorThreadMutex.
 void WorkUntilTerminated(CMPIContext* ctx, long index) {
+    bool ranItem = false;
     for (;;) {
         ActiveThreads++;
         auto* item = StopRequested() ? nullptr : static_cast<Thread_Args_t*>(GetItem(&__FIFO));
         if (item != nullptr) RunItem(item, ctx, index);
         ActiveThreads--;
-        if (item != nullptr) continue;
+        if (item != nullptr) {
+            ranItem = true;
+            continue;
+        }
         syslog(LOG_DEBUG, "%s(%ld): no item to process, wait...\n", "PlexorThread", index);
-        WaitForWork();
+        WaitForWork(ranItem && TerminateThread);
         if (TerminateThread) return;
+        ranItem = false;
     }
 }
 

@@ -101,7 +101,8 @@ void Open(Request& request) {
         syslog(LOG_DEBUG, "%s: %s\n", request.caller, served.name);
         return;
     }
-    syslog(LOG_DEBUG, "%s: unsupported class %s\n", request.caller, StringText(request.className));
+    syslog(LOG_DEBUG, "%s: unsupported class %s\n", request.caller,
+           OrNull(StringText(request.className)));
 }
 
 /// A path of the served class with all its keys; null when the broker gives none.

@@ -14,6 +14,11 @@ bool LogEnabled(int priority);
 /// without a call to the broker. The text is the broker's.
 const char* PathText(int priority, const CMPIObjectPath* path);
 
+/// How an absent text is shown in a log line.
+inline const char* OrNull(const char* text) {
+    return text != nullptr ? text : "NULL";
+}
+
 /// The characters of a string object; null for a null object or one without text.
 const char* StringText(const CMPIString* string);
 /// The characters of a string value (CMPI_string or CMPI_chars); null for every other value.

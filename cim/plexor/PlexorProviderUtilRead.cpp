@@ -82,9 +82,10 @@ bool NextElement(const CMPIEnumeration* enumeration, CMPIData& data) {
 
 /// Element 0 of an array property; a null value when there is no array.
 CMPIData FirstElement(const CMPIInstance* inst, const char* name) {
-    const CMPIData data = ReadProperty(inst, name);
-    const bool isNull = (data.state & (CMPI_nullValue | CMPI_badValue | CMPI_notFound)) != 0;
-    if (isNull || (data.type & CMPI_ARRAY) == 0 || data.value.array == nullptr) return NullData();
+    if (inst == nullptr) return NullData();
+    // Neither status nor state is asked: what claims to be an array and is there gets read.
+    const CMPIData data = inst->ft->getProperty(inst, name, nullptr);
+    if ((data.type & CMPI_ARRAY) == 0 || data.value.array == nullptr) return NullData();
     return data.value.array->ft->getElementAt(data.value.array, 0, nullptr);
 }
 

@@ -1,5 +1,5 @@
-// Every scenario, through the real library: what a client gets must be what was worked out by hand in
-// expected/NAME.txt.
+// Every scenario, through the real library: what a client gets must be what was worked out by hand
+// in expected/NAME.txt.
 #include <gtest/gtest.h>
 
 #include <algorithm>

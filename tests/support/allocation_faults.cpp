@@ -1,82 +1,126 @@
 #include "allocation_faults.h"
 
-#include <algorithm>
+#include <errno.h>
+#include <stdlib.h>
+#include <string.h>
+
 #include <atomic>
-#include <cerrno>
-#include <cstdlib>
-#include <cstring>
+#include <stdexcept>
+
+extern "C" {
+void* __real_calloc(size_t count, size_t size);
+void* __real_malloc(size_t size);
+void* __real_realloc(void* block, size_t size);
+char* __real_strdup(const char* text);
+}
 
 namespace plexortest {
 namespace {
 
-std::atomic<bool> active{false};
-std::atomic<int> firstRefused{0};
-std::atomic<bool> onlyOnce{false};
-std::atomic<int> asked{0};
-std::atomic<int> refusals{0};
-char refusedText[4096];  // written before `active` is set
+// Written only while nothing is armed; what the threads under test read is relaxed, so that an
+// allocation orders nothing between them.
+std::atomic<bool> armed{false};
+std::atomic<std::size_t> seen{0};
+std::atomic<std::size_t> failed{0};
+std::size_t firstToFail = 0;
+bool allFurtherFail = false;
+unsigned watched = 0;
+std::string* textToFail = nullptr;
 
-bool refuse() {
+bool shouldFail(Allocator which, const char* text) {
+    if (!armed.load(std::memory_order_acquire)) return false;
+    if ((watched & static_cast<unsigned>(which)) == 0) return false;
+    if (textToFail != nullptr && *textToFail != text) return false;
+    const std::size_t index = seen.fetch_add(1, std::memory_order_relaxed) + 1;
+    const bool fails = index == firstToFail || (allFurtherFail && index > firstToFail);
+    if (!fails) return false;
+    failed.fetch_add(1, std::memory_order_relaxed);
     errno = ENOMEM;
-    refusals++;
     return true;
 }
 
-/// Whether the allocation that is asked for now fails.
-bool refuseNext() {
-    if (!active) return false;
-    const int number = ++asked;
-    if (firstRefused == 0) return false;
-    if (onlyOnce ? number == firstRefused : number >= firstRefused) return refuse();
-    return false;
-}
-
-bool refuseCopyOf(const char* text) {
-    if (!active) return false;
-    if (refusedText[0] != '\0' && strcmp(text, refusedText) == 0) return refuse();
-    return refuseNext();
+void arm(std::size_t first, bool further, Allocator which, std::string* text) {
+    if (armed) throw std::logic_error("allocation faults are armed already");
+    seen = 0;
+    failed = 0;
+    firstToFail = first;
+    allFurtherFail = further;
+    watched = static_cast<unsigned>(which);
+    textToFail = text;
+    armed.store(true, std::memory_order_release);
 }
 
 }  // namespace
 
-FailAllocation::FailAllocation(int n, bool once, const std::string& text) {
-    firstRefused = n;
-    onlyOnce = once;
-    asked = 0;
-    refusals = 0;
-    text.copy(refusedText, sizeof refusedText - 1);
-    refusedText[std::min(text.size(), sizeof refusedText - 1)] = '\0';
-    active = true;
+FailAllocation FailAllocation::nth(std::size_t n, Allocator which) {
+    arm(n, false, which, nullptr);
+    return FailAllocation();
 }
 
-FailAllocation::~FailAllocation() { active = false; }
+FailAllocation FailAllocation::from(std::size_t n, Allocator which) {
+    arm(n, true, which, nullptr);
+    return FailAllocation();
+}
 
-int FailAllocation::refused() { return refusals; }
-int FailAllocation::counted() { return asked; }
+FailAllocation FailAllocation::strdupOf(std::string text) {
+    arm(1, true, Allocator::Strdup, new std::string(std::move(text)));
+    return FailAllocation();
+}
+
+FailAllocation FailAllocation::none(Allocator which) {
+    arm(0, false, which, nullptr);
+    return FailAllocation();
+}
+
+FailAllocation::~FailAllocation() {
+    armed = false;
+    delete textToFail;
+    textToFail = nullptr;
+}
+
+std::size_t FailAllocation::calls() const {
+    return seen;
+}
+std::size_t FailAllocation::failures() const {
+    return failed;
+}
+
+std::size_t forEachFailingAllocation(const std::function<void(std::size_t n)>& act) {
+    for (std::size_t n = 1;; n++) {
+        std::size_t failures = 0;
+        {
+            const auto fault = FailAllocation::nth(n);
+            act(n);
+            failures = fault.failures();
+        }
+        if (failures == 0) return n - 1;
+        const auto fault = FailAllocation::from(n);
+        act(n);
+    }
+}
 
 }  // namespace plexortest
 
 extern "C" {
 
-void* __real_calloc(size_t count, size_t size);
-void* __real_malloc(size_t size);
-void* __real_realloc(void* memory, size_t size);
-char* __real_strdup(const char* text);
-
 void* __wrap_calloc(size_t count, size_t size) {
-    return plexortest::refuseNext() ? nullptr : __real_calloc(count, size);
+    if (plexortest::shouldFail(plexortest::Allocator::Calloc, nullptr)) return nullptr;
+    return __real_calloc(count, size);
 }
 
 void* __wrap_malloc(size_t size) {
-    return plexortest::refuseNext() ? nullptr : __real_malloc(size);
+    if (plexortest::shouldFail(plexortest::Allocator::Malloc, nullptr)) return nullptr;
+    return __real_malloc(size);
 }
 
-void* __wrap_realloc(void* memory, size_t size) {
-    return plexortest::refuseNext() ? nullptr : __real_realloc(memory, size);
+void* __wrap_realloc(void* block, size_t size) {
+    if (plexortest::shouldFail(plexortest::Allocator::Realloc, nullptr)) return nullptr;
+    return __real_realloc(block, size);
 }
 
 char* __wrap_strdup(const char* text) {
-    return plexortest::refuseCopyOf(text) ? nullptr : __real_strdup(text);
+    if (plexortest::shouldFail(plexortest::Allocator::Strdup, text)) return nullptr;
+    return __real_strdup(text);
 }
 
 }  // extern "C"

@@ -1,37 +1,60 @@
-// The test program's own `syslog`, in front of the C library's: captures every line.
+// The system log that the provider writes to: `syslog` and `vsyslog` of the test executable.
 #pragma once
 
 #include <syslog.h>
 
+#include <cstddef>
+#include <functional>
+#include <iosfwd>
 #include <string>
 #include <thread>
 #include <vector>
 
+#include <gtest/gtest.h>
+
 namespace plexortest {
 
+/// One line of the log. Lines are equal when priority and text are.
 struct LogLine {
-    int priority;
-    std::string text;  ///< formatted, with its newline if it has one
-    std::thread::id thread;
+    int priority = 0;
+    std::string text;
+    std::thread::id thread = {};
+
+    bool operator==(const LogLine& other) const {
+        return priority == other.priority && text == other.text;
+    }
 };
 
-/// Thread-safe. `setlogmask` stays the C library's and does not filter what is captured.
+void PrintTo(const LogLine& line, std::ostream* out);
+
+/// What was logged since the last `clear`. Thread-safe. `setlogmask` stays the C library's.
 class CapturedSyslog {
 public:
     static std::vector<LogLine> lines();
-    /// Texts of the lines with that priority, in order.
+    /// The texts logged at one priority, in order.
     static std::vector<std::string> linesAt(int priority);
-    static std::vector<std::string> texts();
-    /// How many lines have exactly this text (at that priority).
+    /// How many lines have exactly that text, at whatever priority.
     static std::size_t count(const std::string& text);
-    static std::size_t count(int priority, const std::string& text);
-    /// How many lines contain this text.
     static std::size_t countContaining(const std::string& part);
-    /// Place of the first line with exactly this text at or behind `from`; -1 without one.
-    static int indexOf(const std::string& text, int from = 0);
     static void clear();
-    /// Off: lines are formatted and forgotten, for long runs.
-    static void capture(bool on);
+
+    /// Leaves out lines that the process's log mask holds back. Off by default.
+    static void honourMask(bool on);
+    /// Formats lines but keeps none, and takes no lock for it: the capture's own lock would order
+    /// the threads and hide their races.
+    static void discard(bool on);
+    /// Called for each line on the logging thread, without a lock; empty for none.
+    static void onLine(std::function<void(const LogLine&)> hook);
+    /// Everything back to how a test finds it: no lines, no hook, mask ignored, lines kept.
+    static void reset();
 };
+
+/// printf to a string: the text that a line must have.
+std::string formatted(const char* format, ...) __attribute__((format(printf, 1, 2)));
+
+/// Whether a line of that priority and text was logged; the failure lists what was.
+::testing::AssertionResult logged(int priority, const std::string& text);
+/// Whether these lines were logged in this order, others before, between and after them.
+::testing::AssertionResult loggedInOrder(const std::vector<LogLine>& wanted);
 
 }  // namespace plexortest

@@ -1,142 +1,120 @@
 #include "provider_fixture.h"
 
-#include <cstdlib>
-#include <cstring>
+#include <stdlib.h>
+
+#include <chrono>
+#include <thread>
+
+#include "PlexorProviderCfg.h"
 
 namespace plexortest {
+namespace {
 
-ProviderTest::ProviderTest() : mi_{nullptr, &instMIFT__} {}
-
-void ProviderTest::SetUp() {
-    VirtualClock::set(kStartTime);
-    VirtualClock::clearSleeps();
-    resetProviderState();
-    broker_ = std::make_unique<testbed::Broker>(repository_);
-    scope_ = std::make_unique<testbed::Broker::CallScope>(*broker_);
-    ::Broker = broker_->handle();
-    CapturedSyslog::capture(true);
-    CapturedSyslog::clear();
-}
-
-void ProviderTest::TearDown() {
-    broker_->faults().clear();
-    FreeList(RaidControllerList, FreeController);
-    ReleaseSystemInfo();
-    while (!IsFifoEmpty(&__FIFO)) {
-        auto* item = static_cast<Thread_Args_t*>(GetItem(&__FIFO));
+void drainFifo() {
+    while (auto* item = static_cast<Thread_Args_t*>(GetItem(&__FIFO))) {
         if (item->Func == ProcessBuildLogicalDeviceInfo) {
             ReleaseDeviceItem(item);
         } else {
             free(item);
         }
     }
-    resetProviderState();
-    EXPECT_EQ(books().liveClones(), expectedClones_);
-    if (!allowMisuse_) {
-        for (const std::string& misuse : books().misuses()) ADD_FAILURE() << "misuse: " << misuse;
-    }
-    scope_.reset();
-    broker_.reset();
-    ::Broker = nullptr;
 }
 
-RaidController_t* ProviderTest::newController(const std::string& deviceId,
-                                              const std::string& model) {
-    auto* ctrl = static_cast<RaidController_t*>(calloc(1, sizeof(RaidController_t)));
-    for (pthread_mutex_t* mutex :
-         {&ctrl->CtrlMutex, &ctrl->DiskCfgMutex, &ctrl->VolumeCfgMutex, &ctrl->PortCfgMutex,
-          &ctrl->BatteryCfgMutex, &ctrl->PoolCfgMutex, &ctrl->ChassisCfgMutex})
-        pthread_mutex_init(mutex, nullptr);
-    ctrl->VolumeList = &ctrl->__VolumeList;
-    ctrl->DiskList = &ctrl->__DiskList;
-    ctrl->PoolList = &ctrl->__PoolList;
-    ctrl->BatteryList = &ctrl->__BatteryList;
-    ctrl->ChassisList = &ctrl->__ChassisList;
-    ctrl->PortList = &ctrl->__PortList;
-    ctrl->DeviceID = ownedText(deviceId);
-    ctrl->Model = ownedText(model);
-    return ctrl;
+void resetGlobals() {
+    pthread_mutex_lock(&PlexorThreadMutex);
+    ActiveThreads = 0;
+    TerminateThread = 0;
+    ThreadActivityDone = 0;
+    pthread_mutex_unlock(&PlexorThreadMutex);
+    PlexorThreads[0] = PlexorThreads[1] = 0;
+    __atomic_store_n(&StateUpdateInterval, 20, __ATOMIC_RELAXED);
+    __atomic_store_n(&_ProviderInitialized, 0, __ATOMIC_RELAXED);
+    __atomic_store_n(&NextUnloadTime, 0, __ATOMIC_RELAXED);
+    __atomic_store_n(&IdleTimeBeforeTerminating, 5, __ATOMIC_RELAXED);
+    __atomic_store_n(&InitCompleteTime, 0, __ATOMIC_RELAXED);
+    waitDebug = 0;
 }
 
-RaidController_t* ProviderTest::addController(const std::string& deviceId,
-                                              const std::string& model) {
-    RaidController_t* ctrl = newController(deviceId, model);
-    AddEntryAtListTail(RaidControllerList, ctrl);
-    return ctrl;
-}
-
-char* ownedText(const std::string& text) { return text.empty() ? nullptr : strdup(text.c_str()); }
-
-namespace {
-
-template <typename Record>
-Record* zeroed() {
-    return static_cast<Record*>(calloc(1, sizeof(Record)));
+void setBroker(const CMPIBroker* handle) {
+    __atomic_store_n(&Broker, handle, __ATOMIC_RELAXED);
 }
 
 }  // namespace
 
-StoragePool_t* newPool(const std::string& instanceId, const std::string& poolId, bool primordial) {
-    auto* pool = zeroed<StoragePool_t>();
-    pool->InstanceID = ownedText(instanceId);
-    pool->PoolID = ownedText(poolId);
-    pool->Primordial = primordial ? 1 : 0;
-    pool->Drives = &pool->_Drives;
-    return pool;
-}
+ProviderTest::ProviderTest(testbed::BrokerOptions options)
+    : broker(repository, std::move(options)) {}
 
-DiskDrive_t* newDisk(const std::string& deviceId, const std::string& name, const std::string& pool,
-                     const std::string& chassis) {
-    auto* disk = zeroed<DiskDrive_t>();
-    disk->DeviceID = ownedText(deviceId);
-    disk->Name = ownedText(name);
-    disk->Pool = ownedText(pool);
-    disk->Chassis = ownedText(chassis);
-    return disk;
-}
-
-StorageVolume_t* newVolume(const std::string& deviceId, const std::string& elementName,
-                           const std::string& fromPool) {
-    auto* volume = zeroed<StorageVolume_t>();
-    volume->DeviceID = ownedText(deviceId);
-    volume->ElementName = ownedText(elementName);
-    volume->FromPool = ownedText(fromPool);
-    return volume;
-}
-
-SASSATAPort_t* newPort(const std::string& deviceId, const std::string& name) {
-    auto* port = zeroed<SASSATAPort_t>();
-    port->DeviceID = ownedText(deviceId);
-    port->PortName = ownedText(name);
-    return port;
-}
-
-Battery_t* newBattery(const std::string& deviceId) {
-    auto* battery = zeroed<Battery_t>();
-    battery->DeviceID = ownedText(deviceId);
-    return battery;
-}
-
-Chassis_t* newChassis(const std::string& tag, const std::string& internalTag) {
-    auto* chassis = zeroed<Chassis_t>();
-    chassis->Tag = ownedText(tag);
-    chassis->InternalTag = ownedText(internalTag);
-    return chassis;
-}
-
-void resetProviderState() {
-    *RaidControllerList = {nullptr, nullptr, 0};
-    __FIFO.List = {nullptr, nullptr, 0};
-    ActiveThreads = 0;
-    TerminateThread = 0;
-    ThreadActivityDone = 0;
-    StateUpdateInterval = 20;
-    _ProviderInitialized = 0;
-    IdleTimeBeforeTerminating = 5;
-    NextUnloadTime = 0;
-    InitCompleteTime = 0;
-    waitDebug = 0;
+void ProviderTest::SetUp() {
+    unsetenv("WAIT_PROC");
+    setenv("PLEXOR_HOSTCONFIG_FILE", "/nonexistent/hostconfig", 1);
+    setlogmask(LOG_UPTO(LOG_DEBUG));
+    VirtualClock::reset(kStart);
+    repository.addNamespace("root/cimv2");
+    repository.addNamespace("root/interop");
+    scope_.emplace(broker);
+    setBroker(broker.handle());
+    resetGlobals();
     AdmitWork();
+    CapturedSyslog::reset();
+}
+
+void ProviderTest::TearDown() {
+    CapturedSyslog::onLine(nullptr);
+    VirtualClock::onSleep(nullptr);
+    faults().clear();
+    stopWorkers();
+    FreeList(RaidControllerList, FreeController);
+    ReleaseSystemInfo();
+    drainFifo();
+    EXPECT_EQ(books().liveClones(), leftClones_);
+    scope_.reset();
+    if (!misusesExpected_) {
+        EXPECT_EQ(books().misuses(), std::vector<std::string>{});
+    }
+    resetGlobals();
+    setBroker(nullptr);
+    CapturedSyslog::reset();
+}
+
+testbed::FaultRule ProviderTest::refusal(testbed::Entry entry, CMPIrc rc,
+                                         std::optional<std::string> message) {
+    testbed::FaultRule rule;
+    rule.entry = entry;
+    rule.rc = rc;
+    rule.message = std::move(message);
+    return rule;
+}
+
+CMPIObjectPath* ProviderTest::clonedPath(const testbed::ObjectPath& path) {
+    const CMPIObjectPath* original = broker.makePath(path);
+    return original->ft->clone(original, nullptr);
+}
+
+CMPIInstance* ProviderTest::clonedInstance(const testbed::Instance& instance) {
+    const CMPIInstance* original = broker.makeInstance(instance);
+    return original->ft->clone(original, nullptr);
+}
+
+void ProviderTest::startWorkers() {
+    InitPlexorThreads(ctx());
+}
+
+void ProviderTest::stopWorkers() {
+    if (PlexorThreads[0] == 0 && PlexorThreads[1] == 0) return;
+    EXPECT_TRUE(QuiesceWorkers()) << "a work function does not end";
+    // A worker that had not begun to wait misses the first call; the second takes it too.
+    CleanupPlexorThreads();
+    CleanupPlexorThreads();
+    PlexorThreads[0] = PlexorThreads[1] = 0;
+}
+
+bool ProviderTest::eventually(const std::function<bool()>& condition) {
+    const auto limit = std::chrono::steady_clock::now() + std::chrono::seconds(5);
+    while (!condition()) {
+        if (std::chrono::steady_clock::now() > limit) return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+    return true;
 }
 
 }  // namespace plexortest

@@ -1,72 +1,68 @@
-// What every test of the provider starts from: a broker over an empty repository, a clock that
-// stands, an empty log, a provider without inventory; and what it must leave behind.
+// A provider in a process of its own making: broker, clock, log and globals as after loading.
 #pragma once
 
 #include <gtest/gtest.h>
 
-#include <memory>
+#include <functional>
+#include <optional>
 #include <string>
+#include <vector>
 
-#include "PlexorProviderCfg.h"
+#include "PlexorProvider.h"
 #include "allocation_faults.h"
 #include "broker.h"
 #include "captured_syslog.h"
-#include "instance_client.h"
+#include "records.h"
 #include "repository.h"
 #include "virtual_clock.h"
 
 namespace plexortest {
 
-inline constexpr std::time_t kStartTime = 1'000'000'000;
-
+/// `Broker` names the provider's global here; the class is testbed::Broker.
 class ProviderTest : public ::testing::Test {
 protected:
-    ProviderTest();
+    /// The clock's time when a test begins.
+    static constexpr time_t kStart = 1'700'000'000;
+
+    explicit ProviderTest(testbed::BrokerOptions options = {});
     void SetUp() override;
+    /// Stops workers that were started, releases everything the provider holds, puts every global
+    /// back, and fails the test when the broker saw a misuse or a clone is left.
     void TearDown() override;
 
-    testbed::Broker& broker() { return *broker_; }
-    testbed::Books& books() { return broker_->books(); }
-    testbed::Faults& faults() { return broker_->faults(); }
-    /// Context of the call scope that the test runs in.
-    CMPIContext* context() { return scope_->context(); }
-    const CMPIInstanceMI* mi() { return &mi_; }
-    testbed::InstanceClient client() { return {*broker_, &mi_}; }
+    /// What the manager passes into a call; the same for the whole test.
+    CMPIContext* ctx() { return scope_->context(); }
+    testbed::Books& books() { return broker.books(); }
+    testbed::Faults& faults() { return broker.faults(); }
 
-    /// An empty controller with locks and lists, owned by nobody yet.
-    static RaidController_t* newController(const std::string& deviceId,
-                                           const std::string& model = "");
-    /// The same, appended to RaidControllerList, which releases it.
-    static RaidController_t* addController(const std::string& deviceId,
-                                           const std::string& model = "");
+    /// A rule that refuses calls of `entry`; refine and pass it to faults().add().
+    static testbed::FaultRule refusal(testbed::Entry entry, CMPIrc rc = CMPI_RC_ERR_FAILED,
+                                      std::optional<std::string> message = {});
 
-    /// For tests that leave clones behind on purpose: how many may live at the end.
-    std::size_t expectedClones_ = 0;
-    /// For tests of misuse by the broker's standards.
-    bool allowMisuse_ = false;
+    /// A clone as records own it.
+    CMPIObjectPath* clonedPath(const testbed::ObjectPath& path);
+    CMPIInstance* clonedInstance(const testbed::Instance& instance);
 
-    testbed::Repository repository_;
+    /// Starts the two workers on a polling interval from no option file (20 s).
+    void startWorkers();
+    /// Lets running work end and both workers leave; a test's own clean-up may have come before.
+    void stopWorkers();
+    /// Really waits until the condition holds, five seconds at most; whether it does.
+    static bool eventually(const std::function<bool()>& condition);
+
+    /// Clones that the test expects to be left behind.
+    void expectLeftClones(std::size_t count) { leftClones_ = count; }
+    /// Misuses that the test expects the broker to have seen; the default is none.
+    void expectMisuses(bool expected) { misusesExpected_ = expected; }
+
+    testbed::Repository repository;
+    testbed::Broker broker;
+    CMPIInstanceMI mi = {nullptr, &instMIFT__};
 
 private:
-    std::unique_ptr<testbed::Broker> broker_;
-    std::unique_ptr<testbed::Broker::CallScope> scope_;
-    CMPIInstanceMI mi_;
+    std::optional<testbed::Broker::CallScope> scope_;
+    std::size_t leftClones_ = 0;
+    bool misusesExpected_ = false;
 };
-
-// Records with owned copies; "" gives a null string. Not in any list.
-StoragePool_t* newPool(const std::string& instanceId, const std::string& poolId, bool primordial);
-DiskDrive_t* newDisk(const std::string& deviceId, const std::string& name,
-                     const std::string& pool = "", const std::string& chassis = "");
-StorageVolume_t* newVolume(const std::string& deviceId, const std::string& elementName,
-                           const std::string& fromPool = "");
-SASSATAPort_t* newPort(const std::string& deviceId, const std::string& name);
-Battery_t* newBattery(const std::string& deviceId);
-Chassis_t* newChassis(const std::string& tag, const std::string& internalTag = "");
-
-/// A heap copy; null for "".
-char* ownedText(const std::string& text);
-
-/// Puts the provider's exported state back to what it is right after loading. No worker may run.
-void resetProviderState();
 
 }  // namespace plexortest

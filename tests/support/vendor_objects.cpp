@@ -1,258 +1,235 @@
 #include "vendor_objects.h"
 
-#include <vector>
-
 namespace plexortest {
 
 using testbed::CimValue;
+using testbed::NamedValue;
+using testbed::ObjectPath;
 
 namespace {
 
-struct ClassPair {
-    const char* name;
-    const char* superclass;
-};
+constexpr char kHostNamespace[] = "root/cimv2";
+constexpr char kProfileNamespace[] = "root/interop";
+constexpr char kHostClass[] = "OMC_UnitaryComputerSystem";
 
-constexpr ClassPair kCimClasses[] = {
-    {"CIM_ManagedElement", ""},
-    {"CIM_RegisteredProfile", "CIM_ManagedElement"},
-    {"CIM_ComputerSystem", "CIM_ManagedElement"},
-    {"CIM_LogicalDevice", "CIM_ManagedElement"},
-    {"CIM_PortController", "CIM_LogicalDevice"},
-    {"CIM_DiskDrive", "CIM_LogicalDevice"},
-    {"CIM_SASSATAPort", "CIM_LogicalDevice"},
-    {"CIM_Battery", "CIM_LogicalDevice"},
-    {"CIM_Fan", "CIM_LogicalDevice"},
-    {"CIM_StorageExtent", "CIM_LogicalDevice"},
-    {"CIM_StorageVolume", "CIM_StorageExtent"},
-    {"CIM_PhysicalPackage", "CIM_ManagedElement"},
-    {"CIM_Chassis", "CIM_PhysicalPackage"},
-    {"CIM_Slot", "CIM_ManagedElement"},
-    {"CIM_SoftwareIdentity", "CIM_ManagedElement"},
-    {"CIM_StoragePool", "CIM_ManagedElement"},
-    {"CIM_StorageSetting", "CIM_ManagedElement"},
-};
-
-constexpr const char* kAssociations[] = {
-    "CIM_ElementConformsToProfile",
-    "CIM_LogicalIdentity",
-    "CIM_Realizes",
-    "CIM_ElementSoftwareIdentity",
-    "CIM_HostedStoragePool",
-    "CIM_SystemPackaging",
-    "CIM_SystemDevice",
-    "CIM_MediaPresent",
-    "CIM_ConcreteComponent",
-    "CIM_PackageInConnector",
-    "CIM_Container",
-    "CIM_ElementSettingData",
-    "CIM_AllocatedFromStoragePool",
-};
-
-void define(testbed::Repository& repository, const char* nameSpace, const std::string& name,
-            const std::string& superclass) {
-    repository.defineClass(nameSpace, {name, superclass, {}});
+CimValue text(const std::string& value) {
+    return CimValue::string(value);
+}
+CimValue status(std::uint16_t value) {
+    return CimValue::uint16Array({value});
 }
 
-std::string vendorName(const std::string& cimName) { return "Sample_" + cimName.substr(4); }
+ObjectPath pathOf(const std::string& nameSpace, const std::string& className,
+                  const std::vector<NamedValue>& keys) {
+    return ObjectPath{nameSpace, className, keys};
+}
+
+ObjectPath physicalPath(const std::string& cimClass, const std::string& tag) {
+    const std::string className = vendorClass(cimClass);
+    return pathOf(kVendorNamespace, className,
+                  {{"CreationClassName", text(className)}, {"Tag", text(tag)}});
+}
+
+ObjectPath identifiedPath(const std::string& cimClass, const std::string& instanceID) {
+    return pathOf(kVendorNamespace, vendorClass(cimClass), {{"InstanceID", text(instanceID)}});
+}
+
+struct Roles {
+    const char* association;
+    const char* left;
+    const char* right;
+};
+
+constexpr Roles kRoles[] = {
+    {"CIM_SystemDevice", "GroupComponent", "PartComponent"},
+    {"CIM_HostedStoragePool", "GroupComponent", "PartComponent"},
+    {"CIM_ConcreteComponent", "GroupComponent", "PartComponent"},
+    {"CIM_Container", "GroupComponent", "PartComponent"},
+    {"CIM_LogicalIdentity", "SystemElement", "SameElement"},
+    {"CIM_ElementConformsToProfile", "ConformantStandard", "ManagedElement"},
+    {"CIM_ElementSettingData", "ManagedElement", "SettingData"},
+};
+
+Roles rolesOf(const std::string& association) {
+    for (const Roles& roles : kRoles) {
+        if (association == roles.association) return roles;
+    }
+    return {association.c_str(), "Antecedent", "Dependent"};
+}
 
 }  // namespace
 
 VendorObjects::VendorObjects(testbed::Repository& repository) : repository_(repository) {
-    for (const char* nameSpace : {"root/cimv2", "root/interop", "root/sample"}) {
-        for (const ClassPair& cim : kCimClasses) {
-            define(repository, nameSpace, cim.name, cim.superclass);
-            define(repository, nameSpace, vendorName(cim.name), cim.name);
-        }
-        for (const char* association : kAssociations) {
-            define(repository, nameSpace, association, "");
-            define(repository, nameSpace, vendorName(association), association);
-        }
-    }
-    define(repository, "root/cimv2", "OMC_UnitaryComputerSystem", "CIM_ComputerSystem");
+    defineVendorClasses(repository_, kVendorNamespace);
+    defineVendorClasses(repository_, kProfileNamespace);
+    testbed::ClassDefinition hostClass;
+    hostClass.name = kHostClass;
+    repository_.defineClass(kHostNamespace, hostClass);
 }
 
-VendorObjects::Path VendorObjects::object(const std::string& cimSuffix, const std::string& keyName,
-                                          const std::string& key, Properties properties,
-                                          const std::string& nameSpace) {
+ObjectPath VendorObjects::put(ObjectPath path, const std::vector<NamedValue>& properties) {
     testbed::Instance instance;
-    instance.path.nameSpace = nameSpace;
-    instance.path.className = "Sample_" + cimSuffix;
-    instance.path.key(keyName, CimValue::string(key));
-    instance.set(keyName, CimValue::string(key));
-    for (const auto& [name, value] : properties) instance.set(name, value);
-    repository_.put(instance);
-    return instance.path;
-}
-
-void VendorObjects::link(const std::string& assocClass, const Path& left, const Path& right) {
-    repository_.associate(vendorName(assocClass), {"Antecedent", left}, {"Dependent", right});
-}
-
-void VendorObjects::set(const Path& path, const std::string& name, CimValue value) {
-    repository_.setProperty(path, name, std::move(value));
-}
-
-VendorObjects::Path VendorObjects::host(const std::string& name, const std::string& elementName,
-                                        const std::string& creationClass) {
-    testbed::Instance instance;
-    instance.path.nameSpace = "root/cimv2";
-    instance.path.className = "OMC_UnitaryComputerSystem";
-    instance.path.key("CreationClassName", CimValue::string(creationClass));
-    instance.path.key("Name", CimValue::string(name));
-    instance.set("Name", CimValue::string(name));
-    instance.set("ElementName", CimValue::string(elementName));
-    instance.set("CreationClassName", CimValue::string(creationClass));
-    repository_.put(instance);
-    return instance.path;
-}
-
-VendorObjects::Path VendorObjects::profile(const std::string& id,
-                                           const std::string& registeredName) {
-    return object("RegisteredProfile", "InstanceID", id,
-                  {{"RegisteredName", CimValue::string(registeredName)},
-                   {"RegisteredOrganization", CimValue::uint16(2)},
-                   {"RegisteredVersion", CimValue::string("1.0.0")}},
-                  "root/interop");
-}
-
-VendorObjects::Path VendorObjects::portController(const Path& profile,
-                                                  const std::string& deviceId) {
-    const Path path = object("PortController", "DeviceID", deviceId);
-    link("CIM_ElementConformsToProfile", profile, path);
+    instance.path = path;
+    instance.properties = path.keys;
+    for (const NamedValue& property : properties) instance.set(property.first, property.second);
+    repository_.put(std::move(instance));
     return path;
 }
 
-VendorObjects::Path VendorObjects::system(const Path& portController, const std::string& name) {
-    const Path path = object("ComputerSystem", "Name", name,
-                             {{"OperationalStatus", CimValue::uint16Array({2})}});
-    link("CIM_LogicalIdentity", portController, path);
+void VendorObjects::tie(const std::string& cimAssociation, const ObjectPath& left,
+                        const ObjectPath& right) {
+    const Roles roles = rolesOf(cimAssociation);
+    repository_.associate(vendorClass(cimAssociation), {roles.left, left}, {roles.right, right});
+}
+
+void VendorObjects::tieIfNamed(const std::string& cimAssociation, const ObjectPath& left,
+                               const ObjectPath& right) {
+    if (!left.className.empty() && !right.className.empty()) tie(cimAssociation, left, right);
+}
+
+ObjectPath VendorObjects::devicePath(const std::string& cimClass, const std::string& deviceID) {
+    const std::string className = vendorClass(cimClass);
+    return pathOf(kVendorNamespace, className,
+                  {{"SystemCreationClassName", text("Sample_ComputerSystem")},
+                   {"SystemName", text("sample")},
+                   {"CreationClassName", text(className)},
+                   {"DeviceID", text(deviceID)}});
+}
+
+ObjectPath VendorObjects::device(const VendorController& controller, const std::string& cimClass,
+                                 const std::string& deviceID,
+                                 const std::vector<NamedValue>& properties) {
+    const ObjectPath path = put(devicePath(cimClass, deviceID), properties);
+    tieIfNamed("CIM_SystemDevice", controller.system, path);
     return path;
 }
 
-VendorObjects::Path VendorObjects::card(const Path& portController, const std::string& model,
-                                        std::uint16_t health) {
-    const Path path =
-        object("PhysicalPackage", "Tag", "card-" + model,
-               {{"Model", CimValue::string(model)}, {"HealthState", CimValue::uint16(health)}});
-    link("CIM_Realizes", path, portController);
+ObjectPath VendorObjects::host(const std::string& name) {
+    return put(pathOf(kHostNamespace, kHostClass,
+                      {{"CreationClassName", text(kHostClass)}, {"Name", text(name)}}),
+               {{"ElementName", text("host")}});
+}
+
+ObjectPath VendorObjects::profile(const std::string& name, const std::string& instanceID) {
+    return put(
+        pathOf(kProfileNamespace, "Sample_RegisteredProfile", {{"InstanceID", text(instanceID)}}),
+        {{"RegisteredName", text(name)},
+         {"RegisteredOrganization", CimValue::uint16(11)},
+         {"RegisteredVersion", text("1.0.0")}});
+}
+
+ObjectPath VendorObjects::portController(const std::string& deviceID) {
+    return put(devicePath("CIM_PortController", deviceID), {});
+}
+
+VendorController VendorObjects::controller(const std::string& deviceID, const ObjectPath& profile) {
+    VendorController controller;
+    controller.port = portController(deviceID);
+    controller.system = put(pathOf(kVendorNamespace, "Sample_ComputerSystem",
+                                   {{"CreationClassName", text("Sample_ComputerSystem")},
+                                    {"Name", text("system-" + deviceID)}}),
+                            {{"OperationalStatus", status(2)}});
+    controller.package =
+        put(physicalPath("CIM_PhysicalPackage", "card-" + deviceID),
+            {{"Model", text("Model " + deviceID)}, {"HealthState", CimValue::uint16(5)}});
+    tie("CIM_LogicalIdentity", controller.port, controller.system);
+    tie("CIM_Realizes", controller.package, controller.port);
+    tieIfNamed("CIM_ElementConformsToProfile", profile, controller.port);
+    return controller;
+}
+
+ObjectPath VendorObjects::software(const ObjectPath& system, std::uint16_t classification,
+                                   const std::string& version) {
+    const ObjectPath path = put(identifiedPath("CIM_SoftwareIdentity", "software-" + version),
+                                {{"Classifications", CimValue::uint16Array({classification})},
+                                 {"VersionString", text(version)}});
+    tie("CIM_ElementSoftwareIdentity", path, system);
     return path;
 }
 
-VendorObjects::Path VendorObjects::software(const Path& owner, const std::string& id,
-                                            std::uint16_t classification,
-                                            const std::string& version) {
-    const Path path = object("SoftwareIdentity", "InstanceID", id,
-                             {{"Classifications", CimValue::uint16Array({classification})},
-                              {"VersionString", CimValue::string(version)}});
-    link("CIM_ElementSoftwareIdentity", path, owner);
+ObjectPath VendorObjects::pool(const VendorController& controller, const std::string& instanceID,
+                               bool primordial) {
+    const ObjectPath path = put(identifiedPath("CIM_StoragePool", instanceID),
+                                {{"PoolID", text("Pool " + instanceID)},
+                                 {"Primordial", CimValue::boolean(primordial)},
+                                 {"TotalManagedSpace", CimValue::uint64(1000)},
+                                 {"RemainingManagedSpace", CimValue::uint64(400)},
+                                 {"OperationalStatus", status(2)}});
+    tieIfNamed("CIM_HostedStoragePool", controller.system, path);
     return path;
 }
 
-VendorObjects::Path VendorObjects::pool(const Path& system, const std::string& instanceId,
-                                        bool primordial) {
-    const Path path = object("StoragePool", "InstanceID", instanceId,
-                             {{"PoolID", CimValue::string("id-" + instanceId)},
-                              {"TotalManagedSpace", CimValue::uint64(1000)},
-                              {"RemainingManagedSpace", CimValue::uint64(400)},
-                              {"Primordial", CimValue::boolean(primordial)},
-                              {"OperationalStatus", CimValue::uint16Array({2})}});
-    link("CIM_HostedStoragePool", system, path);
+ObjectPath VendorObjects::chassis(const VendorController& controller, const std::string& tag) {
+    const ObjectPath path =
+        put(physicalPath("CIM_Chassis", tag), {{"OperationalStatus", status(2)}});
+    tieIfNamed("CIM_SystemPackaging", path, controller.system);
     return path;
 }
 
-VendorObjects::Path VendorObjects::chassis(const Path& system, const std::string& tag) {
-    const Path path =
-        object("Chassis", "Tag", tag, {{"OperationalStatus", CimValue::uint16Array({2})}});
-    link("CIM_SystemPackaging", path, system);
-    return path;
+VendorDrive VendorObjects::drive(const VendorController& controller, const std::string& deviceID,
+                                 const ObjectPath& pool, const ObjectPath& chassis,
+                                 std::uint16_t slot) {
+    VendorDrive drive;
+    drive.drive = device(controller, "CIM_DiskDrive", deviceID,
+                         {{"Name", text("Disk " + deviceID)},
+                          {"EnabledState", CimValue::uint16(2)},
+                          {"OperationalStatus", status(2)}});
+    drive.extent = put(devicePath("CIM_StorageExtent", "extent-" + deviceID),
+                       {{"NumberOfBlocks", CimValue::uint64(2000)},
+                        {"ConsumableBlocks", CimValue::uint64(1000)},
+                        {"Primordial", CimValue::boolean(true)},
+                        {"ExtentStatus", status(2)}});
+    drive.software = software(drive.drive, 10, "FW-" + deviceID);
+    drive.package = put(physicalPath("CIM_PhysicalPackage", "package-" + deviceID), {});
+    drive.slot =
+        put(physicalPath("CIM_Slot", "slot-" + deviceID), {{"Number", CimValue::uint16(slot)}});
+    tie("CIM_MediaPresent", drive.drive, drive.extent);
+    tie("CIM_Realizes", drive.package, drive.drive);
+    tie("CIM_PackageInConnector", drive.slot, drive.package);
+    tieIfNamed("CIM_Container", chassis, drive.slot);
+    tieIfNamed("CIM_ConcreteComponent", pool, drive.extent);
+    return drive;
 }
 
-VendorObjects::Path VendorObjects::drive(const Path& system, const std::string& deviceId) {
-    const Path path = object("DiskDrive", "DeviceID", deviceId,
-                             {{"Name", CimValue::string("Drive " + deviceId)},
-                              {"EnabledState", CimValue::uint16(2)},
-                              {"OperationalStatus", CimValue::uint16Array({2})}});
-    link("CIM_SystemDevice", system, path);
-    return path;
+VendorVolume VendorObjects::volume(const VendorController& controller, const std::string& deviceID,
+                                   const ObjectPath& pool, const std::string& raidLevel) {
+    VendorVolume volume;
+    volume.volume = device(controller, "CIM_StorageVolume", deviceID,
+                           {{"ElementName", text("Volume " + deviceID)},
+                            {"Name", text("Name " + deviceID)},
+                            {"NameFormat", CimValue::uint16(2)},
+                            {"NameNameSpace", CimValue::uint16(7)},
+                            {"NumberOfBlocks", CimValue::uint64(5000)},
+                            {"ConsumableBlocks", CimValue::uint64(100)},
+                            {"DataRedundancy", CimValue::uint16(1)},
+                            {"PackageRedundancy", CimValue::uint16(2)},
+                            {"IsBasedOnUnderlyingRedundancy", CimValue::boolean(true)},
+                            {"DeltaReservation", CimValue::uint8(3)},
+                            {"Primordial", CimValue::boolean(false)},
+                            {"OperationalStatus", status(2)},
+                            {"ExtentStatus", status(2)}});
+    volume.setting = put(identifiedPath("CIM_StorageSetting", "setting-" + deviceID),
+                         {{"ElementName", text(raidLevel)}});
+    tie("CIM_ElementSettingData", volume.volume, volume.setting);
+    tieIfNamed("CIM_AllocatedFromStoragePool", pool, volume.volume);
+    return volume;
 }
 
-VendorObjects::Path VendorObjects::extent(const Path& drive, const std::string& deviceId) {
-    const Path path = object("StorageExtent", "DeviceID", deviceId,
-                             {{"NumberOfBlocks", CimValue::uint64(2000)},
-                              {"ConsumableBlocks", CimValue::uint64(1900)},
-                              {"Primordial", CimValue::boolean(false)},
-                              {"ExtentStatus", CimValue::uint16Array({2})}});
-    link("CIM_MediaPresent", drive, path);
-    return path;
+ObjectPath VendorObjects::port(const VendorController& controller, const std::string& deviceID) {
+    return device(controller, "CIM_SASSATAPort", deviceID,
+                  {{"ElementName", text("Port " + deviceID)},
+                   {"PortType", CimValue::uint16(94)},
+                   {"UsageRestriction", CimValue::uint16(2)},
+                   {"OperationalStatus", status(2)}});
 }
 
-void VendorObjects::inPool(const Path& extent, const Path& pool) {
-    link("CIM_ConcreteComponent", pool, extent);
+ObjectPath VendorObjects::battery(const VendorController& controller, const std::string& deviceID) {
+    return device(controller, "CIM_Battery", deviceID,
+                  {{"BatteryStatus", CimValue::uint16(3)}, {"OperationalStatus", status(2)}});
 }
 
-VendorObjects::Path VendorObjects::slot(const Path& drive, const std::string& tag,
-                                        std::uint16_t number) {
-    const Path package = object("PhysicalPackage", "Tag", "package-" + tag);
-    link("CIM_Realizes", package, drive);
-    const Path path = object("Slot", "Tag", "slot-" + tag, {{"Number", CimValue::uint16(number)}});
-    link("CIM_PackageInConnector", path, package);
-    return path;
-}
-
-void VendorObjects::inChassis(const Path& slot, const Path& chassis) {
-    link("CIM_Container", chassis, slot);
-}
-
-VendorObjects::Path VendorObjects::volume(const Path& system, const std::string& deviceId) {
-    const Path path = object("StorageVolume", "DeviceID", deviceId,
-                             {{"ElementName", CimValue::string("data" + deviceId)},
-                              {"Name", CimValue::string("naa.600" + deviceId)},
-                              {"NameFormat", CimValue::uint16(9)},
-                              {"NameNameSpace", CimValue::uint16(2)},
-                              {"NumberOfBlocks", CimValue::uint64(4000)},
-                              {"ConsumableBlocks", CimValue::uint64(3900)},
-                              {"DataRedundancy", CimValue::uint16(1)},
-                              {"PackageRedundancy", CimValue::uint16(1)},
-                              {"IsBasedOnUnderlyingRedundancy", CimValue::boolean(true)},
-                              {"DeltaReservation", CimValue::uint8(100)},
-                              {"Primordial", CimValue::boolean(false)},
-                              {"OperationalStatus", CimValue::uint16Array({2})},
-                              {"ExtentStatus", CimValue::uint16Array({2})}});
-    link("CIM_SystemDevice", system, path);
-    return path;
-}
-
-VendorObjects::Path VendorObjects::setting(const Path& volume, const std::string& id,
-                                           const std::string& raidLevel) {
-    const Path path = object("StorageSetting", "InstanceID", id,
-                             {{"ElementName", CimValue::string(raidLevel)}});
-    link("CIM_ElementSettingData", volume, path);
-    return path;
-}
-
-void VendorObjects::fromPool(const Path& volume, const Path& pool) {
-    link("CIM_AllocatedFromStoragePool", pool, volume);
-}
-
-VendorObjects::Path VendorObjects::port(const Path& system, const std::string& deviceId,
-                                        const std::string& name) {
-    const Path path = object("SASSATAPort", "DeviceID", deviceId,
-                             {{"ElementName", CimValue::string(name)},
-                              {"PortType", CimValue::uint16(94)},
-                              {"UsageRestriction", CimValue::uint16(2)},
-                              {"OperationalStatus", CimValue::uint16Array({2})}});
-    link("CIM_SystemDevice", system, path);
-    return path;
-}
-
-VendorObjects::Path VendorObjects::battery(const Path& system, const std::string& deviceId,
-                                           std::uint16_t batteryStatus) {
-    const Path path = object("Battery", "DeviceID", deviceId,
-                             {{"BatteryStatus", CimValue::uint16(batteryStatus)},
-                              {"OperationalStatus", CimValue::uint16Array({2})}});
-    link("CIM_SystemDevice", system, path);
-    return path;
+ObjectPath VendorObjects::fan(const VendorController& controller, const std::string& deviceID) {
+    return device(controller, "CIM_Fan", deviceID, {{"OperationalStatus", status(2)}});
 }
 
 }  // namespace plexortest

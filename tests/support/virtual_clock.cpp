@@ -9,40 +9,64 @@
 namespace plexortest {
 namespace {
 
-std::atomic<std::time_t> currentTime{1'000'000'000};
-std::mutex sleepsMutex;
-std::vector<VirtualClock::Sleep> recordedSleeps;  // guarded by sleepsMutex
+// Relaxed, so that reading the clock orders nothing between the threads under test.
+std::atomic<time_t> currentTime{0};
+std::mutex mutex;
+std::vector<Sleep> recorded;                  // guarded by mutex
+std::function<void(unsigned int)> sleepHook;  // guarded by mutex
+
+void sleepVirtually(unsigned int seconds) {
+    std::function<void(unsigned int)> hook;
+    {
+        std::lock_guard lock(mutex);
+        recorded.push_back({std::this_thread::get_id(), seconds});
+        hook = sleepHook;
+    }
+    if (hook) hook(seconds);
+    VirtualClock::advance(seconds);
+    std::this_thread::sleep_for(std::chrono::milliseconds(1));
+}
 
 }  // namespace
 
-void VirtualClock::set(std::time_t now) { currentTime = now; }
-std::time_t VirtualClock::now() { return currentTime; }
-void VirtualClock::advance(std::time_t seconds) { currentTime += seconds; }
-
-std::vector<VirtualClock::Sleep> VirtualClock::sleeps() {
-    std::lock_guard lock(sleepsMutex);
-    return recordedSleeps;
+void VirtualClock::set(time_t now) {
+    currentTime.store(now, std::memory_order_relaxed);
 }
 
-void VirtualClock::clearSleeps() {
-    std::lock_guard lock(sleepsMutex);
-    recordedSleeps.clear();
+time_t VirtualClock::now() {
+    return currentTime.load(std::memory_order_relaxed);
+}
+
+void VirtualClock::advance(time_t seconds) {
+    currentTime.fetch_add(seconds, std::memory_order_relaxed);
+}
+
+std::vector<Sleep> VirtualClock::sleeps() {
+    std::lock_guard lock(mutex);
+    return recorded;
+}
+
+void VirtualClock::onSleep(std::function<void(unsigned int)> hook) {
+    std::lock_guard lock(mutex);
+    sleepHook = std::move(hook);
+}
+
+void VirtualClock::reset(time_t now) {
+    set(now);
+    std::lock_guard lock(mutex);
+    recorded.clear();
+    sleepHook = nullptr;
 }
 
 }  // namespace plexortest
 
-extern "C" std::time_t time(std::time_t* out) noexcept {
-    const std::time_t now = plexortest::VirtualClock::now();
+extern "C" time_t time(time_t* out) noexcept {
+    const time_t now = plexortest::VirtualClock::now();
     if (out != nullptr) *out = now;
     return now;
 }
 
 extern "C" unsigned int sleep(unsigned int seconds) {
-    {
-        std::lock_guard lock(plexortest::sleepsMutex);
-        plexortest::recordedSleeps.push_back({std::this_thread::get_id(), seconds});
-    }
-    plexortest::VirtualClock::advance(seconds);
-    std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    plexortest::sleepVirtually(seconds);
     return 0;
 }

@@ -1,27 +1,34 @@
-// The test program's own `time` and `sleep`, in front of the C library's.
+// The clock that the provider sees: `time` and `sleep` of the test executable.
 #pragma once
 
-#include <ctime>
+#include <time.h>
+
+#include <functional>
 #include <thread>
 #include <vector>
 
 namespace plexortest {
 
-/// A clock that only tests move. `sleep` moves it too, and really waits a millisecond so that other
-/// threads get on. Thread-safe.
+/// One call of sleep.
+struct Sleep {
+    std::thread::id thread;
+    unsigned int seconds;
+};
+
+/// Thread-safe. sleep(n) runs the hook, moves the clock by n, and really waits about a millisecond
+/// so that other threads get on.
 class VirtualClock {
 public:
-    static void set(std::time_t now);
-    static std::time_t now();
-    static void advance(std::time_t seconds);
+    static void set(time_t now);
+    static time_t now();
+    static void advance(time_t seconds);
 
-    struct Sleep {
-        std::thread::id thread;
-        unsigned int seconds;
-    };
-    /// Every sleep since the last `clearSleeps`, in order.
+    /// Every sleep since the last `reset`, in order.
     static std::vector<Sleep> sleeps();
-    static void clearSleeps();
+    /// Called in each sleep on the sleeping thread, before the clock moves; empty for none.
+    static void onSleep(std::function<void(unsigned int seconds)> hook);
+    /// Back to `now`, without sleeps and without a hook.
+    static void reset(time_t now);
 };
 
 }  // namespace plexortest

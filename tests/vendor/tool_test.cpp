@@ -114,12 +114,11 @@ TEST_F(Tool, EnvironmentNamesTheLibrary) {
 TEST_F(Tool, ShowsADegradedArrayAsATree) {
     const Outcome outcome = show("degraded-array", "--library " PROVIDER);
     EXPECT_EQ(outcome.status, 0) << outcome.errors;
-    for (const char* text :
-         {"Controller C0 (RC-308)", "4.2.1 (Package); 23.9.0 (Fw)",
-          "RAID5 data Logical Volume 0 on controller C0", " - DEGRADED", "Drives (9)",
-          "Drive 32_3 on controller C0 Fw: GS0F - FAILED",
-          "Drive 32_7 on controller C0 Fw: GS0F - REBUILD", "- UNCONFIGURED BAD", "Ports (8)",
-          "battery low"})
+    for (const char* text : {"Controller C0 (RC-308)", "4.2.1 (Package); 23.9.0 (Fw)",
+                             "RAID5 data Logical Volume 0 on controller C0", " - DEGRADED",
+                             "Drives (9)", "Drive 32_3 on controller C0 Fw: GS0F - FAILED",
+                             "Drive 32_7 on controller C0 Fw: GS0F - REBUILD", "- UNCONFIGURED BAD",
+                             "Ports (8)", "battery low"})
         EXPECT_NE(outcome.output.find(text), std::string::npos) << text << "\n" << outcome.output;
 }
 

@@ -1,0 +1,88 @@
+// What the four updaters have in common: the answer, the stamp, the lock.
+#include "device_kinds.h"
+
+namespace plexortest {
+namespace {
+
+using testbed::CimValue;
+using testing::Each;
+
+template <class Kind>
+class DeviceUpdate : public KindTest<Kind> {};
+TYPED_TEST_SUITE(DeviceUpdate, DeviceKinds, KindNames);
+
+TYPED_TEST(DeviceUpdate, StampsItsOwnTimesOnly) {
+    ASSERT_EQ(this->buildIt(), 0);
+    const time_t built = this->record()->LastUpdateTime;
+    VirtualClock::advance(25);
+    CMPIInstance* fresh = this->instanceAt(this->path_);
+    EXPECT_EQ(this->update(TypeParam::update, this->record(), fresh), 0);
+    EXPECT_EQ(this->updateTime(), built + 25);
+    EXPECT_EQ(this->record()->LastUpdateTime, built);
+    EXPECT_THAT(this->otherTimes(), Each(0));
+    EXPECT_EQ(this->list()->Size, 1u);
+}
+
+TYPED_TEST(DeviceUpdate, IgnoresTheUpdateFlagAndTheTimeSinceTheLast) {
+    ASSERT_EQ(this->buildIt(), 0);
+    for (unsigned char enabled : {0, 1, 255}) {
+        this->record()->UpdateEnabled = enabled;
+        VirtualClock::advance(1);
+        EXPECT_EQ(this->update(TypeParam::update, this->record(), nullptr), 0);
+        EXPECT_EQ(this->updateTime(), VirtualClock::now());
+    }
+}
+
+TYPED_TEST(DeviceUpdate, StampsEvenWhenTheBrokerRefusesEverything) {
+    ASSERT_EQ(this->buildIt(), 0);
+    VirtualClock::advance(9);
+    for (testbed::Entry entry : {testbed::Entry::GetInstance, testbed::Entry::AssociatorNames})
+        this->faults().add(this->refusal(entry));
+    EXPECT_EQ(this->update(TypeParam::update, this->record(), nullptr), 0);
+    EXPECT_EQ(this->updateTime(), VirtualClock::now());
+}
+
+TYPED_TEST(DeviceUpdate, StampsUnderTheLock) {
+    ASSERT_EQ(this->buildIt(), 0);
+    const time_t built = this->updateTime();
+    VirtualClock::advance(5);
+    std::atomic<bool> begun = false;
+    this->whileLockIsTaken(
+        [&](const CMPIContext* context) {
+            CMPIInstance* fresh = this->instanceAt(this->path_);
+            begun = true;
+            EXPECT_EQ(TypeParam::update(&this->mi, context, this->ctrl_, this->record(), fresh), 0);
+        },
+        [&] { return begun.load(); }, [&] { EXPECT_EQ(this->updateTime(), built); });
+    EXPECT_EQ(this->updateTime(), built + 5);
+}
+
+TYPED_TEST(DeviceUpdate, NeedsNoInterface) {
+    ASSERT_EQ(this->buildIt(), 0);
+    EXPECT_EQ(TypeParam::update(nullptr, this->ctx(), this->ctrl_, this->record(),
+                                this->instanceAt(this->path_)),
+              0);
+}
+
+// Those that fetch the instance when they are given none.
+
+template <class Kind>
+class DeviceUpdateFetch : public KindTest<Kind> {};
+using FetchingKinds = testing::Types<DiskKind, VolumeKind, BatteryKind>;
+TYPED_TEST_SUITE(DeviceUpdateFetch, FetchingKinds, KindNames);
+
+TYPED_TEST(DeviceUpdateFetch, LogsAFailureThatCameWithAnInstanceAndUsesTheInstance) {
+    ASSERT_EQ(this->buildIt(), 0);
+    this->repository.setProperty(this->path_, "OperationalStatus", CimValue::uint16Array({6}));
+    testbed::FaultRule rule = this->refusal(testbed::Entry::GetInstance);
+    rule.keepResult = true;
+    rule.times = 1;
+    this->faults().add(rule);
+    ASSERT_EQ(this->update(TypeParam::update, this->record(), nullptr), 0);
+    EXPECT_TRUE(
+        logged(LOG_ERR, "GetInstance " + this->pathText() + " failed, status: rc 1, msg NULL"));
+    EXPECT_EQ(this->record()->OperationalStatus, 6);
+}
+
+}  // namespace
+}  // namespace plexortest

@@ -1,0 +1,74 @@
+// Splitting a client's key, with the outcome in one value.
+#pragma once
+
+#include <stdlib.h>
+
+#include <optional>
+#include <ostream>
+#include <string>
+
+#include "PlexorProviderIfc.h"
+#include "keys_fake_path.h"
+#include "provider_fixture.h"
+
+namespace plexortest {
+
+/// What a retrieval function answered. No text where it stored nothing.
+struct SplitKey {
+    int rc = 0;
+    std::optional<std::string> controller;
+    std::optional<std::string> device;
+
+    bool operator==(const SplitKey&) const = default;
+};
+
+inline void PrintTo(const SplitKey& key, std::ostream* out) {
+    *out << "rc " << key.rc << ", controller " << key.controller.value_or("<not stored>")
+         << ", device " << key.device.value_or("<not stored>");
+}
+
+class KeysTest : public ProviderTest {
+protected:
+    /// Takes over what was stored in an out parameter, which held `untouched` before.
+    static std::optional<std::string> taken(char* stored, const char* untouched) {
+        if (stored == untouched) return std::nullopt;
+        std::string text = stored != nullptr ? stored : "<null>";
+        free(stored);
+        return text;
+    }
+
+    static SplitKey splitController(const CMPIObjectPath* path, const char* keyName = "Name",
+                                    const char* prefix = "tvxController") {
+        char untouched[] = "untouched";
+        char* controller = untouched;
+        SplitKey key;
+        key.rc = RetrieveDeviceID(path, keyName, prefix, &controller);
+        key.controller = taken(controller, untouched);
+        return key;
+    }
+
+    static SplitKey splitDevice(const CMPIObjectPath* path, const char* prefix) {
+        char untouched[] = "untouched";
+        char *controller = untouched, *device = untouched;
+        SplitKey key;
+        key.rc = RetrieveControllerAndDeviceIDs(path, prefix, &controller, &device);
+        key.controller = taken(controller, untouched);
+        key.device = taken(device, untouched);
+        return key;
+    }
+
+    /// A client's path with one key.
+    CMPIObjectPath* pathWith(const std::string& keyName, testbed::CimValue value) {
+        return broker.makePath({"root/cimv2", "Tovexa_Any", {{keyName, std::move(value)}}});
+    }
+    CMPIObjectPath* pathWith(const std::string& keyName, const std::string& text) {
+        return pathWith(keyName, testbed::CimValue::string(text));
+    }
+};
+
+/// Nothing stored.
+inline SplitKey refusedKey(int rc) {
+    return {rc, std::nullopt, std::nullopt};
+}
+
+}  // namespace plexortest

@@ -1,0 +1,65 @@
+// Values that a vendor should not give: each property reader has to live with them.
+#pragma once
+
+#include <optional>
+#include <string>
+#include <vector>
+
+#include "repository.h"
+
+namespace plexortest {
+
+struct OddValue {
+    std::string label;
+    std::optional<testbed::CimValue> value;  ///< none: the property is missing
+};
+
+/// In place of a number or truth value.
+inline std::vector<OddValue> oddNumbers() {
+    using testbed::CimValue;
+    return {{"missing", {}},
+            {"null of its type", CimValue::null(CMPI_uint16)},
+            {"null without type", CimValue::null(CMPI_null)},
+            {"text", CimValue::string("17")},
+            {"null text", CimValue::null(CMPI_string)},
+            {"array", CimValue::uint16Array({17})},
+            {"null array", CimValue::null(CMPI_uint16A)},
+            {"real", CimValue::real64(17)}};
+}
+
+/// In place of a text.
+inline std::vector<OddValue> oddTexts() {
+    using testbed::CimValue;
+    return {{"missing", {}},
+            {"null", CimValue::null(CMPI_string)},
+            {"null number", CimValue::null(CMPI_uint16)},
+            {"number", CimValue::uint32(17)},
+            {"large number", CimValue::uint64(0xDEAD'BEEF'DEAD'BEEF)},
+            {"truth value", CimValue::boolean(true)},
+            {"array of texts", CimValue::stringArray({"text"})}};
+}
+
+/// In place of an array of numbers.
+inline std::vector<OddValue> oddArrays() {
+    using testbed::CimValue;
+    return {{"missing", {}},
+            {"null array", CimValue::null(CMPI_uint16A)},
+            {"empty array", CimValue::array(CMPI_uint16, {})},
+            {"array with a null", CimValue::array(CMPI_uint16, {CimValue::null(CMPI_uint16)})},
+            {"array of texts", CimValue::stringArray({"17"})},
+            {"number", CimValue::uint16(17)},
+            {"large number", CimValue::uint64(0xDEAD'BEEF'DEAD'BEEF)},
+            {"text", CimValue::string("17")}};
+}
+
+/// Gives an object that value of a property.
+inline void give(testbed::Repository& repository, const testbed::ObjectPath& path,
+                 const std::string& property, const OddValue& odd) {
+    if (odd.value) {
+        repository.setProperty(path, property, *odd.value);
+    } else {
+        repository.eraseProperty(path, property);
+    }
+}
+
+}  // namespace plexortest

@@ -1,0 +1,86 @@
+// Broker objects of long-lived threads: after every item nothing but the records' clones is left.
+#include "workers_fixture.h"
+
+namespace plexortest {
+namespace {
+
+using testbed::Entry;
+
+class WorkersObjects : public WorkersTest {
+protected:
+    void SetUp() override {
+        WorkersTest::SetUp();
+        array_ = vendor_.controller("C0");
+        ctrl_ = attach(newController("C0"));
+        ctrl_->ControllerOp = clonedPath(array_.system);
+        pool_ = vendor_.pool(array_, "pool0");
+    }
+    /// `count` devices of each of the four kinds.
+    void addDevices(int count) {
+        for (int i = 0; i < count; i++) {
+            const std::string number = std::to_string(i);
+            vendor_.drive(array_, "D" + number, pool_);
+            vendor_.volume(array_, "V" + number, pool_);
+            vendor_.port(array_, "P" + number);
+            vendor_.battery(array_, "B" + number);
+        }
+    }
+    void buildInventory() {
+        ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
+        // A slow sanitizer needs its time here.
+        for (int i = 0; i < 20 && threadActivityDone() == 0; i++) {
+            comesTrue([] { return threadActivityDone() == 1; });
+        }
+        ASSERT_TRUE(workersComeToRest());
+    }
+    std::size_t liveOnWorkers() {
+        std::size_t live = 0;
+        for (const std::thread::id thread : threadsOf(Entry::AttachThread)) {
+            live += books().liveOnThread(thread);
+        }
+        return live;
+    }
+    std::size_t records() {
+        return ctrl_->DiskList->Size + ctrl_->VolumeList->Size + ctrl_->PortList->Size +
+               ctrl_->BatteryList->Size;
+    }
+
+    VendorObjects vendor_{repository};
+    VendorController array_;
+    testbed::ObjectPath pool_;
+    RaidController_t* ctrl_ = nullptr;
+};
+
+TEST_F(WorkersObjects, AThousandDevicesLeaveTheirClonesOnly) {
+    addDevices(250);
+    startWorkers();
+    CapturedSyslog::discard(true);
+    buildInventory();
+
+    ASSERT_EQ(records(), 1000u);
+    // Two for a drive (itself and its extent), one for each other device and for the pool.
+    EXPECT_EQ(liveOnWorkers(), 250u * 5 + 1);
+    EXPECT_EQ(books().liveClones(), 250u * 5 + 1 + 1) << "with the controller's path";
+    // The test's own context and those of two workers.
+    EXPECT_EQ(books().live(testbed::ObjectKind::Context), 3u);
+    CapturedSyslog::discard(false);
+}
+
+TEST_F(WorkersObjects, RefreshesDoNotPileUp) {
+    addDevices(5);
+    startWorkers();
+    buildInventory();
+    ASSERT_EQ(records(), 20u);
+    const std::size_t live = books().live();
+    for (int round = 0; round < 20; round++) {
+        VirtualClock::advance(20);
+        for (int action = 100; action <= 105; action++) {
+            ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, action), 0);
+        }
+        ASSERT_TRUE(workersComeToRest());
+        ASSERT_EQ(books().live(), live) << "round " << round;
+    }
+}
+
+}  // namespace
+}  // namespace plexortest

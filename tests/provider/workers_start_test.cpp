@@ -1,0 +1,155 @@
+// Starting the workers: the refresh interval, their contexts, what cannot be started.
+#include "workers_fixture.h"
+
+namespace plexortest {
+namespace {
+
+using testbed::Entry;
+using testbed::FaultRule;
+
+class WorkersStart : public WorkersTest {};
+
+TEST_F(WorkersStart, TwoWorkersAreStartedAndSaidSo) {
+    startWorkers();
+    EXPECT_TRUE(loggedOnce(LOG_DEBUG, "InitPlexorThreads: thread 0 created\n"));
+    EXPECT_TRUE(loggedOnce(LOG_DEBUG, "InitPlexorThreads: thread 1 created\n"));
+    EXPECT_EQ(CapturedSyslog::countContaining("created\n"), 2u);
+    EXPECT_TRUE(loggedOnce(LOG_DEBUG, "PlexorThread(0): no item to process, wait...\n"));
+    EXPECT_TRUE(loggedOnce(LOG_DEBUG, "PlexorThread(1): no item to process, wait...\n"));
+}
+
+TEST_F(WorkersStart, EachWorkerAttachesWithAContextPreparedHere) {
+    startWorkers();
+    const auto here = std::this_thread::get_id();
+    EXPECT_EQ(books().count(Entry::PrepareAttachThread), 2u);
+    EXPECT_EQ(threadsOf(Entry::PrepareAttachThread), std::set{here});
+    const auto attached = threadsOf(Entry::AttachThread);
+    EXPECT_EQ(attached.size(), 2u);
+    EXPECT_EQ(attached.count(here), 0u);
+    for (const auto& call : books().calls()) EXPECT_EQ(call.rc, CMPI_RC_OK);
+}
+
+TEST_F(WorkersStart, TheyAreJoinable) {
+    startWorkers();
+    int state = -1;
+    ASSERT_EQ(pthread_attr_getdetachstate(&PlexorThreadAttr, &state), 0);
+    EXPECT_EQ(state, PTHREAD_CREATE_JOINABLE);
+    EXPECT_FALSE(pthread_equal(PlexorThreads[0], PlexorThreads[1]));
+    for (const pthread_t thread : PlexorThreads) {
+        pthread_attr_t own;
+        ASSERT_EQ(pthread_getattr_np(thread, &own), 0);
+        ASSERT_EQ(pthread_attr_getdetachstate(&own, &state), 0);
+        EXPECT_EQ(state, PTHREAD_CREATE_JOINABLE);
+        pthread_attr_destroy(&own);
+    }
+}
+
+TEST_F(WorkersStart, BothWork) {
+    startWorkers();
+    Gate gate;
+    {
+        const GateOpener opener(gate);
+        for (int i = 0; i < 2; i++) {
+            ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
+        }
+        EXPECT_TRUE(gate.awaitArrivals(2));
+    }
+    ASSERT_TRUE(workersComeToRest());
+    EXPECT_EQ(tasks_.ended(), 2);
+}
+
+TEST_F(WorkersStart, NothingIsDoneYet) {
+    startWorkers();
+    EXPECT_EQ(threadActivityDone(), 0u);
+    EXPECT_EQ(activeThreads(), 0u);
+    EXPECT_EQ(TerminateThread, 0u);
+}
+
+TEST_F(WorkersStart, WithoutAContextThereIsNoWorker) {
+    FaultRule none;
+    none.entry = Entry::PrepareAttachThread;
+    none.nullResult = true;
+    none.times = 1;
+    faults().add(none);
+    startWorkers(1);
+    tasks_.queue([](CMPIContext*, void*) {});
+    ASSERT_TRUE(workersComeToRest());
+    EXPECT_EQ(tasks_.ended(), 1);
+    EXPECT_EQ(books().count(Entry::AttachThread), 1u);
+    EXPECT_EQ(CapturedSyslog::countContaining("PlexorThread(0)"), 0u);
+}
+
+TEST_F(WorkersStart, WithoutMemoryThereIsNoWorker) {
+    {
+        const auto fault = FailAllocation::nth(1);
+        startWorkers(1);
+        EXPECT_EQ(fault.failures(), 1u);
+    }
+    tasks_.queue([](CMPIContext*, void*) {});
+    ASSERT_TRUE(workersComeToRest());
+    EXPECT_EQ(tasks_.ended(), 1);
+    EXPECT_EQ(books().count(Entry::AttachThread), 1u);
+}
+
+TEST_F(WorkersStart, StoppingNoWorkerIsHarmless) {
+    FaultRule none;
+    none.entry = Entry::PrepareAttachThread;
+    none.nullResult = true;
+    faults().add(none);
+    startWorkers(0);
+    stopWorkers();
+    EXPECT_EQ(books().count(Entry::AttachThread), 0u);
+    EXPECT_EQ(exitLines(), 0u);
+}
+
+TEST_F(WorkersStart, AtMostOneRefreshOfAClassPerInterval) {
+    setPollingOption("45");
+    VendorObjects vendor(repository);
+    RaidController_t* const ctrl = attach(newController("C0"));
+    ctrl->ControllerOp = clonedPath(vendor.controller("C0").system);
+    startWorkers();
+    setThreadActivityDone(1);
+
+    std::vector<time_t> refreshes;
+    for (int second = 0; second < 100; second++) {
+        ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
+        ASSERT_TRUE(workersComeToRest());
+        if (associatorQueries().size() > refreshes.size()) refreshes.push_back(second);
+        VirtualClock::advance(1);
+    }
+    EXPECT_EQ(refreshes, (std::vector<time_t>{0, 45, 90}));
+}
+
+struct Interval {
+    const char* name;
+    const char* option;  ///< null: none is set
+    time_t seconds;
+};
+
+class WorkersInterval : public WorkersTest, public ::testing::WithParamInterface<Interval> {};
+
+TEST_P(WorkersInterval, IsTakenOverAndLogged) {
+    if (GetParam().option != nullptr) {
+        setPollingOption(GetParam().option);
+    } else {
+        setenv("PLEXOR_HOSTCONFIG_FILE", "/nonexistent/hostconfig", 1);
+    }
+    StateUpdateInterval = 99;
+    startWorkers();
+    EXPECT_EQ(StateUpdateInterval, GetParam().seconds);
+    EXPECT_TRUE(loggedOnce(LOG_ERR, formatted("InitPlexorThreads: Sample interval was set to "
+                                              "%ld secs\n",
+                                              static_cast<long>(GetParam().seconds))));
+}
+
+INSTANTIATE_TEST_SUITE_P(
+    Workers, WorkersInterval,
+    ::testing::Values(Interval{"zero", "0", 20}, Interval{"negative", "-1", 20},
+                      Interval{"lowest", "-2147483648", 20}, Interval{"one", "1", 1},
+                      Interval{"nineteen", "19", 19}, Interval{"fortyfive", "45", 45},
+                      Interval{"standard", "default", 20}, Interval{"text", "often", 20},
+                      Interval{"missing", nullptr, 20}),
+    [](const auto& test) { return std::string(test.param.name); });
+
+}  // namespace
+}  // namespace plexortest

@@ -1,0 +1,126 @@
+#!/usr/bin/env bash
+# Registers with each kind of manager below a scratch root, again, and takes it back.
+#
+#   register_test.sh SOURCE_TREE
+set -euo pipefail
+
+tree=$1
+scratch=$(mktemp -d)
+trap 'rm -rf "$scratch"' EXIT
+failures=0
+root="" said="" status=0
+
+fail() {
+    echo "FAIL: $1"
+    failures=$((failures + 1))
+}
+
+# The arguments of plexor-register; leaves what it said and its status.
+register() {
+    status=0
+    said=$("$tree/scripts/plexor-register" "$@" --root "$root" 2>&1) || status=$?
+}
+
+expect_status() { [ "$status" = "$1" ] || fail "$2: status $status, not $1: $said"; }
+expect_said() { grep -qF -- "$1" <<<"$said" || fail "$2: did not say \"$1\": $said"; }
+expect_not_said() { ! grep -qF -- "$1" <<<"$said" || fail "$2: said \"$1\": $said"; }
+expect_same() { cmp -s "$1" "$2" || fail "$2 is not $1"; }
+count_files() { find "$root" -type f | wc -l; }
+expect_files() { [ "$(count_files)" = "$1" ] || fail "$2: $(count_files) files, not $1"; }
+
+stage=var/lib/plexor-provider/stage
+mofs=$tree/cim/schema
+
+# SOURCE TARGET of the registration itself, below their folders.
+test_manager() {
+    local manager=$1 source=$2 target=$3
+    root=$scratch/$manager
+    mkdir "$root"
+
+    register --manager "$manager"
+    expect_status 0 "$manager, first"
+    expect_said "PlexorProvider registered ($manager)" "$manager, first"
+    expect_said "next, for a manager" "$manager, first"
+    expect_files 8 "$manager, first"
+    expect_same "$mofs/registration/$source" "$root/$stage/$target"
+    for file in "$mofs"/Tovexa_*.mof; do
+        expect_same "$file" "$root/$stage/mofs/root/cimv2/$(basename "$file")"
+    done
+
+    register --manager "$manager"
+    expect_status 0 "$manager, again"
+    expect_said "was registered already" "$manager, again"
+    expect_not_said "written" "$manager, again"
+    expect_not_said "next," "$manager, again"
+
+    echo "spoilt" >"$root/$stage/$target"
+    register --manager "$manager"
+    expect_said "written $root/$stage/$target" "$manager, spoilt"
+    expect_same "$mofs/registration/$source" "$root/$stage/$target"
+
+    touch "$root/$stage/mofs/root/cimv2/Other.mof"
+    register --manager "$manager" --remove
+    expect_status 0 "$manager, remove"
+    expect_said "PlexorProvider removed" "$manager, remove"
+    expect_files 1 "$manager, remove (another's file stays)"
+    rm "$root/$stage/mofs/root/cimv2/Other.mof"
+
+    register --manager "$manager" --remove
+    expect_status 0 "$manager, remove again"
+    expect_said "was not registered" "$manager, remove again"
+    expect_not_said "next," "$manager, remove again"
+}
+
+test_two_managers_share_the_classes() {
+    root=$scratch/two
+    mkdir "$root"
+    register --manager section
+    register --manager module
+    register --manager section --remove
+    expect_said "in use by another registration" "two managers"
+    expect_files 8 "two managers, one removed"
+    register --manager module --remove
+    expect_files 0 "two managers, both removed"
+}
+
+test_chosen_places() {
+    root=$scratch/chosen
+    mkdir "$root"
+    register --manager section --stage /srv/cim/stage --service cimd
+    expect_said "systemctl try-restart cimd" "chosen places"
+    [ -e "$root/srv/cim/stage/regs/PlexorProvider.reg" ] || fail "chosen places: no registration"
+    register --manager module --stage /srv/cim/stage
+    expect_said "cimmof -n root/interop" "chosen places, module"
+    register --manager module --stage /srv/cim/stage --remove
+    expect_said "cimprovider -r -m PlexorProviderModule" "chosen places, module"
+}
+
+test_refusals() {
+    root=$scratch/refused
+    mkdir "$root"
+    register
+    expect_status 2 "no manager"
+    register --manager carrot
+    expect_status 2 "unknown manager"
+    expect_said "unknown manager carrot" "unknown manager"
+    register --manager section --carrot
+    expect_status 2 "unknown argument"
+    PLEXOR_SHARE=$scratch register --manager section
+    expect_status 1 "no class files"
+    expect_files 0 "refusals"
+    # A file stands where the stage's directory should be.
+    touch "$root/var"
+    register --manager section
+    expect_status 1 "stage cannot be made"
+    expect_not_said "registered (section)" "stage cannot be made"
+}
+
+test_manager section PlexorProvider.section regs/PlexorProvider.reg
+test_manager module PlexorProviderModule.mof mofs/root/interop/PlexorProviderModule.mof
+test_manager plain PlexorProvider.plain regs/PlexorProvider.plain
+test_two_managers_share_the_classes
+test_chosen_places
+test_refusals
+
+[ $failures = 0 ] || exit 1
+echo "register: fine"
