@@ -9,9 +9,9 @@ namespace {
 using plexortest::Allocator;
 using plexortest::CapturedSyslog;
 using plexortest::FailAllocation;
-using plexortest::FakePath;
 using plexortest::LogLine;
 using plexortest::refusedKey;
+using plexortest::ScriptedPath;
 using plexortest::SplitKey;
 
 using Lines = std::vector<LogLine>;
@@ -32,7 +32,7 @@ TEST_F(KeysControllerSplitTest, ReadsTheKeyAndPrefixItIsGiven) {
 }
 
 TEST_F(KeysControllerSplitTest, AsksForThatOneKey) {
-    FakePath path;
+    ScriptedPath path;
     path.answerStatus = CMPI_RC_ERR_NOT_FOUND;
     splitController(path.handle(), "InstanceID", "tovexa:ControllerSoftware");
     EXPECT_EQ(path.asked, (std::vector<std::string>{"InstanceID"}));
@@ -58,7 +58,7 @@ TEST_F(KeysControllerSplitTest, MissingKeyIsLoggedWithKeyAndPath) {
 }
 
 TEST_F(KeysControllerSplitTest, EveryStatusButOkIsAMissingKey) {
-    FakePath path;
+    ScriptedPath path;
     static char text[] = "tvxControllerC0";
     path.answer.type = CMPI_chars;
     path.answer.value.chars = text;
@@ -74,7 +74,7 @@ TEST_F(KeysControllerSplitTest, EveryStatusButOkIsAMissingKey) {
 }
 
 TEST_F(KeysControllerSplitTest, PathWithoutTextIsLoggedAsNull) {
-    FakePath path;
+    ScriptedPath path;
     path.answerStatus = CMPI_RC_ERR_NOT_FOUND;
     path.text = plexortest::FakeString(nullptr);
     EXPECT_EQ(splitController(path.handle()), refusedKey(-3));

@@ -10,9 +10,9 @@ namespace {
 
 using plexortest::CapturedSyslog;
 using plexortest::FailAllocation;
-using plexortest::FakePath;
 using plexortest::LogLine;
 using plexortest::refusedKey;
+using plexortest::ScriptedPath;
 using plexortest::SplitKey;
 
 using Lines = std::vector<LogLine>;
@@ -38,7 +38,7 @@ TEST_F(KeysDeviceSplitTest, GivesControllerAndDeviceForEveryPrefix) {
 }
 
 TEST_F(KeysDeviceSplitTest, AsksForDeviceIdAlone) {
-    FakePath path;
+    ScriptedPath path;
     path.answerStatus = CMPI_RC_ERR_NOT_FOUND;
     splitDevice(path.handle(), "tvxPort");
     EXPECT_EQ(path.asked, (std::vector<std::string>{"DeviceID"}));
@@ -119,7 +119,7 @@ TEST_F(KeysDeviceSplitTest, MissingKeyIsLoggedWithThePath) {
 }
 
 TEST_F(KeysDeviceSplitTest, EveryStatusButOkIsAMissingKey) {
-    FakePath path;
+    ScriptedPath path;
     static char text[] = "tvxPort12_5";
     path.answer.type = CMPI_chars;
     path.answer.value.chars = text;

@@ -50,9 +50,9 @@ private:
     }
 };
 
-class FakePath : public CMPIObjectPath {
+class ScriptedPath : public CMPIObjectPath {
 public:
-    FakePath() {
+    ScriptedPath() {
         hdl = nullptr;
         ft = &table();
     }
@@ -67,8 +67,8 @@ public:
     FakeString text{"the path"};             ///< of toString
 
 private:
-    static FakePath& self(const CMPIObjectPath* path) {
-        return *static_cast<FakePath*>(const_cast<CMPIObjectPath*>(path));
+    static ScriptedPath& self(const CMPIObjectPath* path) {
+        return *static_cast<ScriptedPath*>(const_cast<CMPIObjectPath*>(path));
     }
     static CMPIStatus addKey(const CMPIObjectPath* path, const char* name, const CMPIValue* value,
                              CMPIType type) {

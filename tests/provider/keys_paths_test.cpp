@@ -13,8 +13,8 @@ using plexortest::AddedKey;
 using plexortest::Allocator;
 using plexortest::CapturedSyslog;
 using plexortest::FailAllocation;
-using plexortest::FakePath;
 using plexortest::LogLine;
+using plexortest::ScriptedPath;
 
 using Keys = std::vector<AddedKey>;
 using Lines = std::vector<LogLine>;
@@ -36,7 +36,7 @@ protected:
 
     std::unique_ptr<RaidController_t, decltype(&FreeController)> controller{nullptr,
                                                                             FreeController};
-    FakePath path;
+    ScriptedPath path;
 };
 
 TEST_F(KeysPathsTest, ControllerHasCreationClassNameAndName) {

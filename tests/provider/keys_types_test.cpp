@@ -8,10 +8,10 @@
 namespace {
 
 using plexortest::CapturedSyslog;
-using plexortest::FakePath;
 using plexortest::FakeString;
 using plexortest::LogLine;
 using plexortest::refusedKey;
+using plexortest::ScriptedPath;
 using plexortest::SplitKey;
 using testbed::CimValue;
 
@@ -45,7 +45,7 @@ protected:
     }
     /// Both functions refuse the key and say nothing.
     void expectSilentRefusal(const CMPIData& data) {
-        FakePath path;
+        ScriptedPath path;
         path.answer = data;
         EXPECT_EQ(splitController(path.handle()), refusedKey(-3));
         EXPECT_EQ(splitDevice(path.handle(), "tvxPort"), refusedKey(-3));
@@ -90,7 +90,7 @@ TEST_F(KeysTypesTest, StringObjectWithoutTextIsRefused) {
 TEST_F(KeysTypesTest, StringObjectsAndCharactersAreTexts) {
     FakeString string("tvxPort12_5");
     static char chars[] = "tvxPort12_5";
-    FakePath path;
+    ScriptedPath path;
     path.answer = wildData(CMPI_string, CMPI_keyValue);
     path.answer.value.string = &string;
     EXPECT_EQ(splitDevice(path.handle(), "tvxPort"), (SplitKey{0, "12", "5"}));
