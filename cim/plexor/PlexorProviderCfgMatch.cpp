@@ -63,7 +63,13 @@ int CollectFresh(Matching& matching, const CMPIEnumeration* enums) {
     }
     size_t count = 0;
     while (CMPIInstance* inst = NextInstance(enums)) {
-        if (!MakeRoom(matching.fresh, count, capacity)) break;
+        if (!MakeRoom(matching.fresh, count, capacity)) {
+            // To go on without the rest would be to take devices for gone that are there.
+            free(matching.fresh);
+            matching.fresh = nullptr;
+            syslog(LOG_ERR, "%s, failed to allocate memory for enum\n", kCaller);
+            return RESULT_NO_MEMORY;
+        }
         CMPIObjectPath* op = InstancePath(inst);
         matching.fresh[count] = {op, inst};
         syslog(LOG_DEBUG, "OP %p added to opArr[%d]\n", static_cast<void*>(op),

@@ -17,7 +17,7 @@ struct Kind {
     List_t* RaidController_t::*list;
     void* (*make)(const char* id);
     void (*release)(void* device);
-    std::vector<std::string> said;  ///< lines after the removal from the list, for the id "X0"
+    std::vector<LogLine> said;  ///< lines after the removal from the list, for the id "X0"
     bool releasedUnderLock;
 };
 
@@ -31,42 +31,44 @@ const Kind kKinds[] = {
      &RaidController_t::VolumeList,
      [](const char* id) -> void* { return newVolume(id, "P0"); },
      FreeVolume,
-     {"Volume Name X0 (Volume X0) deleted\n"},
+     {{LOG_DEBUG, "Volume Name X0 (Volume X0) deleted\n"}},
      false},
     {"Disk",
      DeleteDisk,
      &RaidController_t::DiskList,
      [](const char* id) -> void* { return newDisk(id); },
      FreeDisk,
-     {"Disk X0 removed from controller C0(Model C0)\n", "Disk X0 deleted\n"},
+     {{LOG_INFO, "Disk X0 removed from controller C0(Model C0)\n"},
+      {LOG_DEBUG, "Disk X0 deleted\n"}},
      true},
     {"Port",
      DeletePort,
      &RaidController_t::PortList,
      [](const char* id) -> void* { return newPort(id); },
      FreePort,
-     {"Port X0 removed from controller C0(Model C0)\n", "Port X0 deleted\n"},
+     {{LOG_INFO, "Port X0 removed from controller C0(Model C0)\n"},
+      {LOG_DEBUG, "Port X0 deleted\n"}},
      false},
     {"Battery",
      DeleteBattery,
      &RaidController_t::BatteryList,
      [](const char* id) -> void* { return newBattery(id); },
      FreeBattery,
-     {"Battery X0 deleted\n"},
+     {{LOG_DEBUG, "Battery X0 deleted\n"}},
      false},
     {"Chassis",
      DeleteChassis,
      &RaidController_t::ChassisList,
      [](const char* id) -> void* { return newChassis(id); },
      FreeChassis,
-     {"Chassis X0 deleted\n"},
+     {{LOG_DEBUG, "Chassis X0 deleted\n"}},
      false},
     {"Pool",
      DeletePool,
      &RaidController_t::PoolList,
      [](const char* id) -> void* { return newPool(id); },
      FreePool,
-     {"Pool Pool X0 deleted\n"},
+     {{LOG_DEBUG, "Pool Pool X0 deleted\n"}},
      false},
 };
 
@@ -89,15 +91,15 @@ protected:
         pthread_mutex_unlock(&ctrl->CtrlMutex);
         return false;
     }
-    /// The texts of all lines that are not those of the list's own functions.
-    static std::vector<std::string> said() {
-        std::vector<std::string> texts;
+    /// All lines that are not those of the list's own functions.
+    static std::vector<LogLine> said() {
+        std::vector<LogLine> lines;
         for (const LogLine& line : CapturedSyslog::lines()) {
             const bool ofAList = line.text.find("list") != std::string::npos ||
                                  line.text.find("List") != std::string::npos;
-            if (!ofAList) texts.push_back(line.text);
+            if (!ofAList) lines.push_back(line);
         }
-        return texts;
+        return lines;
     }
 
     RaidController_t* ctrl = nullptr;
@@ -119,7 +121,7 @@ TEST_P(RecordDelete, TakesTheRecordOutAndReleasesIt) {
                                                      static_cast<void*>(list()), device)},
                                {LOG_DEBUG, formatted("Data %p removed from list %p, size 2\n",
                                                      device, static_cast<void*>(list()))},
-                               {LOG_DEBUG, GetParam().said.back()}}));
+                               GetParam().said.back()}));
 }
 
 TEST_P(RecordDelete, RecordThatIsNotInTheListStays) {
@@ -127,11 +129,11 @@ TEST_P(RecordDelete, RecordThatIsNotInTheListStays) {
     void* device = GetParam().make("X0");
     EXPECT_EQ(remove(device), -3);
     EXPECT_EQ(list()->Size, 1u);
-    EXPECT_EQ(said(), std::vector<std::string>{});
+    EXPECT_EQ(said(), std::vector<LogLine>{});
     EXPECT_FALSE(isLocked());
     CapturedSyslog::clear();
     GetParam().release(device);
-    EXPECT_EQ(said(), std::vector<std::string>{GetParam().said.back()});
+    EXPECT_EQ(said(), std::vector<LogLine>{GetParam().said.back()});
 }
 
 TEST_P(RecordDelete, NothingIsInAnEmptyList) {
@@ -183,10 +185,10 @@ TEST_P(RecordDelete, ReleaseIsUnderTheMutexForDisksOnly) {
     void* device = add("X0");
     int lines = 0;
     CapturedSyslog::onLine([&](const LogLine& line) {
-        for (const std::string& text : GetParam().said) {
-            if (line.text != text) continue;
+        for (const LogLine& wanted : GetParam().said) {
+            if (line != wanted) continue;
             lines++;
-            EXPECT_EQ(isLocked(), GetParam().releasedUnderLock) << text;
+            EXPECT_EQ(isLocked(), GetParam().releasedUnderLock) << line.text;
         }
     });
     EXPECT_EQ(remove(device), 0);
