@@ -37,7 +37,9 @@ protected:
     }
     void fillQueue() {
         for (int i = 0; i < 20; i++) {
-            ASSERT_EQ(PutItem(&__FIFO, zeroed<Thread_Args_t>()), 0);
+            auto* item = zeroed<Thread_Args_t>();
+            item->Func = [](CMPIContext*, void* args) { free(args); };
+            ASSERT_EQ(PutItem(&__FIFO, item), 0);
         }
     }
 

@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "PlexorProvider.h"
+#include "captured_syslog.h"
 
 namespace plexortest {
 
@@ -44,10 +45,10 @@ inline PropertyCall uint64Row(const char* name, unsigned long long value) {
     return {name, CMPI_uint64, std::to_string(value)};
 }
 inline PropertyCall uint16ArrayRow(const char* name, unsigned value) {
-    return {name, CMPI_uint16A, "uint16[1]{0:uint16 " + std::to_string(value) + "}"};
+    return {name, CMPI_uint16A, formatted("uint16[1]{0:uint16 %u}", value)};
 }
 inline PropertyCall charsArrayRow(const char* name, const std::string& text) {
-    return {name, CMPI_charsA, "string[1]{0:chars " + text + "}"};
+    return {name, CMPI_charsA, formatted("string[1]{0:chars %s}", text.c_str())};
 }
 
 /// How a missing text shows in a row.
@@ -102,7 +103,7 @@ private:
             case CMPI_uint64:
                 return "uint64";
             default:
-                return "type " + std::to_string(type);
+                return formatted("type %u", static_cast<unsigned>(type));
         }
     }
     template <class Number>
@@ -128,7 +129,7 @@ private:
             case CMPI_charsA:
                 return value->array ? static_cast<NotedArray*>(value->array)->text : kNullText;
             default:
-                return "a value of " + typeText(type);
+                return formatted("a value of %s", typeText(type).c_str());
         }
     }
 
@@ -147,15 +148,15 @@ private:
         auto array = std::make_unique<NotedArray>();
         array->hdl = recorder;
         array->ft = &arrayTable();
-        array->text = typeText(type) + "[" + std::to_string(count) + "]";
+        array->text = formatted("%s[%u]", typeText(type).c_str(), static_cast<unsigned>(count));
         recorder->arrays_.push_back(std::move(array));
         return recorder->arrays_.back().get();
     }
     static CMPIStatus setElementAt(const CMPIArray* array, CMPICount index, const CMPIValue* value,
                                    CMPIType type) {
         auto* noted = static_cast<NotedArray*>(const_cast<CMPIArray*>(array));
-        noted->text +=
-            "{" + std::to_string(index) + ":" + typeText(type) + " " + valueText(value, type) + "}";
+        noted->text += formatted("{%u:%s %s}", static_cast<unsigned>(index), typeText(type).c_str(),
+                                 valueText(value, type).c_str());
         return {CMPI_RC_ERR_FAILED, nullptr};
     }
     template <class Handle>

@@ -143,6 +143,7 @@ TEST_F(WorkersUnload, AStuckWorkersRecordsAreGivenUpNotReleased) {
     faults().add(stuck);
     ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
     ASSERT_TRUE(gate.awaitArrivals(1));
+    List_Entry_t* const givenUp = RaidControllerList->Head;
     {
         const HurriedWaits hurry;
         EXPECT_EQ(unload(), CMPI_RC_OK);
@@ -162,6 +163,7 @@ TEST_F(WorkersUnload, AStuckWorkersRecordsAreGivenUpNotReleased) {
     CleanupPlexorThreads();
     EXPECT_EQ(exitLines(), 2u);
     FreeController(ctrl_);
+    free(givenUp);
 }
 
 }  // namespace
