@@ -18,18 +18,24 @@
 
 namespace testbed {
 
+/// What a schema says about a class or a property, in the schema's order.
+using Qualifiers = std::vector<NamedValue>;
+
 struct PropertyDefinition {
     std::string name;
     CMPIType type = CMPI_null;
     bool isKey = false;
     std::string originClass;  ///< class that introduced the property
     CimValue defaultValue;    ///< null when there is none
+    Qualifiers qualifiers;    ///< without Key, which isKey tells
 };
 
 struct ClassDefinition {
     std::string name;
     std::string superclass;                      ///< empty for a root class
     std::vector<PropertyDefinition> properties;  ///< own properties only, not inherited ones
+    Qualifiers qualifiers;
+    bool isAssociation = false;
 };
 
 /// One end of an association instance.

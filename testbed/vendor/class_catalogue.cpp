@@ -1,5 +1,6 @@
 #include "class_catalogue.h"
 
+#include <algorithm>
 #include <stdexcept>
 
 namespace testbed {
@@ -12,16 +13,27 @@ std::string_view superclassOf(std::string_view cimClass) {
     return {};
 }
 
+/// True for the classes with roles and for the abstract associations above them, which have none.
+bool isAssociation(std::string_view cimClass) {
+    const auto associations = catalogueAssociations();
+    return std::any_of(associations.begin(), associations.end(), [&](const AssociationRoles& row) {
+        for (std::string_view name = row.className; !name.empty(); name = superclassOf(name))
+            if (name == cimClass) return true;
+        return false;
+    });
+}
+
 std::vector<PropertyDefinition> propertiesOf(const std::string& cimClass) {
     std::vector<PropertyDefinition> properties;
     for (const CatalogueProperty& row : catalogueProperties()) {
         if (cimClass != row.className) continue;
-        properties.push_back({row.name, row.type, row.isKey, cimClass, CimValue::null(row.type)});
+        properties.push_back(
+            {row.name, row.type, row.isKey, cimClass, CimValue::null(row.type), {}});
     }
     for (const AssociationRoles& row : catalogueAssociations()) {
         if (cimClass != row.className) continue;
         for (const char* role : {row.leftRole, row.rightRole})
-            properties.push_back({role, CMPI_ref, true, cimClass, CimValue::null(CMPI_ref)});
+            properties.push_back({role, CMPI_ref, true, cimClass, CimValue::null(CMPI_ref), {}});
     }
     return properties;
 }
@@ -55,17 +67,29 @@ std::optional<CMPIType> typeByName(std::string_view name) {
     return std::nullopt;
 }
 
+void defineCimClasses(Repository& repository, std::string_view nameSpace) {
+    for (const CatalogueClass& row : catalogueClasses()) {
+        if (repository.hasClass(nameSpace, row.name)) continue;
+        repository.defineClass(
+            nameSpace,
+            {row.name, row.superclass, propertiesOf(row.name), {}, isAssociation(row.name)});
+    }
+}
+
 void defineClasses(Repository& repository, std::string_view nameSpace, const std::string& prefix) {
-    for (const CatalogueClass& row : catalogueClasses())
-        repository.defineClass(nameSpace, {row.name, row.superclass, propertiesOf(row.name)});
+    defineCimClasses(repository, nameSpace);
     for (const VendorClass& row : vendorClasses())
-        repository.defineClass(nameSpace, {prefix + "_" + row.suffix, row.cimClass, {}});
+        repository.defineClass(
+            nameSpace,
+            {prefix + "_" + row.suffix, row.cimClass, {}, {}, isAssociation(row.cimClass)});
 }
 
 void defineClassBelow(Repository& repository, std::string_view nameSpace,
                       const std::string& className, const std::string& superclass) {
     if (repository.hasClass(nameSpace, className)) return;
-    repository.defineClass(nameSpace, {className, superclass, {}});
+    const auto parent = repository.findClass(nameSpace, superclass);
+    repository.defineClass(nameSpace,
+                           {className, superclass, {}, {}, parent && parent->isAssociation});
 }
 
 }  // namespace testbed

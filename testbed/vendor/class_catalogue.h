@@ -52,6 +52,9 @@ std::optional<CMPIType> declaredType(std::string_view cimClass, std::string_view
 /// The CIM type of that name ("uint16", "string[]"), none for an unknown name.
 std::optional<CMPIType> typeByName(std::string_view name);
 
+/// Defines the CIM classes that a namespace lacks; those that it has are left alone.
+void defineCimClasses(Repository& repository, std::string_view nameSpace);
+
 /// Defines the CIM classes and the vendor's subclasses in a namespace.
 void defineClasses(Repository& repository, std::string_view nameSpace, const std::string& prefix);
 

@@ -48,11 +48,13 @@ TEST_F(DiskDelete, OtherMembersStay) {
 TEST_F(DiskDelete, SaysWhereTheDiskWasRemovedFrom) {
     addMember(pool, "D0");
     DeleteDisk(ctrl, attach(ctrl, newDisk("D0", "P0")));
-    std::vector<std::string> said;
+    std::vector<LogLine> said;
     for (const LogLine& line : CapturedSyslog::lines()) {
-        if (line.text.rfind("Disk D0", 0) == 0) said.push_back(line.text);
+        if (line.text.rfind("Disk D0", 0) == 0) said.push_back(line);
     }
-    EXPECT_EQ(said, (std::vector<std::string>{kFromController, kFromPool, "Disk D0 deleted\n"}));
+    EXPECT_EQ(said, (std::vector<LogLine>{{LOG_INFO, kFromController},
+                                          {LOG_INFO, kFromPool},
+                                          {LOG_DEBUG, "Disk D0 deleted\n"}}));
     EXPECT_TRUE(
         logged(LOG_DEBUG, formatted("FindStoragePoolByID: found pool %p with P0 in list %p\n",
                                     static_cast<void*>(pool), static_cast<void*>(ctrl->PoolList))));

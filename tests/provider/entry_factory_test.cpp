@@ -194,7 +194,7 @@ protected:
         EntryFactoryTest::SetUp();
         made = callFactory();
         ASSERT_TRUE(inventoryTaken());
-        ASSERT_TRUE(eventually([] {
+        ASSERT_TRUE(plexortest::soon([] {
             const WorkersHeld held;
             return ActiveThreads == 0;
         }));

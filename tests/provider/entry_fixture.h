@@ -26,6 +26,18 @@ public:
     WorkersHeld& operator=(const WorkersHeld&) = delete;
 };
 
+/// Really waits until the condition holds; false when it does not within a minute, which a machine
+/// under load may need.
+template <class Condition>
+bool soon(Condition condition) {
+    const auto limit = std::chrono::steady_clock::now() + std::chrono::minutes(1);
+    while (!condition()) {
+        if (std::chrono::steady_clock::now() > limit) return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+    return true;
+}
+
 /// Where both workers meet: proof that each has come as far as taking work.
 class WorkersMeet {
 public:
@@ -67,15 +79,6 @@ private:
         free(item);
         ++arrived();
         soon([] { return arrived() >= expected(); });
-    }
-    template <class Condition>
-    static bool soon(Condition condition) {
-        const auto limit = std::chrono::steady_clock::now() + std::chrono::seconds(5);
-        while (!condition()) {
-            if (std::chrono::steady_clock::now() > limit) return false;
-            std::this_thread::sleep_for(std::chrono::milliseconds(1));
-        }
-        return true;
     }
 };
 
@@ -131,7 +134,7 @@ protected:
 
     /// Waits until the initial inventory has been taken.
     static bool inventoryTaken() {
-        return eventually([] {
+        return soon([] {
             const WorkersHeld held;
             return ThreadActivityDone == 1;
         });

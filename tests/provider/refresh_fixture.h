@@ -13,6 +13,13 @@
 
 namespace plexortest {
 
+/// Whether workers flush through their context, where a fault rule can catch it.
+#if defined(PLEXOR_CONTEXT_FLUSH) && PLEXOR_CONTEXT_FLUSH
+inline constexpr bool kContextHasFlush = true;
+#else
+inline constexpr bool kContextHasFlush = false;
+#endif
+
 class RefreshTest : public ProviderTest {
 protected:
     static void clearLog() { CapturedSyslog::clear(); }

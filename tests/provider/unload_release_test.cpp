@@ -182,8 +182,8 @@ TEST_F(UnloadReleaseTest, WaitsForTheWorkThatIsRunning) {
         if (line.text.starts_with("Controller Model C0")) freed = true;
     });
     std::thread manager([&] { client.cleanup(true); });
-    EXPECT_TRUE(
-        eventually([] { return CapturedSyslog::count("PlexorProviderCleanup: ENTER...\n") == 1; }));
+    EXPECT_TRUE(plexortest::soon(
+        [] { return CapturedSyslog::count("PlexorProviderCleanup: ENTER...\n") == 1; }));
     std::this_thread::sleep_for(std::chrono::milliseconds(20));
     EXPECT_FALSE(freed);
 
@@ -191,6 +191,27 @@ TEST_F(UnloadReleaseTest, WaitsForTheWorkThatIsRunning) {
     manager.join();
     EXPECT_TRUE(freed);
     EXPECT_EQ(controllers(), 0u);
+    EXPECT_EQ(books().liveClones(), 0u);
+}
+
+// Workers that are so slow to begin that the call to stop comes before their first wait.
+class UnloadEarlyTest : public plexortest::EntryTest {};
+
+TEST_F(UnloadEarlyTest, WorkersThatBeginOnlyNowLeaveToo) {
+    presentVendor();
+    Gate gate;
+    testbed::FaultRule slow;
+    slow.entry = Entry::AttachThread;
+    slow.skip = 1;  // the factory's own
+    slow.hook = [&gate] { gate.pass(); };
+    faults().add(slow);
+    const GateOpener opener(gate);
+    callFactory();
+    ASSERT_TRUE(gate.awaitArrivals(2));
+    VirtualClock::onSleep([&gate](unsigned int) { gate.open(); });
+    EXPECT_EQ(PlexorProviderCleanup(&mi, ctx(), 1).rc, 0);
+    EXPECT_TRUE(plexortest::logged(LOG_DEBUG, "Thread 0 exiting...\n"));
+    EXPECT_TRUE(plexortest::logged(LOG_DEBUG, "Thread 1 exiting...\n"));
     EXPECT_EQ(books().liveClones(), 0u);
 }
 

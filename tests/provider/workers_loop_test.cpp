@@ -78,6 +78,7 @@ TEST_F(WorkersLoop, AnItemRunsWithoutTheMutexAndCounted) {
 }
 
 TEST_F(WorkersLoop, RunningIsTracedBeforeTheItemAndTheFlushComesAfterIt) {
+    if (!kContextHasFlush) GTEST_SKIP() << "no context entry to watch";
     std::vector<std::string> events;
     tasks_.put([&](CMPIContext*, void*) {
         const bool traced = timesLogged(LOG_DEBUG, "PlexorThread(7): running...\n") == 1;
