@@ -32,9 +32,11 @@ void SetInitialized(int value) {
     __atomic_store_n(&_ProviderInitialized, value, __ATOMIC_RELAXED);
 }
 
+/// Factory calls on several threads may be here at once.
 void WaitDebug() {
-    waitDebug = getenv("WAIT_PROC") != nullptr ? 1 : 0;
-    if (!waitDebug) {
+    const int wait = getenv("WAIT_PROC") != nullptr ? 1 : 0;
+    __atomic_store_n(&waitDebug, wait, __ATOMIC_RELAXED);
+    if (!wait) {
         syslog(LOG_DEBUG, "Current process:pid=%d, ppid=%d\n", getpid(), getppid());
         return;
     }
@@ -42,7 +44,7 @@ void WaitDebug() {
     do {
         sleep(1);
         syslog(LOG_DEBUG, "Waiting for hostdbgd attach:pid=%d, ppid=%d\n", getpid(), getppid());
-    } while (waitDebug);
+    } while (__atomic_load_n(&waitDebug, __ATOMIC_RELAXED));
 }
 
 /// Builds the inventory's controllers and sets the workers going. False when the host has no

@@ -13,8 +13,8 @@ void FlushContext(CMPIContext* ctx) {
 // does the same for the calling thread; elsewhere the weak reference stays null.
 extern "C" void tool_mm_flush(void) __attribute__((weak));
 
-void FlushContext(CMPIContext*) {
-    if (tool_mm_flush != nullptr) tool_mm_flush();
+void FlushContext(CMPIContext* ctx) {
+    if (ctx != nullptr && tool_mm_flush != nullptr) tool_mm_flush();
 }
 
 #endif

@@ -23,7 +23,9 @@ struct BrokerOptions {
     bool allProperties = false;
     /// One mutex around all up-calls of the process.
     bool serialQueries = false;
-    /// setProperty on a class that lacks the property, or with another type, is refused.
+    /// For classes that are known: setProperty is refused for a property that the class lacks (12)
+    /// and for another type than the declared one (13); a result does not take a path, or an
+    /// instance with a path, that lacks a key or has one of another type (4).
     bool strictProperties = false;
     /// attachThread fails, prepareAttachThread gives NULL, and the like are made with Faults.
 };

@@ -12,11 +12,12 @@ namespace testbed {
 
 namespace {
 
-/// A new instance: of a known class with the class's properties and their defaults.
+/// A new instance: of a known class with the class's properties, their defaults, and the keys.
 Instance startOf(const BrokerCore& core, const ObjectPath& path) {
     Instance instance{path, {}};
     for (const auto& property : core.repository.allProperties(path.nameSpace, path.className)) {
-        const CimValue& value = property.defaultValue;
+        const CimValue* key = path.findKey(property.name);
+        const CimValue& value = key != nullptr ? *key : property.defaultValue;
         instance.set(property.name, value.isNull ? CimValue::null(property.type) : value);
     }
     return instance;

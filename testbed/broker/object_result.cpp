@@ -1,11 +1,25 @@
 #include "object_result.h"
 
+#include <algorithm>
+
 #include "object_instance.h"
 #include "object_path.h"
 
 namespace testbed {
 
 namespace {
+
+/// False when the broker is strict and the path lacks a key of its class, or has it with another
+/// type.
+bool hasKeys(const BrokerCore& core, const ObjectPath& path) {
+    if (!core.options.strictProperties) return true;
+    const auto properties = core.repository.allProperties(path.nameSpace, path.className);
+    return std::all_of(properties.begin(), properties.end(), [&](const PropertyDefinition& known) {
+        const CimValue* key = path.findKey(known.name);
+        if (!known.isKey) return true;
+        return key != nullptr && (key->isNull || key->type == CimValue::null(known.type).type);
+    });
+}
 
 CMPIStatus returnData(const CMPIResult* result, const CMPIValue*, CMPIType) {
     return statusOn(result, Entry::OtherObjectCall, nullptr,
@@ -16,6 +30,7 @@ CMPIStatus returnInstance(const CMPIResult* result, const CMPIInstance* instance
     return statusOn(result, Entry::ResultReturnInstance, nullptr, [&](ResultObject& object) {
         const InstanceObject* returned = usable(instance, Entry::ResultReturnInstance);
         if (returned == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
+        if (!hasKeys(object.core(), returned->content().path)) return CMPI_RC_ERR_INVALID_PARAMETER;
         object.collected().instances.push_back(returned->content());
         return CMPI_RC_OK;
     });
@@ -25,6 +40,7 @@ CMPIStatus returnObjectPath(const CMPIResult* result, const CMPIObjectPath* path
     return statusOn(result, Entry::ResultReturnObjectPath, nullptr, [&](ResultObject& object) {
         const PathObject* returned = usable(path, Entry::ResultReturnObjectPath);
         if (returned == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
+        if (!hasKeys(object.core(), returned->content())) return CMPI_RC_ERR_INVALID_PARAMETER;
         object.collected().paths.push_back(returned->content());
         return CMPI_RC_OK;
     });

@@ -22,6 +22,7 @@ constexpr int kProviderFailed = 3;
 struct ShowOptions {
     std::string scenario;
     std::string library;
+    std::string schema;
     std::string provider = "PlexorProvider";
     std::string className;
     std::string nameSpace = "root/cimv2";
@@ -58,7 +59,8 @@ bool reportFailures(const Inventory& inventory) {
 int show(const ShowOptions& options) {
     const Scenario scenario = readScenario(options.scenario);
     directLog(options.log);
-    ProviderSession session(scenario, locateLibrary(options.library), options.provider);
+    ProviderSession session(scenario, locateLibrary(options.library), options.provider,
+                            options.schema, options.nameSpace);
     const bool complete =
         session.waitForInventory(std::chrono::seconds(options.timeoutSeconds), options.nameSpace);
     if (!complete)
@@ -85,6 +87,7 @@ void addShowCommand(CLI::App& app, int& status) {
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")
         ->capture_default_str();
+    command->add_option("--schema", options->schema, "directory of the provider's classes (MOF)");
     command->add_option("--class", options->className, "show this class only")
         ->check(CLI::IsMember(knownClasses()));
     command->add_option("--namespace", options->nameSpace, "namespace of the requests")

@@ -3,6 +3,7 @@
 #include <filesystem>
 
 #include "provider_library.h"
+#include "tool_directory.h"
 
 namespace testbed {
 namespace {
@@ -11,12 +12,6 @@ namespace fs = std::filesystem;
 
 constexpr const char* kLibraryName = "libPlexorProvider.so";
 constexpr const char* kDirectories[] = {".", BUILT_PROVIDER_DIR, INSTALLED_PROVIDER_DIR};
-
-fs::path toolDirectory() {
-    std::error_code error;
-    const fs::path tool = fs::read_symlink("/proc/self/exe", error);
-    return error ? fs::current_path() : tool.parent_path();
-}
 
 }  // namespace
 

@@ -4,6 +4,8 @@
 
 #include <thread>
 
+#include "schema_locator.h"
+#include "served_classes.h"
 #include "vendor.h"
 
 namespace testbed {
@@ -36,11 +38,13 @@ std::vector<std::string> allClasses() {
 }  // namespace
 
 ProviderSession::ProviderSession(const Scenario& scenario, const std::string& library,
-                                 const std::string& providerName)
+                                 const std::string& providerName, const std::string& schema,
+                                 const std::string& nameSpace)
     : ProviderSession(
           scenario.manager,
           [&](Broker& broker) {
               buildVendor(broker.repository(), scenario);
+              defineServedClasses(broker.repository(), nameSpace, locateSchema(schema));
               applyBehaviour(broker, scenario);
           },
           library, providerName) {}

@@ -14,11 +14,14 @@ namespace testbed {
 
 class ProviderSession {
 public:
-    /// Builds the vendor and loads the provider. Throws LoadError.
+    /// Builds the vendor, defines the provider's classes from the schema (the one that locateSchema
+    /// finds for `schema`) in the namespace of the requests, and loads the provider. Throws
+    /// LoadError, or another std::runtime_error for a schema that cannot be used.
     ProviderSession(const Scenario& scenario, const std::string& library,
-                    const std::string& providerName);
-    /// The same with a vendor of one's own: `prepare` puts it into the broker before the provider
-    /// is loaded.
+                    const std::string& providerName, const std::string& schema = "",
+                    const std::string& nameSpace = "root/cimv2");
+    /// The same with a vendor and classes of one's own: `prepare` puts them into the broker before
+    /// the provider is loaded.
     ProviderSession(const BrokerOptions& options, const std::function<void(Broker&)>& prepare,
                     const std::string& library, const std::string& providerName);
     /// Tells the provider that the manager stops, and unloads it.

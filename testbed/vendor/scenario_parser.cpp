@@ -128,13 +128,14 @@ LatencyRange readLatency(JsonReader& scenario) {
 
 BrokerOptions readManager(JsonReader& scenario) {
     BrokerOptions options;
+    options.strictProperties = true;
     const auto place = scenario.take("manager");
     if (!place) return options;
     JsonReader reader(*place);
     options.name = reader.text("name", options.name);
     options.allProperties = reader.flag("allProperties");
     options.serialQueries = reader.flag("serialQueries");
-    options.strictProperties = reader.flag("strictProperties");
+    options.strictProperties = reader.flag("strictProperties", true);
     reader.finish();
     return options;
 }
