@@ -47,6 +47,12 @@ Record* NewRecord() {
 /// Frees a work item of ProcessBuildLogicalDeviceInfo with the clones in it.
 void ReleaseDeviceItem(Thread_Args_t* item);
 
+/// Runs one queued item on the calling worker when it is the only one: where the other could not be
+/// started, nobody else would. False when there are two, or nothing is queued. Takes
+/// PlexorThreadMutex; the item runs without it, and without a flush, which would end what the
+/// caller itself has obtained.
+bool RunQueuedItemAlone(const CMPIContext* ctx);
+
 // Stopping the workers before the inventory is released.
 
 /// Takes back an earlier QuiesceWorkers; called before an inventory is begun.

@@ -81,11 +81,13 @@ Thread_Args_t* MakeItem(const CMPIInstanceMI* mi, RaidController_t* ctrl, const 
 }
 
 /// Offers the item until there is room for it.
-void Enqueue(Thread_Args_t* item, const CMPIObjectPath* op) {
+void Enqueue(const CMPIContext* ctx, Thread_Args_t* item, const CMPIObjectPath* op) {
     int rc = PutItem(&__FIFO, item);
     while (rc == RESULT_FIFO_FULL && !StopRequested()) {
-        syslog(LOG_ERR, "%s: FIFO full, waiting...\n", kCaller);
-        sleep(1);
+        if (!RunQueuedItemAlone(ctx)) {
+            syslog(LOG_ERR, "%s: FIFO full, waiting...\n", kCaller);
+            sleep(1);
+        }
         rc = PutItem(&__FIFO, item);
     }
     if (rc != RESULT_OK) ReleaseDeviceItem(item);
@@ -93,8 +95,8 @@ void Enqueue(Thread_Args_t* item, const CMPIObjectPath* op) {
     pthread_cond_broadcast(&PlexorThreadCond);
 }
 
-void QueueDevice(const CMPIInstanceMI* mi, RaidController_t* ctrl, const CMPIInstance* inst,
-                 ClassCache& cache) {
+void QueueDevice(const CMPIInstanceMI* mi, const CMPIContext* ctx, RaidController_t* ctrl,
+                 const CMPIInstance* inst, ClassCache& cache) {
     const CMPIObjectPath* op = InstancePath(inst);
     const char* className = ClassNameText(op);
     if (className == nullptr) return;
@@ -102,7 +104,7 @@ void QueueDevice(const CMPIInstanceMI* mi, RaidController_t* ctrl, const CMPIIns
     syslog(LOG_DEBUG, "%s: (%d)%s\n", kCaller, code, PathText(LOG_DEBUG, op));
     if (code == DEVICE_UNKNOWN) return;
     Thread_Args_t* item = MakeItem(mi, ctrl, op, inst, code);
-    if (item != nullptr) Enqueue(item, op);
+    if (item != nullptr) Enqueue(ctx, item, op);
 }
 
 bool WorkDone() {
@@ -112,8 +114,9 @@ bool WorkDone() {
 
 /// Waits until the queue is empty and the caller is the only active worker. No time limit, but the
 /// workers' stop ends it.
-void WaitUntilDone() {
+void WaitUntilDone(const CMPIContext* ctx) {
     while (!WorkDone() && !StopRequested()) {
+        if (RunQueuedItemAlone(ctx)) continue;
         syslog(LOG_DEBUG, "%s: FIFO not empty, waiting...\n", kCaller);
         sleep(1);
     }
@@ -130,9 +133,9 @@ int BuildLogicalDeviceInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
         QueryAssociators({kCaller, ctx, ctrl->ControllerOp, "CIM_SystemDevice", nullptr});
     while (const CMPIInstance* inst = NextInstance(devices)) {
         if (StopRequested()) break;
-        QueueDevice(mi, ctrl, inst, cache);
+        QueueDevice(mi, ctx, ctrl, inst, cache);
     }
-    WaitUntilDone();
+    WaitUntilDone(ctx);
     syslog(LOG_DEBUG, "%s, DONE...\n", __func__);
     syslog(LOG_DEBUG, "%s, exit...\n", __func__);
     return RESULT_OK;

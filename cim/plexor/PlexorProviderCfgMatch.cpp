@@ -45,30 +45,22 @@ bool MakeRoom(NewInfo_t*& entries, size_t count, size_t& capacity) {
     return true;
 }
 
-int CollectFresh(Matching& matching, const CMPIEnumeration* enums) {
-    CMPIArray* array = enums != nullptr ? enums->ft->toArray(enums, nullptr) : nullptr;
-    syslog(LOG_DEBUG, "arrPtr %p\n", static_cast<void*>(array));
-    if (array == nullptr) {
-        syslog(LOG_ERR, "%s, failed to get array from enum\n", kCaller);
-        return RESULT_NOTHING;
-    }
-    size_t capacity = array->ft->getSize(array, nullptr);
-    syslog(LOG_DEBUG, "Enum array size %d\n", static_cast<int>(capacity));
-    if (capacity != 0) {
-        matching.fresh = static_cast<NewInfo_t*>(calloc(capacity, sizeof(NewInfo_t)));
-        if (matching.fresh == nullptr) {
-            syslog(LOG_ERR, "%s, failed to allocate memory for enum\n", kCaller);
-            return RESULT_NO_MEMORY;
-        }
-    }
+/// Gives up: to go on without the rest would be to take devices for gone that are there.
+int GiveUp(Matching& matching, int rc) {
+    free(matching.fresh);
+    matching.fresh = nullptr;
+    matching.freshCount = matching.freshLeft = 0;
+    return rc;
+}
+
+/// Walks the enumeration into matching.fresh, which has room for `capacity` entries so far.
+int WalkFresh(Matching& matching, const CMPIEnumeration* enums, size_t capacity) {
     size_t count = 0;
-    while (CMPIInstance* inst = NextInstance(enums)) {
+    bool failed = false;
+    while (CMPIInstance* inst = NextInstance(enums, &failed)) {
         if (!MakeRoom(matching.fresh, count, capacity)) {
-            // To go on without the rest would be to take devices for gone that are there.
-            free(matching.fresh);
-            matching.fresh = nullptr;
             syslog(LOG_ERR, "%s, failed to allocate memory for enum\n", kCaller);
-            return RESULT_NO_MEMORY;
+            return GiveUp(matching, RESULT_NO_MEMORY);
         }
         CMPIObjectPath* op = InstancePath(inst);
         matching.fresh[count] = {op, inst};
@@ -77,7 +69,26 @@ int CollectFresh(Matching& matching, const CMPIEnumeration* enums) {
         count++;
     }
     matching.freshCount = matching.freshLeft = static_cast<int>(count);
-    return RESULT_OK;
+    return failed ? GiveUp(matching, RESULT_NOTHING) : RESULT_OK;
+}
+
+int CollectFresh(Matching& matching, const CMPIEnumeration* enums) {
+    CMPIArray* array = enums != nullptr ? enums->ft->toArray(enums, nullptr) : nullptr;
+    syslog(LOG_DEBUG, "arrPtr %p\n", static_cast<void*>(array));
+    if (array == nullptr) {
+        syslog(LOG_ERR, "%s, failed to get array from enum\n", kCaller);
+        return RESULT_NOTHING;
+    }
+    const size_t size = array->ft->getSize(array, nullptr);
+    syslog(LOG_DEBUG, "Enum array size %d\n", static_cast<int>(size));
+    if (size != 0) {
+        matching.fresh = static_cast<NewInfo_t*>(calloc(size, sizeof(NewInfo_t)));
+        if (matching.fresh == nullptr) {
+            syslog(LOG_ERR, "%s, failed to allocate memory for enum\n", kCaller);
+            return RESULT_NO_MEMORY;
+        }
+    }
+    return WalkFresh(matching, enums, size);
 }
 
 int CollectCached(Matching& matching, const List_t* list) {

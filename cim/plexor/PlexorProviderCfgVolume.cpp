@@ -97,6 +97,11 @@ int Build(RaidController_t* ctrl, const CMPIContext* ctx, const CMPIInstance* de
     volume->LastUpdateTime = time(nullptr);
     DumpVolume(volume);
     ReadPool(volume, ctx);
+    if (volume->FromPool == nullptr && StopRequested()) {
+        // The pool may not have been asked for.
+        FreeVolume(volume);
+        return RESULT_BAD_ARGUMENT;
+    }
 
     const int rc = Insert(ctrl, volume);
     // Only the block: the copies and the clone of a volume turned away here stay behind, on

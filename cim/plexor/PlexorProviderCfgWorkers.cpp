@@ -27,6 +27,7 @@ constexpr time_t kJoinLimitSeconds = 1;
 constexpr time_t kMissedSignalSeconds = 1;
 
 bool __Started[kThreadCount];  // workers to join; factory and cleanup only
+unsigned int __WorkerCount;    // workers that were started; relaxed atomic
 unsigned int __RunningItems;   // work functions running; guarded by PlexorThreadMutex
 unsigned int __StopRequested;  // written under PlexorThreadMutex, read as relaxed atomic
 pthread_cond_t __ItemEnded = PTHREAD_COND_INITIALIZER;  // with PlexorThreadMutex
@@ -40,6 +41,10 @@ timespec DeadlineIn(time_t seconds) {
 
 void SetStopRequested(unsigned int value) {
     __atomic_store_n(&__StopRequested, value, __ATOMIC_RELAXED);
+}
+
+void SetWorkerCount(unsigned int value) {
+    __atomic_store_n(&__WorkerCount, value, __ATOMIC_RELAXED);
 }
 
 /// Runs one item with PlexorThreadMutex released; locked again on return.
@@ -151,6 +156,16 @@ bool JoinWorkers() {
 
 }  // namespace
 
+bool RunQueuedItemAlone(const CMPIContext* ctx) {
+    if (__atomic_load_n(&__WorkerCount, __ATOMIC_RELAXED) != 1) return false;
+    MutexGuard lock(PlexorThreadMutex);
+    auto* item = StopRequested() ? nullptr : static_cast<Thread_Args_t*>(GetItem(&__FIFO));
+    lock.Unlock();
+    if (item == nullptr) return false;
+    if (item->Func != nullptr) item->Func(const_cast<CMPIContext*>(ctx), item);
+    return true;
+}
+
 bool StopRequested() {
     return __atomic_load_n(&__StopRequested, __ATOMIC_RELAXED) != 0;
 }
@@ -181,6 +196,7 @@ void InitPlexorThreads(const CMPIContext* ctx) {
     pthread_attr_init(&PlexorThreadAttr);
     pthread_attr_setdetachstate(&PlexorThreadAttr, PTHREAD_CREATE_JOINABLE);
     for (int i = 0; i < kThreadCount; i++) StartWorker(i, ctx);
+    SetWorkerCount(static_cast<unsigned int>(__Started[0]) + __Started[1]);
 }
 
 void* PlexorThread(void* args) {
@@ -247,6 +263,7 @@ void CleanupPlexorThreads() {
     pthread_cond_broadcast(&PlexorThreadCond);
     sleep(kExitSeconds);
     pthread_attr_destroy(&PlexorThreadAttr);
+    SetWorkerCount(0);
     if (!JoinWorkers()) PinLibrary();
     DiscardQueuedWork();
 }

@@ -3,6 +3,7 @@
 #include <unistd.h>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderIfc.h"
 #include "PlexorProviderLock.h"
 
 const CMPIBroker* Broker = nullptr;
@@ -26,7 +27,33 @@ namespace {
 
 /// One initialisation at a time. A manager calls the factory once for each class it serves, on
 /// several threads; a later call returns when the first has built the inventory, not before.
-pthread_mutex_t __InitMutex = PTHREAD_MUTEX_INITIALIZER;
+pthread_mutex_t __InitMutex = PTHREAD_ERRORCHECK_MUTEX_INITIALIZER_NP;
+int __Initializing = 0;  // 1 while the controllers are looked for; atomic
+
+constexpr time_t kTurnLimitSeconds = 30;
+
+/// The right to initialise, for a scope. A vendor that is asked for its controllers may itself ask
+/// the manager for computer systems, and so have the factory called before it answers: on the same
+/// thread such a call gets no turn, on another one none after a time limit.
+class InitTurn {
+public:
+    InitTurn() {
+        timespec deadline;
+        clock_gettime(CLOCK_REALTIME, &deadline);
+        deadline.tv_sec += kTurnLimitSeconds;
+        taken_ = pthread_mutex_timedlock(&__InitMutex, &deadline) == 0;
+    }
+    ~InitTurn() {
+        if (taken_) pthread_mutex_unlock(&__InitMutex);
+    }
+    InitTurn(const InitTurn&) = delete;
+    InitTurn& operator=(const InitTurn&) = delete;
+
+    bool Taken() const { return taken_; }
+
+private:
+    bool taken_;
+};
 
 void SetInitialized(int value) {
     __atomic_store_n(&_ProviderInitialized, value, __ATOMIC_RELAXED);
@@ -87,10 +114,12 @@ void InitializeAttached(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
 void PlexorInit(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
     syslog(LOG_DEBUG, "%s: ENTER...\n", __func__);
     WaitDebug();
-    MutexGuard lock(__InitMutex);
-    if (__atomic_load_n(&_ProviderInitialized, __ATOMIC_RELAXED)) return;
+    const InitTurn turn;
+    if (!turn.Taken() || __atomic_load_n(&_ProviderInitialized, __ATOMIC_RELAXED)) return;
     SetInitialized(1);
+    __atomic_store_n(&__Initializing, 1, __ATOMIC_RELEASE);
     InitializeAttached(mi, ctx);
+    __atomic_store_n(&__Initializing, 0, __ATOMIC_RELEASE);
     syslog(LOG_DEBUG, "%s: EXIT\n", __func__);
 }
 
@@ -103,6 +132,11 @@ void PlexorProviderInit(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
 constexpr CMPIStatus kNotSupported = {CMPI_RC_ERR_NOT_SUPPORTED, nullptr};
 
 }  // namespace
+
+const List_Entry_t* FirstController() {
+    if (__atomic_load_n(&__Initializing, __ATOMIC_ACQUIRE)) return nullptr;
+    return RaidControllerList->Head;
+}
 
 CMPIInstanceMI* PlexorProvider_Create_InstanceMI(const CMPIBroker* brkr, const CMPIContext* ctx,
                                                  CMPIStatus*) {

@@ -163,7 +163,7 @@ int ReturnDevices(const Request& request, RaidController_t* ctrl, const Wanted& 
 /// were.
 int ReturnWanted(const Request& request, const Wanted& wanted) {
     int found = 0;
-    const List_Entry_t* entry = RaidControllerList->Head;
+    const List_Entry_t* entry = FirstController();
     for (; entry != nullptr; entry = entry->Next) {
         auto* ctrl = static_cast<RaidController_t*>(entry->Data);
         if (!SameId(wanted.controllerId, ctrl->DeviceID)) continue;

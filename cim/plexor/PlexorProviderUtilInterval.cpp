@@ -1,6 +1,7 @@
 // The polling interval from the host's option store.
 #include <KerncfgAdvancedOption.h>
 #include <NodecfgAdvancedIntegerOption.h>
+#include <cxxabi.h>
 
 #include "PlexorProviderUtil.h"
 
@@ -21,6 +22,8 @@ int GetSampelInterval() {
         if (option->IsDefault()) return kDefaultIntervalSeconds;
         auto* integer = dynamic_cast<Nodecfg::Adv::AdvancedIntegerOption*>(option.get());
         return integer != nullptr ? integer->GetValue() : kDefaultIntervalSeconds;
+    } catch (const abi::__forced_unwind&) {
+        throw;  // the thread is being cancelled; that must not be stopped
     } catch (...) {
         // The option store is another component's: whatever it throws stays here.
         return kDefaultIntervalSeconds;

@@ -48,8 +48,6 @@ CMPIUint64 ScalarNumber(const CMPIData& data) {
     switch (data.type) {
         case CMPI_boolean:
             return data.value.boolean;
-        case CMPI_char16:
-            return data.value.char16;
         case CMPI_uint8:
             return data.value.uint8;
         case CMPI_uint16:
@@ -73,11 +71,13 @@ CMPIUint64 ScalarNumber(const CMPIData& data) {
 
 /// Takes the next element. False at the end, and when the enumeration cannot give it: asking such a
 /// one again might never end.
-bool NextElement(const CMPIEnumeration* enumeration, CMPIData& data) {
-    if (!HasNext(enumeration)) return false;
+bool NextElement(const CMPIEnumeration* enumeration, CMPIData& data, bool* failed = nullptr) {
+    if (enumeration == nullptr) return false;
     CMPIStatus status = {CMPI_RC_OK, nullptr};
-    data = enumeration->ft->getNext(enumeration, &status);
-    return status.rc == CMPI_RC_OK;
+    const bool more = enumeration->ft->hasNext(enumeration, &status) != 0;
+    if (more) data = enumeration->ft->getNext(enumeration, &status);
+    if (failed != nullptr) *failed = status.rc != CMPI_RC_OK;
+    return more && status.rc == CMPI_RC_OK;
 }
 
 /// Element 0 of an array property; a null value when there is no array.
@@ -167,9 +167,9 @@ bool HasNext(const CMPIEnumeration* enumeration) {
     return enumeration != nullptr && enumeration->ft->hasNext(enumeration, nullptr) != 0;
 }
 
-CMPIInstance* NextInstance(const CMPIEnumeration* enumeration) {
+CMPIInstance* NextInstance(const CMPIEnumeration* enumeration, bool* failed) {
     CMPIData data = NullData();
-    while (NextElement(enumeration, data)) {
+    while (NextElement(enumeration, data, failed)) {
         if (data.type == CMPI_instance && data.value.inst != nullptr) return data.value.inst;
     }
     return nullptr;

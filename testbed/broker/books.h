@@ -78,7 +78,10 @@ struct CallRecord {
     std::string className;  ///< class of that path
     std::optional<std::string> assocClass;
     std::optional<std::string> resultClass;
+    std::optional<std::string> role;
+    std::optional<std::string> resultRole;
     std::optional<std::string> name;  ///< property, key or class name argument
+    const void* context = nullptr;    ///< address of the context it was made with; may have ended
     bool hasPropertyList = false;
     std::thread::id thread;
     CMPIrc rc = CMPI_RC_OK;

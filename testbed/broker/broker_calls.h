@@ -42,6 +42,7 @@ Result answerUpCall(const CMPIBroker* broker, const CMPIContext* ctx, CallRecord
                     CMPIStatus* status, Truth&& truth) {
     BrokerCore& core = coreOf(broker);
     const bool admitted = admitUpCall(core, ctx, record.entry);
+    record.context = ctx;
     return answer<Result>(core, std::move(record), status, [&](CMPIStatus& outcome) {
         if (admitted) return truth(core, outcome);
         outcome.rc = CMPI_RC_ERR_INVALID_HANDLE;

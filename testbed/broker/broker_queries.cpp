@@ -125,6 +125,8 @@ CMPIEnumeration* walk(const CMPIBroker* broker, const CMPIContext* ctx,
     CallRecord record = describeCall(entry, path);
     record.assocClass = filter.assocClass;
     record.resultClass = filter.resultClass;
+    record.role = filter.role;
+    record.resultRole = filter.resultRole;
     record.hasPropertyList = properties != nullptr;
     return answerUpCall<CMPIEnumeration*>(
         broker, ctx, std::move(record), status,

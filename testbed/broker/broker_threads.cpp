@@ -56,7 +56,9 @@ CMPIrc detach(BrokerCore& core, const CMPIContext* ctx) {
 template <Entry entry, CMPIrc (*truth)(BrokerCore&, const CMPIContext*)>
 CMPIStatus attachment(const CMPIBroker* broker, const CMPIContext* ctx) {
     CMPIStatus status = statusOk;
-    answer<Nothing>(coreOf(broker), describeCall(entry), &status, [&](CMPIStatus& outcome) {
+    CallRecord record = describeCall(entry);
+    record.context = ctx;
+    answer<Nothing>(coreOf(broker), std::move(record), &status, [&](CMPIStatus& outcome) {
         outcome.rc = truth(coreOf(broker), ctx);
         return Nothing{};
     });

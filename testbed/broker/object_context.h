@@ -18,6 +18,7 @@ public:
     ContextObject(BrokerCore& core, std::vector<NamedValue> entries);
 
     const void* handle() const override { return static_cast<const CMPIContext*>(this); }
+    void describe(CallRecord& record) const override { record.context = handle(); }
     std::shared_ptr<ContextObject> copy() const;
 
     std::vector<NamedValue> entries() const;

@@ -25,16 +25,16 @@ struct PropertyDefinition {
     std::string name;
     CMPIType type = CMPI_null;
     bool isKey = false;
-    std::string originClass;  ///< class that introduced the property
-    CimValue defaultValue;    ///< null when there is none
-    Qualifiers qualifiers;    ///< without Key, which isKey tells
+    std::string originClass;     ///< class that introduced the property
+    CimValue defaultValue;       ///< null when there is none
+    Qualifiers qualifiers = {};  ///< without Key, which isKey tells
 };
 
 struct ClassDefinition {
     std::string name;
     std::string superclass;                      ///< empty for a root class
     std::vector<PropertyDefinition> properties;  ///< own properties only, not inherited ones
-    Qualifiers qualifiers;
+    Qualifiers qualifiers = {};
     bool isAssociation = false;
 };
 

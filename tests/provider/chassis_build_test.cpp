@@ -7,26 +7,27 @@ namespace {
 using testbed::Broker;
 using testbed::CimValue;
 using testing::ElementsAre;
-using testing::IsEmpty;
 
-class ChassisBuild : public EnclosureTest {};
+class ChassisBuild : public EnclosureTest {
+protected:
+    void SetUp() override {
+        EnclosureTest::SetUp();
+        path = vendor_.chassis(vendor, "C0_E");
+    }
+
+    Path path;
+};
 
 TEST_F(ChassisBuild, EveryFieldIsFilled) {
-    const Path path = vendor_.chassis(vendor, "C0_Enclosure2");
-    set(path, "OperationalStatus", CimValue::uint16Array({5, 2}));
-    VirtualClock::set(kStart + 9);
-    ASSERT_EQ(buildChassis(path), 0);
+    const Path second = vendor_.chassis(vendor, "C0_Enclosure2");
+    set(second, "OperationalStatus", CimValue::uint16Array({5, 2}));
+    ASSERT_EQ(buildChassis(second), 0);
     ASSERT_EQ(chassis().size(), 1u);
     const Chassis_t* record = chassis()[0];
-    EXPECT_EQ(Broker::toPath(record->ChassisOp), path);
+    EXPECT_EQ(Broker::toPath(record->ChassisOp), second);
     EXPECT_STREQ(record->Tag, "C0_Enclosure2");
     EXPECT_STREQ(record->InternalTag, "Enclosure2");
     EXPECT_EQ(record->OperationalStatus, 5);
-    EXPECT_EQ(record->LastUpdateTime, kStart + 9);
-    EXPECT_EQ(record->UpdateEnabled, 0);
-    EXPECT_EQ(ctrl->ChassisUpdateTime, kStart + 9);
-    EXPECT_EQ(ctrl->ControllerUpdateTime, 0);
-    EXPECT_EQ(ctrl->PoolUpdateTime, 0);
 }
 
 struct Tags {
@@ -69,31 +70,7 @@ INSTANTIATE_TEST_SUITE_P(All, ChassisInternalTag,
                                          Tags{"UnderscoreInControllerId", "C_", "C__1", "1"}),
                          [](const auto& param) { return param.param.name; });
 
-TEST_F(ChassisBuild, AsksTheBrokerNothing) {
-    ASSERT_EQ(buildChassis(vendor_.chassis(vendor, "C0_E")), 0);
-    EXPECT_THAT(books().calls(), IsEmpty());
-}
-
-TEST_F(ChassisBuild, RecordOwnsWhatItHolds) {
-    ASSERT_EQ(buildChassis(vendor_.chassis(vendor, "C0_E")), 0);
-    EXPECT_EQ(books().liveClones(), 2u);
-    broker.flushThread();
-    EXPECT_STREQ(chassis()[0]->Tag, "C0_E");
-    EXPECT_EQ(Broker::toPath(chassis()[0]->ChassisOp).findKey("Tag")->asString(), "C0_E");
-}
-
-TEST_F(ChassisBuild, AppendsWithoutLookingForDuplicates) {
-    const Path path = vendor_.chassis(vendor, "C0_E");
-    EXPECT_EQ(buildChassis(vendor_.chassis(vendor, "C0_A")), 0);
-    EXPECT_EQ(buildChassis(path), 0);
-    EXPECT_EQ(buildChassis(path), 0);
-    Texts tags;
-    for (const Chassis_t* record : chassis()) tags.push_back(record->Tag);
-    EXPECT_THAT(tags, ElementsAre("C0_A", "C0_E", "C0_E"));
-}
-
 TEST_F(ChassisBuild, Log) {
-    const Path path = vendor_.chassis(vendor, "C0_E");
     ASSERT_EQ(buildChassis(path), 0);
     EXPECT_THAT(
         inventoryLog(),
@@ -108,39 +85,29 @@ TEST_F(ChassisBuild, Log) {
 }
 
 TEST_F(ChassisBuild, AbsentInternalTagIsPrintedAsNull) {
-    const Path path = vendor_.chassis(vendor, "X1_E");
-    ASSERT_EQ(buildChassis(path), 0);
-    EXPECT_TRUE(logged(LOG_DEBUG, "\nChassisOp: " + path.text() +
+    const Path foreign = vendor_.chassis(vendor, "X1_E");
+    ASSERT_EQ(buildChassis(foreign), 0);
+    EXPECT_TRUE(logged(LOG_DEBUG, "\nChassisOp: " + foreign.text() +
                                       "\n\tTag               - X1_E"
                                       "\n\tInternalTag       - NULL"
                                       "\n\tOperationalStatus - 2\n"));
 }
 
-TEST_F(ChassisBuild, AppendsAndStampsUnderTheControllersMutex) {
-    const Path path = vendor_.chassis(vendor, "C0_E");
-    {
-        const HolderUntilLogged holder(ctrl->CtrlMutex, "\nChassisOp: ", [this] {
-            EXPECT_EQ(ctrl->ChassisList->Size, 0u);
-            EXPECT_EQ(ctrl->ChassisUpdateTime, 0);
-        });
-        EXPECT_EQ(buildChassis(path), 0);
-    }
-    EXPECT_EQ(chassis().size(), 1u);
-    EXPECT_EQ(ctrl->ChassisUpdateTime, kStart);
-    EXPECT_TRUE(isFree(ctrl->CtrlMutex));
+TEST_F(ChassisBuild, InternalTagThatCannotBeCopiedIsAbsent) {
+    const auto fault = FailAllocation::strdupOf("E");
+    EXPECT_EQ(buildChassis(path), 0);
+    EXPECT_TRUE(logged(LOG_WARNING, "strdup() failed to duplicate string E\n"));
+    ASSERT_EQ(chassis().size(), 1u);
+    EXPECT_STREQ(chassis()[0]->Tag, "C0_E");
+    EXPECT_EQ(chassis()[0]->InternalTag, nullptr);
 }
 
-TEST_F(ChassisBuild, ClassMutexIsTheCallers) {
-    pthread_mutex_lock(&ctrl->ChassisCfgMutex);
-    EXPECT_EQ(buildChassis(vendor_.chassis(vendor, "C0_E")), 0);
-    pthread_mutex_unlock(&ctrl->ChassisCfgMutex);
-}
-
-TEST_F(ChassisBuild, MaskedLinesCostNoCallForTheirTexts) {
-    books().recordObjectCalls(true);
-    setlogmask(LOG_UPTO(LOG_ERR));
-    ASSERT_EQ(buildChassis(vendor_.chassis(vendor, "C0_E")), 0);
-    EXPECT_EQ(books().count(Entry::PathToString), 0u);
+TEST_F(ChassisBuild, InternalTagOfAVeryLongTag) {
+    const std::string text = "C0_%s%n" + std::string(65536, 'x');
+    set(path, "Tag", CimValue::string(text));
+    EXPECT_EQ(buildChassis(path), 0);
+    ASSERT_EQ(chassis().size(), 1u);
+    EXPECT_EQ(chassis()[0]->InternalTag, text.substr(3));
 }
 
 }  // namespace

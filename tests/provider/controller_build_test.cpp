@@ -58,6 +58,28 @@ TEST_F(ControllerBuild, OnlyTheControllersOwnTimeIsSet) {
     EXPECT_EQ(ctrl->UpdateEnabled, 0);
 }
 
+TEST_F(ControllerBuild, ItsTimeIsThatOfTheCompletedRecord) {
+    addFullController(addProfile(), "C0");
+    // Every property of every object takes its second.
+    faults().add(watch(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); }));
+    ASSERT_EQ(build(), 0);
+    EXPECT_GT(VirtualClock::now(), kStart + 4);
+    EXPECT_EQ(controllers().front()->ControllerUpdateTime, VirtualClock::now());
+}
+
+TEST_F(ControllerBuild, ReadsThePropertiesOfEachObjectInTheirOrder) {
+    addFullController(addProfile(), "C0");
+    books().recordObjectCalls(true);
+    ASSERT_EQ(build(), 0);
+    EXPECT_THAT(propertiesRead("Sample_PortController"), ElementsAre("DeviceID"));
+    EXPECT_THAT(propertiesRead("Sample_ComputerSystem"), ElementsAre("OperationalStatus"));
+    EXPECT_THAT(propertiesRead("Sample_PhysicalPackage"), ElementsAre("Model", "HealthState"));
+    const std::string classes = "Classifications", version = "VersionString";
+    EXPECT_THAT(
+        propertiesRead("Sample_SoftwareIdentity"),
+        ElementsAre(classes, version, classes, version, classes, version, classes, version));
+}
+
 TEST_F(ControllerBuild, ListsAreTheRecordsOwnAndEmpty) {
     addFullController(addProfile(), "C0");
     ASSERT_EQ(build(), 0);

@@ -3,6 +3,7 @@
 
 #include "fake_path.h"
 #include "provider_fixture.h"
+#include "watched_calls.h"
 
 namespace plexortest {
 namespace {
@@ -77,6 +78,19 @@ TEST_F(ControllerRelease, PathsGoLastThePortControllersAfterTheSystems) {
     ctrl->ControllerOp = &system.path;
     FreeController(ctrl);
     EXPECT_EQ(system.released, 1);
+    EXPECT_EQ(port.released, 1);
+}
+
+TEST_F(ControllerRelease, MutexesAreDestroyedTheControllersOwnLast) {
+    RaidController_t* ctrl = newController("C0");
+    const std::vector<const void*> expected = {
+        &ctrl->DiskCfgMutex, &ctrl->VolumeCfgMutex,  &ctrl->PortCfgMutex, &ctrl->BatteryCfgMutex,
+        &ctrl->PoolCfgMutex, &ctrl->ChassisCfgMutex, &ctrl->CtrlMutex};
+    FakePath port([] { EXPECT_TRUE(DestroyWatch::destroyed().empty()) << "paths go before"; });
+    ctrl->PortControllerOp = &port.path;
+    const DestroyWatch watch;
+    FreeController(ctrl);
+    EXPECT_EQ(DestroyWatch::destroyed(), expected);
     EXPECT_EQ(port.released, 1);
 }
 

@@ -123,6 +123,17 @@ TYPED_TEST(DeviceBuild, StampsItsOwnTimesOnly) {
     EXPECT_THAT(this->otherTimes(), Each(0));
 }
 
+TYPED_TEST(DeviceBuild, StampsTheRecordWhenItHasReadEverything) {
+    int reads = 0;
+    this->whenCalled(testbed::Entry::InstanceGetProperty, [&reads] {
+        reads++;
+        VirtualClock::advance(1);
+    });
+    ASSERT_EQ(this->buildIt(), 0);
+    EXPECT_GE(reads, 3);
+    EXPECT_EQ(this->record()->LastUpdateTime, this->kStart + reads);
+}
+
 TYPED_TEST(DeviceBuild, OwnsWhatItKeeps) {
     ASSERT_EQ(this->buildIt(), 0);
     this->broker.flushThread();

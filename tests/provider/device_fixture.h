@@ -15,6 +15,7 @@
 
 #include "log_text.h"
 #include "provider_fixture.h"
+#include "query_arguments.h"
 #include "vendor_objects.h"
 
 namespace plexortest {
@@ -65,7 +66,7 @@ protected:
             if (call.entry != testbed::Entry::GetInstance)
                 text += " " + call.assocClass.value_or("NULL") + "/" +
                         call.resultClass.value_or("NULL");
-            calls.push_back(text + (call.hasPropertyList ? " with properties" : ""));
+            calls.push_back(text + (asksForAll(call) ? "" : " with roles or properties"));
         }
         return calls;
     }

@@ -23,6 +23,7 @@ struct DiskKind {
     static constexpr const char* nullDeviceId = "ERR NULL DeviceID for disk ";
     static constexpr const char* blankReleased = "DEBUG (null) deleted\n";
     static constexpr const char* exit = "DEBUG BuildDiskInfo, EXIT(";
+    static constexpr const char* updated = "DEBUG CheckAndUpdateDiskInfo, exit\n";
     static testbed::ObjectPath make(VendorObjects& vendor, const VendorController& card,
                                     const std::string& id) {
         return vendor.drive(card, id, vendor.pool(card, "P1")).drive;
@@ -45,6 +46,7 @@ struct VolumeKind {
     static constexpr const char* nullDeviceId = "ERR NULL DeviceID for volume ";
     static constexpr const char* blankReleased = "DEBUG Volume (null) ((null)) deleted\n";
     static constexpr const char* exit = "DEBUG BuildVolumeInfo, EXIT(";
+    static constexpr const char* updated = "DEBUG CheckAndUpdateVolumeInfo, exit\n";
     static testbed::ObjectPath make(VendorObjects& vendor, const VendorController& card,
                                     const std::string& id) {
         return vendor.volume(card, id, vendor.pool(card, "P1")).volume;
@@ -67,6 +69,7 @@ struct PortKind {
     static constexpr const char* nullDeviceId = "ERR NULL DeviceID for port ";
     static constexpr const char* blankReleased = "DEBUG (null) deleted\n";
     static constexpr const char* exit = "DEBUG BuildPortInfo, EXIT(";
+    static constexpr const char* updated = "DEBUG CheckAndUpdatePortInfo, exit.\n";
     static testbed::ObjectPath make(VendorObjects& vendor, const VendorController& card,
                                     const std::string& id) {
         return vendor.port(card, id);
@@ -89,6 +92,7 @@ struct BatteryKind {
     static constexpr const char* nullDeviceId = "ERR NULL DeviceID for battery ";
     static constexpr const char* blankReleased = "DEBUG Battery (null) deleted\n";
     static constexpr const char* exit = "DEBUG BuildBatteryInfo, EXIT(";
+    static constexpr const char* updated = "DEBUG CheckAndUpdateBatteryInfo, exit.\n";
     static testbed::ObjectPath make(VendorObjects& vendor, const VendorController& card,
                                     const std::string& id) {
         return vendor.battery(card, id);

@@ -1,5 +1,6 @@
 // What the four updaters have in common: the answer, the stamp, the lock.
 #include "device_kinds.h"
+#include "watched_calls.h"
 
 namespace plexortest {
 namespace {
@@ -57,6 +58,24 @@ TYPED_TEST(DeviceUpdate, StampsUnderTheLock) {
     EXPECT_EQ(this->updateTime(), built + 5);
 }
 
+TYPED_TEST(DeviceUpdate, WithoutNeedItOnlySaysThatItWasHere) {
+    ASSERT_EQ(this->buildIt(), 0);
+    const time_t built = this->record()->LastUpdateTime;
+    const auto status = this->record()->OperationalStatus;
+    this->record()->UpdateEnabled = 3;
+    this->repository.setProperty(this->path_, "OperationalStatus", CimValue::uint16Array({6}));
+    VirtualClock::advance(25);
+    this->forget();
+    const UpdatesDeclined declined;
+    EXPECT_EQ(this->update(TypeParam::update, this->record(), nullptr), 0);
+    EXPECT_EQ(UpdatesDeclined::questions(), (std::vector<UpdatesDeclined::Question>{{built, 3}}));
+    EXPECT_EQ(this->updateTime(), built);
+    EXPECT_EQ(this->record()->OperationalStatus, status);
+    EXPECT_THAT(this->brokerCalls(), testing::IsEmpty());
+    ASSERT_EQ(logLines().size(), 2u);
+    EXPECT_EQ(logLines()[1], TypeParam::updated);
+}
+
 TYPED_TEST(DeviceUpdate, NeedsNoInterface) {
     ASSERT_EQ(this->buildIt(), 0);
     EXPECT_EQ(TypeParam::update(nullptr, this->ctx(), this->ctrl_, this->record(),
@@ -70,6 +89,25 @@ template <class Kind>
 class DeviceUpdateFetch : public KindTest<Kind> {};
 using FetchingKinds = testing::Types<DiskKind, VolumeKind, BatteryKind>;
 TYPED_TEST_SUITE(DeviceUpdateFetch, FetchingKinds, KindNames);
+
+TYPED_TEST(DeviceUpdateFetch, StampsInAHoldOfTheLockOfItsOwn) {
+    ASSERT_EQ(this->buildIt(), 0);
+    this->repository.setProperty(this->path_, "OperationalStatus", CimValue::uint16Array({6}));
+    CMPIInstance* fresh = this->instanceAt(this->path_);
+    VirtualClock::advance(25);
+    std::vector<std::pair<int, time_t>> atEnds;  // status and stamp at the end of each hold
+    {
+        const HoldWatch watch(this->ctrl_->CtrlMutex, [&] {
+            atEnds.push_back({this->record()->OperationalStatus, this->updateTime()});
+        });
+        EXPECT_EQ(this->update(TypeParam::update, this->record(), fresh), 0);
+    }
+    ASSERT_GE(atEnds.size(), 2u);
+    const std::pair<int, time_t> stamped = {6, this->kStart + 25};
+    EXPECT_EQ(atEnds.back(), stamped);
+    atEnds.pop_back();
+    EXPECT_THAT(atEnds, Each(std::pair<int, time_t>{6, this->kStart}));
+}
 
 TYPED_TEST(DeviceUpdateFetch, LogsAFailureThatCameWithAnInstanceAndUsesTheInstance) {
     ASSERT_EQ(this->buildIt(), 0);

@@ -90,6 +90,26 @@ TEST_F(DevicesFailures, NullElement) {
     }
 }
 
+TEST_F(DevicesFailures, EnumerationThatFailsEndsTheWalk) {
+    for (const Entry entry : {Entry::EnumerationHasNext, Entry::EnumerationGetNext}) {
+        for (std::size_t good = 0; good < 3; good++) {
+            failOnly(failingEnumeration(entry, static_cast<int>(good)));
+            EXPECT_EQ(walk(), 0);
+            EXPECT_EQ(taken(), Texts(all.begin(), all.begin() + static_cast<int>(good)))
+                << testbed::entryName(entry);
+            expectOnlyTheQueuedClones();
+        }
+    }
+}
+
+TEST_F(DevicesFailures, ElementThatComesWithAFailureIsNotQueued) {
+    auto rule = failingEnumeration(Entry::EnumerationGetNext, 1);
+    rule.keepResult = true;
+    failOnly(rule);
+    EXPECT_EQ(walk(), 0);
+    EXPECT_EQ(taken(), Texts{"2 0"});
+}
+
 TEST_F(DevicesFailures, DeviceWithoutPath) {
     for (std::size_t device = 0; device < 3; device++) {
         failOnly(answerNull(Entry::InstanceGetObjectPath, static_cast<int>(device)));

@@ -138,6 +138,20 @@ TEST_P(DevicesProcessKind, WaitsForItsClassMutex) {
     EXPECT_EQ((ctrl->*kind.list)->Size, 1u);
 }
 
+TEST_P(DevicesProcessKind, ThePathGoesBeforeTheInstance) {
+    const Kind& kind = GetParam();
+    Thread_Args_t* item = itemFor(kind.code, kind.add(vendor_, vendor));
+    const auto* path = reinterpret_cast<const void*>(item->Arg3);
+    const auto* instance = reinterpret_cast<const void*>(item->Arg4);
+    std::vector<std::pair<bool, bool>> alive;  // path and instance, at each release
+    failOnly(watch(Entry::Release, [&] {
+        alive.push_back({books().kindOf(path).has_value(), books().kindOf(instance).has_value()});
+    }));
+    process(item);
+    const std::vector<std::pair<bool, bool>> expected = {{true, true}, {false, true}};
+    EXPECT_EQ(alive, expected);
+}
+
 TEST_P(DevicesProcessKind, RejectedDeviceLeavesNothing) {
     const Kind& kind = GetParam();
     const Path path = kind.add(vendor_, vendor);

@@ -73,6 +73,21 @@ TEST_F(DevicesWorkers, MoreDevicesThanTheQueueHolds) {
     for (const Sleep& sleep : VirtualClock::sleeps()) EXPECT_EQ(sleep.seconds, 1u);
 }
 
+// The other worker could not be started: nobody but the walk itself builds.
+TEST_F(DevicesWorkers, AWorkerThatIsAloneBuildsThemAll) {
+    addPorts(60);
+    testbed::FaultRule rule;
+    rule.entry = Entry::PrepareAttachThread;
+    rule.nullResult = true;
+    rule.times = 1;
+    faults().add(rule);
+    startWalk();
+    ASSERT_TRUE(walkEnds());
+    EXPECT_EQ(ids<SASSATAPort_t>(ctrl->PortList).size(), 60u);
+    EXPECT_TRUE(queueAtEnd);
+    EXPECT_EQ(CapturedSyslog::countContaining("waiting...\n"), 0u);
+}
+
 TEST_F(DevicesWorkers, DevicesOfAllKinds) {
     const Path pool = vendor_.pool(vendor, "P1");
     attach(ctrl, newPool("P1"));

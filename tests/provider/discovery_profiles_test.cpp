@@ -175,6 +175,16 @@ TEST_F(DiscoveryProfiles, ElementOfAnotherTypeCostsOnlyItself) {
     }
 }
 
+TEST_F(DiscoveryProfiles, EnumerationThatFailsEndsTheWalk) {
+    addProfiles(3);
+    const std::vector<std::string> all = {"P0", "P1", "P2"};
+    for (int good = 0; good < 3; good++) {
+        failOnly(failingEnumeration(Entry::EnumerationGetNext, good));
+        EXPECT_EQ(discover(), good);
+        EXPECT_EQ(found(), std::vector<std::string>(all.begin(), all.begin() + good));
+    }
+}
+
 TEST_F(DiscoveryProfiles, NeedsNoMemoryOfItsOwn) {
     addProfiles(2);
     const auto fault = FailAllocation::from(1);

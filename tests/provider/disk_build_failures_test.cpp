@@ -199,6 +199,49 @@ TEST_P(DiskBuildWrongElement, IsNeverFollowed) {
     EXPECT_EQ(ctrl_->DiskList->Size, mediaOrPool ? 0u : 1u);
 }
 
+/// What a drive has from its extent, firmware, slot, chassis and pool.
+struct Origins {
+    CMPIUint64 blocks;
+    std::string firmware;
+    int slot;
+    std::string chassis, pool;
+
+    bool operator==(const Origins&) const = default;
+};
+
+void PrintTo(const Origins& origins, std::ostream* out) {
+    *out << origins.blocks << " blocks, " << origins.firmware << ", slot " << origins.slot << " of "
+         << origins.chassis << ", pool " << origins.pool;
+}
+
+TEST_P(DiskBuildWrongElement, GivesWayToTheNext) {
+    // Each look-up finds a second object: those of another drive, an enclosure, a pool.
+    const VendorDrive other = vendor.drive(card_, "D2", poolPath_, chassis_, 9);
+    vendor.tie("CIM_MediaPresent", objects_.drive, other.extent);
+    vendor.tie("CIM_ElementSoftwareIdentity", other.software, objects_.drive);
+    vendor.tie("CIM_Realizes", other.package, objects_.drive);
+    vendor.tie("CIM_PackageInConnector", other.slot, objects_.package);
+    vendor.tie("CIM_Container", vendor.chassis(card_, "C0_33"), objects_.slot);
+    vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, "P2"), objects_.extent);
+    const CMPIUint64 blocks = 0x1'0000'0002;
+    const Origins expected[] = {
+        {2000, "FW-D1", 4, "C0_32", "P1"},   {blocks, "FW-D2", 4, "C0_32", "P1"},
+        {blocks, "FW-D1", 9, "C0_32", "P1"}, {blocks, "FW-D1", 9, "C0_32", "P1"},
+        {blocks, "FW-D1", 4, "C0_33", "P1"}, {blocks, "FW-D1", 4, "C0_32", "P2"}};
+    testbed::FaultRule rule;
+    rule.entry = Entry::EnumerationGetNext;
+    rule.wrongType = true;
+    rule.skip = GetParam();
+    rule.times = 1;
+    faults().add(rule);
+    ASSERT_EQ(buildDisk(), 0);
+    const DiskDrive_t* built = disk();
+    const auto text = [](const char* field) { return field != nullptr ? field : "absent"; };
+    EXPECT_EQ((Origins{built->NumberOfBlocks, text(built->FwVersion), built->SlotNumber,
+                       text(built->Chassis), text(built->Pool)}),
+              expected[GetParam()]);
+}
+
 INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildWrongElement, testing::Range(0, 6));
 
 TEST_F(DiskBuildFailures, ChassisPathsWithoutATextAsTagGiveNoChassis) {

@@ -133,6 +133,13 @@ TEST_F(DiskBuildRecord, ReadsTheDrivesPropertiesInOrder) {
                 ElementsAre("DeviceID", "Name", "EnabledState", "OperationalStatus"));
 }
 
+TEST_F(DiskBuildRecord, ReadsTheExtentsPropertiesInOrder) {
+    books().recordObjectCalls(true);
+    ASSERT_EQ(buildDisk(), 0);
+    EXPECT_THAT(propertiesRead("Sample_StorageExtent"),
+                ElementsAre("NumberOfBlocks", "ConsumableBlocks", "Primordial", "ExtentStatus"));
+}
+
 TEST_F(DiskBuildRecord, StampsTheRecordBeforeThePoolIsAskedFor) {
     using testbed::Entry;
     whenCalled(

@@ -1,5 +1,6 @@
 // The factory's own context, when the broker has none to give or does not attach the thread.
 #include "entry_fixture.h"
+#include "refresh_fixture.h"
 
 namespace {
 
@@ -88,6 +89,17 @@ TEST_F(EntryContextTest, RefusedAttachmentStopsNothing) {
     EXPECT_EQ(controllers(), 1u);
     EXPECT_EQ(countHere(Entry::ContextFlush), 1u);
     EXPECT_EQ(countHere(Entry::DetachThread), 1u);
+
+    std::vector<std::string> misuses;
+    for (const char* call :
+         {"enumerateInstances", "enumerateInstances", "associators", "associators", "associators",
+          "associators", "prepareAttachThread", "prepareAttachThread", "context.flush"}) {
+        if (std::string(call) == "context.flush" && !plexortest::kContextHasFlush) continue;
+        misuses.push_back(std::string("up-call with a context that no thread has attached with: ") +
+                          call);
+    }
+    misuses.push_back("detachThread with a context that this thread is not attached with");
+    EXPECT_EQ(books().misuses(), misuses);
 }
 
 TEST_F(EntryContextTest, RefusedDetachmentStopsNothing) {
@@ -101,13 +113,26 @@ TEST_F(EntryContextTest, RefusedDetachmentStopsNothing) {
     EXPECT_EQ(linesHere().back(), (LogLine{LOG_DEBUG, "PlexorInit: EXIT\n"}));
 }
 
-// Nothing that belongs to the prepared context is used after it was given back.
-TEST_F(EntryContextTest, TheContextIsNotUsedAfterDetach) {
+TEST_F(EntryContextTest, EverythingIsAskedOnTheContextThatWasAttached) {
     const WorkersHeld held;
     callFactory();
-    const std::vector<Entry> calls = upCalls();
-    EXPECT_EQ(calls.back(), Entry::DetachThread);
-    EXPECT_EQ(books().misuses(), std::vector<std::string>{});
+    std::vector<testbed::CallRecord> calls = books().calls();
+    std::erase_if(calls, [](const auto& call) {
+        const bool needsNone = call.entry == Entry::NewObjectPath;
+        const bool isPlainFlush =
+            call.entry == Entry::ContextFlush && !plexortest::kContextHasFlush;
+        return call.thread != std::this_thread::get_id() || needsNone || isPlainFlush;
+    });
+    ASSERT_GT(calls.size(), 9u);
+    EXPECT_EQ(calls[0].entry, Entry::PrepareAttachThread);
+    EXPECT_EQ(calls[0].context, ctx());
+    EXPECT_EQ(calls[1].entry, Entry::AttachThread);
+    EXPECT_EQ(calls.back().entry, Entry::DetachThread);
+    const void* const own = calls[1].context;
+    EXPECT_NE(own, ctx());
+    for (std::size_t i = 2; i < calls.size(); i++) {
+        EXPECT_EQ(calls[i].context, own) << testbed::entryName(calls[i].entry) << ", call " << i;
+    }
 }
 
 }  // namespace

@@ -84,6 +84,18 @@ TEST_F(EntryDebugWaitTest, WaitsOneSecondAtLeast) {
     EXPECT_EQ(CapturedSyslog::count(waitingLine()), 1u);
 }
 
+TEST_F(EntryDebugWaitTest, SleepsFirstAndSaysThenThatItWaits) {
+    setenv("WAIT_PROC", "1", 1);
+    std::vector<std::size_t> said;  // lines at the beginning of each sleep
+    VirtualClock::onSleep([&](unsigned int) {
+        said.push_back(CapturedSyslog::count(waitingLine()));
+        if (said.size() == 3) waitDebug = 0;
+    });
+    callFactory();
+    EXPECT_EQ(said, (std::vector<std::size_t>{0, 1, 2}));
+    EXPECT_EQ(CapturedSyslog::count(waitingLine()), 3u);
+}
+
 TEST_F(EntryDebugWaitTest, OnlyThePresenceOfTheVariableCounts) {
     for (const char* value : {"", "0", "no"}) {
         setenv("WAIT_PROC", value, 1);

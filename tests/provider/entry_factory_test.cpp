@@ -130,6 +130,29 @@ TEST_F(EntryFactoryTest, BuildsTheControllersAndQueuesTheirDevices) {
     EXPECT_EQ(ctrl->PoolList->Size, 1u);
 }
 
+TEST_F(EntryFactoryTest, StartsTheWorkersBeforeItQueuesTheirWork) {
+    const WorkersHeld held;
+    std::vector<unsigned int> queued;
+    CapturedSyslog::onLine([&](const LogLine& line) {
+        if (line.text.starts_with("InitPlexorThreads: ")) queued.push_back(__FIFO.List.Size);
+    });
+    callFactory();
+    EXPECT_EQ(queued, (std::vector<unsigned int>{0, 0, 0})) << "the interval and two workers";
+    EXPECT_EQ(__FIFO.List.Size, 1u);
+}
+
+TEST_F(EntryFactoryTest, LogsItsExitWhenItsContextIsGone) {
+    std::vector<Entry> before;
+    CapturedSyslog::onLine([&](const LogLine& line) {
+        if (line.text == "PlexorInit: EXIT\n") before = upCalls();
+    });
+    const WorkersHeld held;
+    callFactory();
+    ASSERT_GE(before.size(), 2u);
+    EXPECT_EQ(before.back(), Entry::DetachThread);
+    EXPECT_EQ(before[before.size() - 2], Entry::ContextFlush);
+}
+
 TEST_F(EntryFactoryTest, ReadsTheHostsIdentity) {
     callFactory();
     EXPECT_STREQ(GetSystemName(), "host-uuid");

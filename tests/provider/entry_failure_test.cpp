@@ -3,6 +3,7 @@
 #include <stdlib.h>
 
 #include "entry_fixture.h"
+#include "refresh_fixture.h"
 
 namespace {
 
@@ -136,6 +137,24 @@ TEST_F(EntryFailureTest, IdentityIsReleasedAfterTheLine) {
     callFactory();
     EXPECT_EQ(during, "host-uuid");
     EXPECT_EQ(GetSystemName(), nullptr);
+}
+
+TEST_F(EntryFailureTest, IsTakenBackBeforeTheContextGoes) {
+    std::vector<int> initializedThen;
+    testbed::FaultRule watch;
+    for (const Entry entry : {Entry::ContextFlush, Entry::DetachThread}) {
+        watch.entry = entry;
+        watch.hook = [&] { initializedThen.push_back(initialized()); };
+        faults().add(watch);
+    }
+    // A flush that is no call of the context is not seen here.
+    const std::vector<int> expected(plexortest::kContextHasFlush ? 2 : 1, 0);
+    callFactory();
+    EXPECT_EQ(initializedThen, expected) << "no identity";
+    vendor.host();
+    initializedThen.clear();
+    callFactory();
+    EXPECT_EQ(initializedThen, expected) << "no profile";
 }
 
 TEST_F(EntryFailureTest, NextCallTriesAgain) {

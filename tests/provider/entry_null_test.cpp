@@ -90,12 +90,13 @@ protected:
         rule.wrongType = answer.wrongType;
         return rule;
     }
-    /// Calls the factory while the workers are held, and says whether the fault was met.
-    bool meetsFault(const Answer& answer, int call) {
+    /// Calls the factory while the workers are held, with that answer to `times` calls from number
+    /// `call` on, and says whether the fault was met.
+    bool meetsFault(const Answer& answer, int call, int times) {
         bool met = false;
         testbed::FaultRule rule = ruleFor(answer);
         rule.skip = call;
-        rule.times = 1;
+        rule.times = times;
         rule.hook = [&met] { met = true; };
         faults().add(rule);
         const WorkersHeld held;
@@ -103,33 +104,28 @@ protected:
         faults().clear();
         return met;
     }
+    /// Lets the answers begin at every call in turn.
+    void copeFromEveryCallOn(int times) {
+        for (const Answer& answer : kAnswers) {
+            for (int call = 0; call < 200; call++) {
+                SCOPED_TRACE(std::string(answer.name) + " at call " + std::to_string(call));
+                const bool met = meetsFault(answer, call, times);
+                serveAndUnload();
+                if (HasFailure()) return;
+                if (!met) break;
+                ASSERT_LT(call, 199) << "more calls than this test expects";
+            }
+        }
+    }
 };
 
 TEST_P(EntryNullTest, FactoryCopesWithEveryAnswer) {
-    for (const Answer& answer : kAnswers) {
-        for (int call = 0; call < 200; call++) {
-            SCOPED_TRACE(std::string(answer.name) + " at call " + std::to_string(call));
-            const bool met = meetsFault(answer, call);
-            serveAndUnload();
-            if (HasFailure()) return;
-            if (!met) break;
-            ASSERT_LT(call, 199) << "more calls than this test expects";
-        }
-    }
+    copeFromEveryCallOn(1);
 }
 
-// The same answer to each of these calls, from the first to the last.
+// The same answer to a call and to all after it, so that every loop is begun and then starved.
 TEST_P(EntryNullTest, FactoryCopesWithTheSameAnswerForEver) {
-    for (const Answer& answer : kAnswers) {
-        SCOPED_TRACE(answer.name);
-        faults().add(ruleFor(answer));
-        {
-            const WorkersHeld held;
-            callAndCheck();
-        }
-        faults().clear();
-        serveAndUnload();
-    }
+    copeFromEveryCallOn(-1);
 }
 
 INSTANTIATE_TEST_SUITE_P(Entries, EntryNullTest, ::testing::ValuesIn(kEntries),

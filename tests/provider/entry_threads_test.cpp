@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "entry_fixture.h"
+#include "real_waits.h"
 #include "worker_harness.h"
 
 namespace {
@@ -131,6 +132,67 @@ TEST_F(EntryThreadsTest, WhenTheFirstFailsTheNextTriesAndTheOthersWaitForIt) {
     EXPECT_EQ(CapturedSyslog::count("InitSystemInfo: entering...\n"), 2u);
     EXPECT_EQ(CapturedSyslog::count("PlexorInit: EXIT\n"), 2u);
     EXPECT_EQ(initialized(), 1);
+}
+
+// A vendor that, asked for its profiles, asks the manager for computer systems: the manager calls
+// the factory, then asks the provider, and only then answers.
+class EntryNestedTest : public EntryThreadsTest {
+protected:
+    void SetUp() override {
+        EntryThreadsTest::SetUp();
+        vendor.controller("C1", vendor.profile());
+    }
+    /// Does `call` in the middle of the search for controllers, when the first is in the list.
+    void whileTheVendorAnswers(std::function<void()> call) {
+        testbed::FaultRule rule;
+        rule.entry = Entry::Associators;
+        rule.assocClass = "CIM_Realizes";
+        rule.keepResult = true;
+        rule.skip = 1;
+        rule.times = 1;
+        rule.hook = std::move(call);
+        faults().add(rule);
+    }
+    std::size_t controllersFor(CMPIInstanceMI* provider) {
+        testbed::InstanceClient client(broker, provider);
+        const testbed::Response names = client.enumerateInstanceNames("Tovexa_PlexorController");
+        const testbed::Response systems = client.enumerateInstances("Tovexa_PlexorController");
+        EXPECT_EQ(names.rc, CMPI_RC_OK);
+        EXPECT_EQ(systems.rc, CMPI_RC_OK);
+        EXPECT_EQ(systems.instances.size(), names.paths.size());
+        return names.paths.size();
+    }
+};
+
+TEST_F(EntryNestedTest, OnTheSameThreadItDoesNotWait) {
+    const plexortest::HurriedWaits hurry(plexortest::HurriedWaits::Locks);
+    std::size_t seen = 99;
+    CMPIInstanceMI* nested = nullptr;
+    whileTheVendorAnswers([&] {
+        nested = callFactoryHere();
+        seen = controllersFor(nested);
+    });
+    EXPECT_EQ(callFactoryHere(), nested);
+    EXPECT_EQ(seen, 0u);
+    EXPECT_EQ(controllersFor(nested), 2u);
+    EXPECT_EQ(CapturedSyslog::count("InitSystemInfo: entering...\n"), 1u);
+}
+
+TEST_F(EntryNestedTest, OnAnotherThreadItDoesNotWaitForEver) {
+    const plexortest::HurriedWaits hurry(plexortest::HurriedWaits::Locks);
+    std::size_t seen = 99;
+    CMPIInstanceMI* nested = nullptr;
+    whileTheVendorAnswers([&] {
+        std::thread([&] {
+            nested = callFactoryHere();
+            seen = controllersFor(nested);
+        }).join();
+    });
+    EXPECT_EQ(callFactoryHere(), nested);
+    EXPECT_EQ(seen, 0u);
+    EXPECT_EQ(controllersFor(nested), 2u);
+    EXPECT_EQ(CapturedSyslog::count("InitSystemInfo: entering...\n"), 1u);
+    EXPECT_EQ(plexortest::HurriedWaits::locks().back(), std::chrono::seconds(30));
 }
 
 // For the thread sanitizer, too: nothing but the provider itself orders these threads.

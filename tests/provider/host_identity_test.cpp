@@ -221,6 +221,44 @@ TEST_F(HostIdentity, ResultThatIsNoInstanceIsNoHost) {
     expectNames(nullptr, nullptr, nullptr);
 }
 
+TEST_F(HostIdentity, ElementOfAnotherTypeGivesWayToTheNext) {
+    vendor.host("second-host");
+    testbed::FaultRule rule = refusal(Entry::EnumerationGetNext, CMPI_RC_OK);
+    rule.wrongType = true;
+    rule.times = 1;
+    faults().add(rule);
+    EXPECT_EQ(init(), 0);
+    EXPECT_STREQ(GetSystemName(), "second-host");
+}
+
+TEST_F(HostIdentity, ItsNamesAreReadInTheirOrder) {
+    books().recordObjectCalls(true);
+    ASSERT_EQ(init(), 0);
+    std::vector<std::string> names;
+    for (const testbed::CallRecord& call : books().calls()) {
+        if (call.entry == Entry::InstanceGetProperty) names.push_back(call.name.value_or(""));
+    }
+    EXPECT_EQ(names, (std::vector<std::string>{"Name", "ElementName", "CreationClassName"}));
+}
+
+// The line is written all the same; the system log shows a null text in its own way.
+TEST_F(HostIdentity, MissingNamesAreMissingFromTheLine) {
+    const std::pair<const char*, const char*> lines[] = {
+        {"Name",
+         "SYSTEM INFO: HostName host, SystemName (null), "
+         "SystemClassName OMC_UnitaryComputerSystem\n"},
+        {"ElementName",
+         "SYSTEM INFO: HostName (null), SystemName (null), "
+         "SystemClassName OMC_UnitaryComputerSystem\n"},
+        {"CreationClassName",
+         "SYSTEM INFO: HostName (null), SystemName (null), SystemClassName (null)\n"}};
+    for (const auto& [name, line] : lines) {
+        repository.eraseProperty(host(), name);
+        EXPECT_EQ(init(), 0);
+        EXPECT_TRUE(logged(LOG_DEBUG, line));
+    }
+}
+
 TEST_F(HostIdentity, FailedReadingMayBeRetried) {
     const int rule = faults().add(refusal(Entry::EnumerateInstances));
     EXPECT_EQ(init(), -100);

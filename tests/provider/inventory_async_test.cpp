@@ -162,6 +162,28 @@ TEST_F(InventoryAsync, AllSevenTimesAreSetToTheEndOfEachControllersWalk) {
     }
 }
 
+TEST_F(InventoryAsync, AllSevenTimesAreOneReadingOfTheClock) {
+    RaidController_t* const ctrl = cachedController("C0");
+    VirtualClock::stepAtEachReading(1);
+    buildInventory();
+    VirtualClock::stepAtEachReading(0);
+    EXPECT_EQ(VirtualClock::now(), kStart + 1);
+    for (auto field : kAllTimes) EXPECT_EQ(ctrl->*field, kStart);
+}
+
+TEST_F(InventoryAsync, TheTimesAreWrittenWithoutTheControllersMutex) {
+    RaidController_t* const ctrl = cachedController("C0");
+    ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
+    pthread_mutex_lock(&ctrl->CtrlMutex);
+    {
+        Worker worker(ctx());
+        EXPECT_TRUE(comesTrue([] { return threadActivityDone() == 1; }));
+        pthread_mutex_unlock(&ctrl->CtrlMutex);
+        EXPECT_TRUE(workersComeToRest());
+    }
+    for (auto field : kAllTimes) EXPECT_EQ(ctrl->*field, kStart);
+}
+
 TEST_F(InventoryAsync, DoneIsSetAtTheEndUnderTheMutexAndToldToAll) {
     cachedController("C0");
     std::vector<unsigned int> during;

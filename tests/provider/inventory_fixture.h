@@ -10,6 +10,7 @@
 #include <vector>
 
 #include "provider_fixture.h"
+#include "query_arguments.h"
 #include "vendor_objects.h"
 
 namespace plexortest {
@@ -129,6 +130,13 @@ protected:
         rule.times = 1;
         return rule;
     }
+    /// A rule by which enumerations fail to answer that entry, behind `skip` good answers.
+    static testbed::FaultRule failingEnumeration(Entry entry, int skip) {
+        testbed::FaultRule rule = refusal(entry);
+        rule.skip = skip;
+        rule.times = 1;
+        return rule;
+    }
     CMPIInstance* instanceAt(const Path& path) {
         return broker.makeInstance(repository.get(path).value());
     }
@@ -145,9 +153,18 @@ protected:
             asked.push_back(std::string(testbed::entryName(call.entry)) + " " + call.path + " " +
                             call.assocClass.value_or("any") + " " +
                             call.resultClass.value_or("any"));
-            EXPECT_FALSE(call.hasPropertyList) << asked.back();
+            EXPECT_TRUE(asksForAll(call)) << asked.back();
         }
         return asked;
+    }
+    /// Names of the properties read from instances of the class, in order; needs recordObjectCalls.
+    Texts propertiesRead(const std::string& className) {
+        Texts names;
+        for (const testbed::CallRecord& call : books().calls()) {
+            const bool isRead = call.entry == Entry::InstanceGetProperty;
+            if (isRead && call.className == className) names.push_back(call.name.value_or(""));
+        }
+        return names;
     }
 
     VendorObjects vendor_{repository};

@@ -47,6 +47,18 @@ TEST_F(KeysPathsTest, ControllerHasCreationClassNameAndName) {
               (Lines{{LOG_DEBUG, "FillControllerObjectPath: DeviceID - C0\n"}}));
 }
 
+TEST_F(KeysPathsTest, ControllersNameIsComposedAfterItsClassNameWasAdded) {
+    CMPIObjectPath* real = broker.makePath({"root/cimv2", "Tovexa_PlexorController", {}});
+    const auto copies = FailAllocation::none(Allocator::Strdup);
+    std::vector<std::size_t> copiesBefore;
+    testbed::FaultRule watch;
+    watch.entry = testbed::Entry::PathAddKey;
+    watch.hook = [&] { copiesBefore.push_back(copies.calls()); };
+    faults().add(watch);
+    FillControllerObjectPath(real, controller.get());
+    EXPECT_EQ(copiesBefore, (std::vector<std::size_t>{0, 1}));
+}
+
 TEST_F(KeysPathsTest, SoftwareIdentityHasInstanceIdAlone) {
     FillSoftwareIdentityObjectPath(path.handle(), controller.get());
     EXPECT_EQ(path.added, (Keys{{"InstanceID", "tovexa:ControllerSoftwareC0"}}));

@@ -1,5 +1,6 @@
 // Draining a list.
 #include "list_fixture.h"
+#include "watched_calls.h"
 
 namespace plexortest {
 namespace {
@@ -78,6 +79,17 @@ TEST_F(ListFree, WithoutAReleaseFunctionItemsAreFreed) {
         loggedInOrder({freeing(&list, nullptr), removed(firstAddress, 1), nodeFreed(firstAddress),
                        removed(secondAddress, 0), nodeFreed(secondAddress)}));
     EXPECT_EQ(CapturedSyslog::countContaining("freed from list"), 2u);
+}
+
+TEST_F(ListFree, SaysThatANodeIsFreedBeforeItIs) {
+    char* const item = ownedCopy("item");
+    fill({item});
+    bool said = false;
+    const FreeWatch watch([&](const void* block) {
+        if (block == item) said = logged(LOG_DEBUG, nodeFreed(item).text);
+    });
+    FreeList(&list, nullptr);
+    EXPECT_TRUE(said);
 }
 
 TEST_F(ListFree, FreeMayBeGivenAsReleaseFunction) {

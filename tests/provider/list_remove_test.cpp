@@ -188,6 +188,13 @@ TEST_F(ListRemove, NoRemovalNeedsMemory) {
     EXPECT_EQ(fault.calls(), 0u);
 }
 
+TEST_F(ListTest, IsEmptyByItsSizeNotByItsHead) {
+    List_Entry_t entry = {nullptr, &a};
+    List_t headless = {nullptr, nullptr, 1}, sizeless = {&entry, &entry, 0};
+    EXPECT_EQ(IsListEmpty(&headless), 0);
+    EXPECT_EQ(IsListEmpty(&sizeless), 1);
+}
+
 TEST_F(ListTest, IsEmptyWhenItsSizeIsZero) {
     EXPECT_EQ(IsListEmpty(&list), 1);
     fill({&a});

@@ -186,6 +186,23 @@ TEST_F(MatchFailures, FewerResultsThanTheArrayHad) {
     expectLast("CrossoutDuplicatedEntries EXITED, rc 0, remove 0, add 1\n");
 }
 
+TEST_F(MatchFailures, ResultsThatCannotBeReadToTheirEndAreNotMatched) {
+    cache("A");
+    cache("B");
+    for (const Entry entry : {Entry::EnumerationHasNext, Entry::EnumerationGetNext}) {
+        for (int position = 0; position < 2; position++) {
+            SCOPED_TRACE(std::string(testbed::entryName(entry)) + " " + std::to_string(position));
+            FaultRule rule = refusal(entry);
+            rule.skip = position;
+            faults().add(rule);
+            EXPECT_EQ(match(resultsOf({"A", "B"})), -100);
+            expectNothingHandedBack();
+            expectLast("CrossoutDuplicatedEntries EXITED, rc -100, remove 0, add 0\n");
+            faults().clear();
+        }
+    }
+}
+
 TEST_F(MatchFailures, AnElementThatIsNoInstanceIsPassedOver) {
     CMPIEnumeration* const fresh = resultsOf({"P0", "P1", "P2"});
     FaultRule number;

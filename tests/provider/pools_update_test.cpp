@@ -2,6 +2,7 @@
 #include <thread>
 
 #include "pools_fixture.h"
+#include "watched_calls.h"
 
 namespace plexortest {
 namespace {
@@ -82,6 +83,15 @@ TEST_F(PoolsUpdate, NeedsNoInstance) {
     EXPECT_EQ(pools()[0]->LastUpdateTime, kStart + 1'000'000);
 }
 
+TEST_F(PoolsUpdate, WithoutNeedItMovesNoTime) {
+    pools()[0]->UpdateEnabled = 3;
+    const UpdatesDeclined declined;
+    EXPECT_EQ(updatePool(), 0);
+    EXPECT_EQ(UpdatesDeclined::questions(), (std::vector<UpdatesDeclined::Question>{{kStart, 3}}));
+    EXPECT_EQ(ctrl->PoolUpdateTime, kStart);
+    EXPECT_EQ(inventoryLog().size(), 2u);
+}
+
 TEST_F(PoolsUpdate, Log) {
     EXPECT_EQ(updatePool(), 0);
     EXPECT_THAT(inventoryLog(), ElementsAre(debugLine("CheckAndUpdatePoolInfo: ENTER. pool - P1\n"),
@@ -105,6 +115,15 @@ TEST_F(ChassisUpdate, KeepsWhatWasBuilt) {
 TEST_F(ChassisUpdate, NeedsNoInstance) {
     EXPECT_EQ(updateChassis(nullptr), 0);
     expectOtherTimes(&RaidController_t::ChassisUpdateTime);
+}
+
+TEST_F(ChassisUpdate, WithoutNeedItMovesNoTime) {
+    chassis()[0]->UpdateEnabled = 3;
+    const UpdatesDeclined declined;
+    EXPECT_EQ(updateChassis(), 0);
+    EXPECT_EQ(UpdatesDeclined::questions(), (std::vector<UpdatesDeclined::Question>{{kStart, 3}}));
+    EXPECT_EQ(ctrl->ChassisUpdateTime, kStart);
+    EXPECT_EQ(inventoryLog().size(), 2u);
 }
 
 TEST_F(ChassisUpdate, Log) {

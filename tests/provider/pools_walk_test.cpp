@@ -203,6 +203,29 @@ TEST_P(PoolsAndChassisWalk, ElementOfAnotherTypeCostsOnlyItself) {
     }
 }
 
+TEST_P(PoolsAndChassisWalk, EnumerationThatFailsEndsTheWalk) {
+    for (const char* key : {"A", "B", "C"}) addOne(key);
+    const Texts expected[] = {{}, {"A"}, {"A", "B"}};
+    for (const Entry entry : {Entry::EnumerationHasNext, Entry::EnumerationGetNext}) {
+        for (int good = 0; good < 3; good++) {
+            failOnly(failingEnumeration(entry, good));
+            forget();
+            EXPECT_EQ(walk(), 0);
+            EXPECT_EQ(cached(), expected[good]) << testbed::entryName(entry);
+            EXPECT_TRUE(isFree(ctrl->*GetParam().classMutex));
+        }
+    }
+}
+
+TEST_P(PoolsAndChassisWalk, ElementThatComesWithAFailureIsNotTaken) {
+    for (const char* key : {"A", "B", "C"}) addOne(key);
+    auto rule = failingEnumeration(Entry::EnumerationGetNext, 1);
+    rule.keepResult = true;
+    failOnly(rule);
+    EXPECT_EQ(walk(), 0);
+    EXPECT_THAT(cached(), ElementsAre("A"));
+}
+
 TEST_P(PoolsAndChassisWalk, EveryCloneInTurnCostsOnlyThePath) {
     for (const char* key : {"A", "B"}) addOne(key);
     for (int clone = 0; clone < 2; clone++) {

@@ -107,6 +107,7 @@ protected:
             if (call.path != system_.text()) continue;
             found.push_back(call.assocClass.value_or("NULL") + ">" +
                             call.resultClass.value_or("NULL"));
+            EXPECT_TRUE(asksForAll(call)) << found.back();
         }
         return found;
     }

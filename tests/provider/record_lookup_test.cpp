@@ -61,6 +61,7 @@ TEST_F(PoolLookup, FindsNothingInAnEmptyList) {
 TEST_F(PoolLookup, FindsNothingForNull) {
     attach(ctrl, newPool("P0"));
     EXPECT_EQ(FindStoragePoolByID(ctrl, nullptr), nullptr);
+    EXPECT_EQ(CapturedSyslog::lines(), std::vector<LogLine>{});
 }
 
 TEST_F(PoolLookup, ComparesWholeIDsWithTheirCase) {
@@ -125,6 +126,7 @@ TEST_F(DiskLookup, FindsNothingInAnEmptyList) {
 TEST_F(DiskLookup, FindsNothingForNull) {
     attach(ctrl, newDisk("D0"));
     EXPECT_EQ(FindDiskByDeviceID(ctrl, nullptr), nullptr);
+    EXPECT_EQ(CapturedSyslog::lines(), std::vector<LogLine>{});
 }
 
 TEST_F(DiskLookup, ComparesWholeIDsWithTheirCase) {
@@ -171,7 +173,9 @@ TEST_F(ChassisLookup, SaysWhatIsMissing) {
 TEST_F(ChassisLookup, FindsNothingInAnEmptyListOrForNull) {
     EXPECT_EQ(FindChassisByTag(ctrl, "C0_1"), nullptr);
     EXPECT_EQ(CapturedSyslog::lines(), std::vector<LogLine>{missing("C0_1")});
+    CapturedSyslog::clear();
     EXPECT_EQ(FindChassisByTag(ctrl, nullptr), nullptr);
+    EXPECT_EQ(CapturedSyslog::lines(), std::vector<LogLine>{});
 }
 
 TEST_F(RecordLookup, NoLookUpNeedsMemory) {

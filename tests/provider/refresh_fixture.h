@@ -9,6 +9,7 @@
 
 #include "PlexorProviderCfg.h"
 #include "provider_fixture.h"
+#include "query_arguments.h"
 #include "vendor_objects.h"
 
 namespace plexortest {
@@ -46,6 +47,7 @@ protected:
             if (call.entry != testbed::Entry::Associators) continue;
             found.push_back(call.assocClass.value_or("NULL") + ">" +
                             call.resultClass.value_or("NULL"));
+            EXPECT_TRUE(asksForAll(call)) << found.back();
         }
         return found;
     }

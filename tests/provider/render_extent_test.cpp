@@ -90,6 +90,21 @@ TEST_F(RenderExtent, IsNamedByItsIdAlsoInAKnownEnclosure) {
     EXPECT_EQ(1u, CapturedSyslog::countContaining("FindChassisByTag: found chassis"));
 }
 
+TEST_F(RenderExtent, ItsEnclosureIsLookedUpBeforeItsPool) {
+    attach(ctrl, newChassis("C0_32", "32"));
+    attach(ctrl, newPool("pool0"));
+    setText(disk->Chassis, "C0_32");
+    setText(disk->Pool, "pool0");
+    CapturedSyslog::clear();
+    rows();
+    std::vector<std::string> lookUps;
+    for (const LogLine& line : CapturedSyslog::lines()) {
+        const std::string function = line.text.substr(0, line.text.find(':'));
+        if (lookUps.empty() || lookUps.back() != function) lookUps.push_back(function);
+    }
+    EXPECT_EQ(lookUps, (std::vector<std::string>{"FindChassisByTag", "FindStoragePoolByID"}));
+}
+
 TEST_F(RenderExtent, ManyBlocksAreCounted) {
     disk->NumberOfBlocks = 0xFFFFFFFFFFFFFFFFu;
     EXPECT_EQ("18446744073709551615", valueOf(rows(), "NumberOfBlocks"));

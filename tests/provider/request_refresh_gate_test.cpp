@@ -58,6 +58,20 @@ TEST_F(RequestRefreshGate, BeforeTheInventoryIsDoneAWrongActionIsSkippedToo) {
     EXPECT_TRUE(CapturedSyslog::linesAt(LOG_ERR).empty());
 }
 
+TEST_F(RequestRefreshGate, LooksUnderTheWorkersMutexWhetherTheInventoryIsDone) {
+    ThreadActivityDone = 0;
+    pthread_mutex_lock(&PlexorThreadMutex);
+    auto answer = std::async(std::launch::async, [this] { return request(102); });
+    EXPECT_TRUE(comesTrue([] {
+        return loggedOnce(LOG_DEBUG, "HandleDeviceConfigChange: ENTER. ctrl C0, action 102\n");
+    }));
+    EXPECT_EQ(answer.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
+    ThreadActivityDone = 1;
+    pthread_mutex_unlock(&PlexorThreadMutex);
+    EXPECT_EQ(answer.get(), 0);
+    EXPECT_EQ(queuedItems(), 1u) << "it is done by the time of the look";
+}
+
 TEST_F(RequestRefreshGate, WrongActionsAreIgnored) {
     for (const int action : {106, 107, 99, 0, -1, 1000}) {
         SCOPED_TRACE(action);

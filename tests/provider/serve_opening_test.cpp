@@ -78,6 +78,33 @@ TEST_F(ServeOpening, EveryRequestMovesTheUnloadTime) {
     }
 }
 
+TEST_F(ServeOpening, ThePathIsTracedBeforeTheUnloadTimeMoves) {
+    std::vector<time_t> atLines;
+    CapturedSyslog::onLine([&](const LogLine&) { atLines.push_back(NextUnloadTime); });
+    for (const Operation& operation : allOperations()) {
+        NextUnloadTime = 0;
+        atLines.clear();
+        operation.ask(client(), {"root/cimv2", "No_SuchClass", {}});
+        ASSERT_GE(atLines.size(), 2u) << operation.name;
+        EXPECT_EQ(atLines[0], 0) << operation.name;
+        EXPECT_EQ(atLines[1], kStart + 300) << operation.name;
+    }
+}
+
+TEST_F(ServeOpening, TheExitIsTracedBeforeTheResultIsDone) {
+    smallInventory();
+    std::vector<std::string> lastLines;
+    testbed::FaultRule watch;
+    watch.entry = testbed::Entry::ResultReturnDone;
+    watch.hook = [&] { lastLines.push_back(CapturedSyslog::lines().back().text); };
+    faults().add(watch);
+    for (const Operation& operation : allOperations()) {
+        lastLines.clear();
+        operation.ask(client(), knownPath("Tovexa_PlexorBattery"));
+        EXPECT_EQ(lastLines, std::vector<std::string>{std::string(operation.name) + ": exiting\n"});
+    }
+}
+
 TEST_F(ServeOpening, ARequestClampsTheIdleTime) {
     IdleTimeBeforeTerminating = 25;
     client().enumerateInstanceNames(kController);

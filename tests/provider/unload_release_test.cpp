@@ -84,6 +84,15 @@ TEST_F(UnloadReleaseTest, InventoryThenIdentityThenWorkersThenTheMark) {
     EXPECT_EQ(seen, (std::vector<Glimpse>{{0, true, false, 1}, {0, false, true, 1}}));
 }
 
+TEST_F(UnloadReleaseTest, TheMarkGoesBeforeTheExitIsLogged) {
+    int atExit = -1;
+    CapturedSyslog::onLine([&](const LogLine& line) {
+        if (line.text == "PlexorProviderCleanup: EXIT\n") atExit = initialized();
+    });
+    cleanUp();
+    EXPECT_EQ(atExit, 0);
+}
+
 TEST_F(UnloadReleaseTest, ControllersGoThroughTheListsRelease) {
     cleanUp();
     EXPECT_TRUE(plexortest::loggedInOrder({

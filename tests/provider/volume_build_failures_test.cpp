@@ -60,6 +60,18 @@ TEST_F(VolumeBuildFailures, PoolQueryFailingTurnsTheVolumeAway) {
     EXPECT_EQ(CapturedSyslog::countContaining("found a pool instance"), 0u);
 }
 
+// The pool was not asked for: nothing can be said of the volume, and nothing stays behind.
+TEST_F(VolumeBuildFailures, AStopBeforeThePoolQueryLeavesNothing) {
+    testbed::FaultRule rule = queryRule(Entry::Associators, "CIM_ElementSettingData");
+    rule.hook = [] { QuiesceWorkers(); };
+    faults().add(rule);
+    EXPECT_EQ(buildVolume(), -1);
+    expectNothingCached();
+    EXPECT_EQ(books().count(Entry::AssociatorNames), 0u);
+    EXPECT_EQ(books().liveClones(), 0u);
+    EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
+}
+
 TEST_F(VolumeBuildFailures, PoolQueryAnsweringNullTurnsTheVolumeAway) {
     answerNull(Entry::AssociatorNames, "CIM_AllocatedFromStoragePool");
     expectTurnedAway();
@@ -132,6 +144,26 @@ TEST_F(VolumeBuildFailures, ElementsOfAnotherTypeAreNeverFollowed) {
     rule.wrongType = true;
     faults().add(rule);
     expectTurnedAway();
+}
+
+TEST_F(VolumeBuildFailures, AnElementOfAnotherTypeGivesWayToTheNext) {
+    const VendorVolume other = vendor.volume(card_, "V2", poolPath_, "RAID0");
+    vendor.tie("CIM_ElementSettingData", objects_.volume, other.setting);
+    vendor.tie("CIM_AllocatedFromStoragePool", vendor.pool(card_, "P2"), objects_.volume);
+    const std::pair<const char*, const char*> expected[] = {{"RAID0", "P1"}, {"RAID6", "P2"}};
+    for (int wrong = 0; wrong < 2; wrong++) {
+        testbed::FaultRule rule;
+        rule.entry = Entry::EnumerationGetNext;
+        rule.wrongType = true;
+        rule.skip = wrong;
+        rule.times = 1;
+        faults().clear();
+        faults().add(rule);
+        ASSERT_EQ(buildVolume(), 0);
+        EXPECT_STREQ(volume()->RaidLevel, expected[wrong].first);
+        EXPECT_STREQ(volume()->FromPool, expected[wrong].second);
+        ASSERT_EQ(DeleteVolume(ctrl_, volume()), 0);
+    }
 }
 
 // Allocations.

@@ -1,4 +1,6 @@
 // Broker objects of long-lived threads: after every item nothing but the records' clones is left.
+#include <map>
+
 #include "workers_fixture.h"
 
 namespace plexortest {
@@ -64,6 +66,28 @@ TEST_F(WorkersObjects, AThousandDevicesLeaveTheirClonesOnly) {
     // The test's own context and those of two workers.
     EXPECT_EQ(books().live(testbed::ObjectKind::Context), 3u);
     CapturedSyslog::discard(false);
+}
+
+TEST_F(WorkersObjects, EachWorkerAsksOnTheContextThatItAttachedWith) {
+    addDevices(3);
+    startWorkers();
+    buildInventory();
+    VirtualClock::advance(20);
+    for (const int action : {101, 102, 103, 105}) {
+        ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, action), 0);
+    }
+    ASSERT_TRUE(workersComeToRest());
+    std::map<std::thread::id, const void*> attached;
+    std::size_t asked = 0;
+    for (const testbed::CallRecord& call : books().calls()) {
+        if (call.entry == Entry::AttachThread) attached[call.thread] = call.context;
+        if (!testbed::isQuery(call.entry)) continue;
+        asked++;
+        EXPECT_NE(call.context, nullptr);
+        EXPECT_EQ(call.context, attached[call.thread]) << testbed::entryName(call.entry);
+    }
+    EXPECT_EQ(attached.size(), 2u);
+    EXPECT_GT(asked, 3u + 3 * 8 + 6) << "three walks, the builds' queries, six classes";
 }
 
 TEST_F(WorkersObjects, RefreshesDoNotPileUp) {

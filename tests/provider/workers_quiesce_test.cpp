@@ -88,6 +88,9 @@ TEST_F(WorkersQuiesce, NoItemBeginsUntilWorkIsAdmittedAgain) {
     pthread_cond_broadcast(&PlexorThreadCond);
     const std::size_t looks = HurriedWaits::workWaits().size();
     ASSERT_TRUE(comesTrue([&] { return HurriedWaits::workWaits().size() >= looks + 10; }));
+    const std::size_t idle = idleLines();
+    ASSERT_TRUE(comesTrue([&] { return HurriedWaits::workWaits().size() >= looks + 30; }));
+    EXPECT_EQ(idleLines(), idle) << "not even a worker that looks into the queue by itself";
     EXPECT_EQ(tasks_.ended(), 0);
     EXPECT_EQ(queuedItems(), 1u);
 
@@ -150,7 +153,13 @@ TEST_F(WorkersQuiesce, ARefreshUnderWayAsksNothingMoreAndTouchesNoRecord) {
 }
 
 TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
-    vendor_.port(array_, "P0");
+    const testbed::ObjectPath gone = vendor_.port(array_, "P0");
+    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
+    ASSERT_EQ(ctrl_->PortList->Size, 1u);
+    repository.remove(gone);
+    for (const char* id : {"P1", "P2"}) vendor_.port(array_, id);
+    VirtualClock::advance(100);
+    books().clearCalls();
     setThreadActivityDone(1);
     Gate gate;
     const GateOpener opener(gate);
@@ -158,7 +167,7 @@ TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
     slow.entry = Entry::Associators;
     slow.hook = [&] { gate.pass(); };
     faults().add(slow);
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 101), 0);
+    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
     ASSERT_TRUE(gate.awaitArrivals(1));
 
     auto quiet = std::async(std::launch::async, QuiesceWorkers);
@@ -166,9 +175,10 @@ TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
     gate.open();
     ASSERT_TRUE(quiet.get());
 
-    EXPECT_EQ(associatorQueries(),
-              std::vector<std::string>{"CIM_HostedStoragePool>CIM_StoragePool"});
-    EXPECT_EQ(ctrl_->PortList->Size, 0u);
+    EXPECT_EQ(associatorQueries(), std::vector<std::string>{"CIM_SystemDevice>CIM_SASSATAPort"});
+    EXPECT_TRUE(loggedOnce(LOG_DEBUG, "ProcessDeviceConfigChange, removecount 1, addcount 2\n"));
+    ASSERT_EQ(ctrl_->PortList->Size, 1u);
+    EXPECT_STREQ(static_cast<SASSATAPort_t*>(ctrl_->PortList->Head->Data)->DeviceID, "P0");
 }
 
 TEST_F(WorkersQuiesce, AnInventoryUnderWayIsGivenUp) {

@@ -1,5 +1,6 @@
 // Stopping the workers: who leaves, who stays, and what becomes of the queue.
 #include "real_waits.h"
+#include "watched_calls.h"
 #include "workers_fixture.h"
 
 namespace plexortest {
@@ -141,6 +142,18 @@ TEST_F(WorkersStop, WithoutWorkersItOnlySleeps) {
     EXPECT_EQ(TerminateThread, 1u);
     ASSERT_EQ(VirtualClock::sleeps().size(), 1u);
     EXPECT_EQ(VirtualClock::sleeps()[0].seconds, 3u);
+}
+
+TEST_F(WorkersStop, TheAttributesAreDestroyedAfterTheSleep) {
+    const DestroyWatch watch;
+    int sleeps = 0;
+    VirtualClock::onSleep([&](unsigned int) {
+        sleeps++;
+        EXPECT_EQ(DestroyWatch::destroyed(), std::vector<const void*>{});
+    });
+    CleanupPlexorThreads();
+    EXPECT_EQ(sleeps, 1);
+    EXPECT_EQ(DestroyWatch::destroyed(), std::vector<const void*>{&PlexorThreadAttr});
 }
 
 TEST_F(WorkersStop, BothMarksStaySet) {

@@ -11,6 +11,7 @@ namespace {
 
 // Relaxed, so that reading the clock orders nothing between the threads under test.
 std::atomic<time_t> currentTime{0};
+std::atomic<time_t> step{0};  // added by each reading
 std::mutex mutex;
 std::vector<Sleep> recorded;                  // guarded by mutex
 std::function<void(unsigned int)> sleepHook;  // guarded by mutex
@@ -41,6 +42,10 @@ void VirtualClock::advance(time_t seconds) {
     currentTime.fetch_add(seconds, std::memory_order_relaxed);
 }
 
+void VirtualClock::stepAtEachReading(time_t seconds) {
+    step.store(seconds, std::memory_order_relaxed);
+}
+
 std::vector<Sleep> VirtualClock::sleeps() {
     std::lock_guard lock(mutex);
     return recorded;
@@ -53,6 +58,7 @@ void VirtualClock::onSleep(std::function<void(unsigned int)> hook) {
 
 void VirtualClock::reset(time_t now) {
     set(now);
+    stepAtEachReading(0);
     std::lock_guard lock(mutex);
     recorded.clear();
     sleepHook = nullptr;
@@ -61,7 +67,8 @@ void VirtualClock::reset(time_t now) {
 }  // namespace plexortest
 
 extern "C" time_t time(time_t* out) noexcept {
-    const time_t now = plexortest::VirtualClock::now();
+    const time_t now = plexortest::currentTime.fetch_add(
+        plexortest::step.load(std::memory_order_relaxed), std::memory_order_relaxed);
     if (out != nullptr) *out = now;
     return now;
 }

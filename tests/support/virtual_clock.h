@@ -23,11 +23,14 @@ public:
     static time_t now();
     static void advance(time_t seconds);
 
+    /// From now on every reading of the clock moves it by that afterwards; 0 ends this.
+    static void stepAtEachReading(time_t seconds);
+
     /// Every sleep since the last `reset`, in order.
     static std::vector<Sleep> sleeps();
     /// Called in each sleep on the sleeping thread, before the clock moves; empty for none.
     static void onSleep(std::function<void(unsigned int seconds)> hook);
-    /// Back to `now`, without sleeps and without a hook.
+    /// Back to `now`, without sleeps, hook and steps.
     static void reset(time_t now);
 };
 

@@ -156,6 +156,12 @@ TEST_F(BrokerInstances, UnstorableTypeIsRefused) {
     EXPECT_EQ(set(instance, nullptr, "x", CMPI_chars), CMPI_RC_ERR_INVALID_PARAMETER);
 }
 
+TEST_F(BrokerInstances, NewInstanceOfAKnownClassHasTheKeysOfItsPath) {
+    const CMPIInstance* instance =
+        makers().newInstance(handle(), broker.makePath(drivePath("7")), nullptr);
+    EXPECT_EQ(Broker::toInstance(instance).find("DeviceID")->asString(), "7");
+}
+
 TEST_F(BrokerInstances, NewInstanceOfAKnownClassHasItsDefaults) {
     const CMPIInstance* instance = newDrive();
     EXPECT_EQ(instance->ft->getPropertyCount(instance, nullptr), 5u);
@@ -255,6 +261,38 @@ TEST_F(StrictBrokerInstances, ChecksNamesAndTypesOfKnownClasses) {
     EXPECT_EQ(set(instance, "DeviceID", "text", CMPI_chars), CMPI_RC_OK);
     CMPIInstance* unknown = makers().newInstance(handle(), classPath("CIM_Nothing"), nullptr);
     EXPECT_EQ(set(unknown, "Unheard", &wide, CMPI_uint64), CMPI_RC_OK);
+}
+
+TEST_F(StrictBrokerInstances, ARefusedValueLeavesTheDefault) {
+    CMPIInstance* instance = newDrive();
+    const CMPIUint64 wide = 3;
+    EXPECT_EQ(set(instance, "EnabledState", &wide, CMPI_uint64), CMPI_RC_ERR_TYPE_MISMATCH);
+    EXPECT_EQ(*Broker::toInstance(instance).find("EnabledState"), CimValue::uint16(5));
+}
+
+TEST_F(StrictBrokerInstances, AResultTakesOnlyWhatHasItsKeys) {
+    Broker::Collected collected;
+    const CMPIResult* result = broker.makeResult(collected);
+    const auto giveName = [&](const ObjectPath& path) {
+        return result->ft->returnObjectPath(result, broker.makePath(path)).rc;
+    };
+    const auto giveInstance = [&](const ObjectPath& path) {
+        return result->ft->returnInstance(result, broker.makeInstance({path, {}})).rc;
+    };
+    const ObjectPath keyless{"root/sample", "CIM_Drive", {}};
+    ObjectPath numbered = keyless;
+    numbered.key("deviceid", CimValue::uint64(1));
+    for (const ObjectPath& path : {keyless, numbered}) {
+        EXPECT_EQ(giveName(path), CMPI_RC_ERR_INVALID_PARAMETER);
+        EXPECT_EQ(giveInstance(path), CMPI_RC_ERR_INVALID_PARAMETER);
+    }
+    EXPECT_TRUE(collected.paths.empty());
+    EXPECT_TRUE(collected.instances.empty());
+    EXPECT_EQ(giveName(drivePath("1")), CMPI_RC_OK);
+    EXPECT_EQ(giveInstance(drivePath("1")), CMPI_RC_OK);
+    EXPECT_EQ(giveName({"root/sample", "CIM_Nothing", {}}), CMPI_RC_OK);
+    EXPECT_EQ(collected.paths.size(), 2u);
+    EXPECT_EQ(collected.instances.size(), 1u);
 }
 
 }  // namespace

@@ -95,7 +95,18 @@ TEST_F(BrokerQueries, AssociatorsWithFilters) {
     EXPECT_EQ(record.className, "Sample_Drive");
     EXPECT_EQ(record.assocClass, "cim_cooling");
     EXPECT_EQ(record.resultClass, "cim_fan");
+    EXPECT_EQ(record.role, std::nullopt);
+    EXPECT_EQ(record.resultRole, std::nullopt);
     EXPECT_EQ(record.thread, std::this_thread::get_id());
+    EXPECT_EQ(record.context, context());
+}
+
+TEST_F(BrokerQueries, RolesAreNoted) {
+    calls().associators(handle(), context(), broker.makePath(drivePath("1")), nullptr, nullptr,
+                        "Dependent", "", nullptr, nullptr);
+    const CallRecord record = broker.books().queries().back();
+    EXPECT_EQ(record.role, "Dependent");
+    EXPECT_EQ(record.resultRole, "");
 }
 
 TEST_F(BrokerQueries, UnknownClassesGiveAnEmptyEnumeration) {

@@ -1,6 +1,8 @@
 // Threads of the provider's own, and several threads at once.
 #include <atomic>
 #include <thread>
+#include <utility>
+#include <vector>
 
 #include "broker_fixture.h"
 
@@ -45,6 +47,25 @@ TEST_F(BrokerThreads, AttachedThreadKeepsItsObjectsUntilDetach) {
     });
     expectMisuse("enumeration.hasNext");
     EXPECT_EQ(broker.books().live(ObjectKind::Context), 1u);
+}
+
+TEST_F(BrokerThreads, CallsAreNotedWithTheirContext) {
+    CMPIContext* prepared = prepare();
+    onThread([&] {
+        calls().attachThread(handle(), prepared);
+        query(prepared);
+        calls().detachThread(handle(), prepared);
+    });
+    std::vector<std::pair<Entry, const void*>> noted;
+    for (const CallRecord& call : broker.books().calls())
+        noted.push_back({call.entry, call.context});
+    const std::vector<std::pair<Entry, const void*>> expected = {
+        {Entry::PrepareAttachThread, context()},
+        {Entry::AttachThread, prepared},
+        {Entry::NewObjectPath, nullptr},
+        {Entry::EnumerateInstances, prepared},
+        {Entry::DetachThread, prepared}};
+    EXPECT_EQ(noted, expected);
 }
 
 TEST_F(BrokerThreads, DetachEndsThePreparedContext) {

@@ -1,0 +1,169 @@
+// Where work that is under way looks for a stop: each look ends what it stands in front of. The
+// stop is asked for in the middle of the work, by the same thread.
+#include "reconcile_fixture.h"
+#include "worker_harness.h"
+
+namespace plexortest {
+namespace {
+
+using testbed::FaultRule;
+
+/// Asks for the stop when the n-th line with that beginning is logged.
+class StopAtLine {
+public:
+    explicit StopAtLine(const std::string& beginning, int number = 1) {
+        CapturedSyslog::onLine([this, beginning, number](const LogLine& line) {
+            if (line.text.starts_with(beginning) && ++seen_ == number) {
+                EXPECT_TRUE(QuiesceWorkers());
+            }
+        });
+    }
+    ~StopAtLine() {
+        CapturedSyslog::onLine(nullptr);
+        EXPECT_TRUE(StopRequested()) << "the line never came";
+    }
+    StopAtLine(const StopAtLine&) = delete;
+    StopAtLine& operator=(const StopAtLine&) = delete;
+
+private:
+    int seen_ = 0;
+};
+
+class StopChecks : public ReconcileTest {
+protected:
+    void TearDown() override {
+        AdmitWork();
+        ReconcileTest::TearDown();
+    }
+    /// A rule that asks for the stop while a walk is answered.
+    FaultRule stopDuring(const std::string& resultClass) {
+        FaultRule rule = walkOver(resultClass);
+        rule.hook = [] { EXPECT_TRUE(QuiesceWorkers()); };
+        return rule;
+    }
+    static std::size_t linesWith(const char* part) { return CapturedSyslog::countContaining(part); }
+    /// The initial inventory, on this thread.
+    void buildInventory() {
+        ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
+        DoBuildDeviceInfoAsync(ctx(), GetItem(&__FIFO));
+    }
+};
+
+TEST_F(StopChecks, TheUpdatesOfARefreshEndAtTheRunningOne) {
+    for (const char* id : {"B0", "B1", "B2"}) addBattery(id);
+    process(103);
+    ASSERT_EQ(batteries().size(), 3u);
+    setAllUpdateTimes(0);
+    {
+        const StopAtLine stop("Updating devices[", 2);
+        process(103);
+    }
+    EXPECT_EQ(linesWith("Updating devices["), 2u);
+    EXPECT_EQ(linesWith("CheckAndUpdateBatteryInfo: ENTER."), 2u) << "the running one ends";
+}
+
+TEST_F(StopChecks, TheDeletionsOfARefreshEndAtTheRunningOne) {
+    for (const char* id : {"P0", "P1", "P2"}) addPort(id);
+    process(102);
+    clearVendor();
+    setAllUpdateTimes(0);
+    {
+        const StopAtLine stop("Deleting devices[");
+        process(102);
+    }
+    EXPECT_EQ(ports(), (Ids{"P1", "P2"}));
+}
+
+TEST_F(StopChecks, TheAdditionsOfARefreshEndAtTheRunningOne) {
+    for (const char* id : {"P0", "P1", "P2"}) addPort(id);
+    {
+        const StopAtLine stop("Adding device ops[");
+        process(102);
+    }
+    EXPECT_EQ(ports(), Ids{"P0"});
+}
+
+TEST_F(StopChecks, AWalkThatIsAnsweredDuringTheStopChangesNothing) {
+    const Path gone = addPort("P0");
+    addPort("P1");
+    process(102);
+    repository.remove(gone);
+    addPort("P2");
+    setAllUpdateTimes(0);
+    clearLog();
+    faults().add(stopDuring("CIM_SASSATAPort"));
+    process(102);
+    EXPECT_TRUE(StopRequested());
+    EXPECT_EQ(ports(), (Ids{"P0", "P1"}));
+    EXPECT_TRUE(loggedOnce(LOG_DEBUG, "ProcessDeviceConfigChange, removecount 2, addcount 2\n"))
+        << "the answer was looked at";
+    for (const char* step : {"Updating devices[", "Deleting devices[", "Adding device ops["}) {
+        EXPECT_EQ(linesWith(step), 0u) << step;
+    }
+}
+
+TEST_F(StopChecks, TheChainEndsAtTheRunningClass) {
+    addOneOfEach();
+    faults().add(stopDuring("CIM_StoragePool"));
+    process(101);
+    EXPECT_TRUE(StopRequested());
+    EXPECT_EQ(linesWith(": Action 104, "), 1u);
+    EXPECT_EQ(linesWith(": Action 100, "), 0u);
+    EXPECT_EQ(linesWith(": Action 101, "), 0u);
+    EXPECT_EQ(ctrl_->PoolUpdateTime, kStart);
+    EXPECT_EQ(ctrl_->DiskUpdateTime, 0) << "not even as if it had been tried";
+    EXPECT_EQ(ctrl_->VolumeUpdateTime, 0);
+}
+
+TEST_F(StopChecks, TheDeviceWalkQueuesNothingMore) {
+    for (const char* id : {"P0", "P1", "P2"}) addPort(id);
+    {
+        const StopAtLine stop("Added to FIFO: ", 2);
+        EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
+    }
+    EXPECT_EQ(queuedItems(), 2u);
+    EXPECT_EQ(linesWith("BuildLogicalDeviceInfo: (2)"), 2u);
+}
+
+// Nobody takes anything out of the queue here, so that both waits would go on for ever.
+
+TEST_F(StopChecks, TheWaitForTheQueueToDrainEnds) {
+    addPort("P0");
+    int sleeps = 0;
+    VirtualClock::onSleep([&sleeps](unsigned int) {
+        if (++sleeps == 3) EXPECT_TRUE(QuiesceWorkers());
+        if (sleeps == 50) ReleaseDeviceItem(static_cast<Thread_Args_t*>(GetItem(&__FIFO)));
+    });
+    EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
+    EXPECT_EQ(sleeps, 3);
+    EXPECT_EQ(queuedItems(), 1u);
+}
+
+TEST_F(StopChecks, TheWaitForRoomInTheQueueEndsAndTheDeviceIsDropped) {
+    for (int i = 0; i < 22; i++) addPort("P" + std::to_string(i));
+    int sleeps = 0;
+    VirtualClock::onSleep([&sleeps](unsigned int) {
+        if (++sleeps == 3) EXPECT_TRUE(QuiesceWorkers());
+        if (sleeps >= 50) ReleaseDeviceItem(static_cast<Thread_Args_t*>(GetItem(&__FIFO)));
+    });
+    EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
+    EXPECT_EQ(sleeps, 3);
+    EXPECT_EQ(linesWith("FIFO full, waiting..."), 3u);
+    EXPECT_EQ(queuedItems(), 20u);
+    EXPECT_EQ(books().liveClones(), 1u + 2 * 20) << "the controller's path and the queue's";
+}
+
+TEST_F(StopChecks, TheInventoryEndsWithTheRunningController) {
+    RaidController_t* const second = attach(newController("C1"));
+    second->ControllerOp = clonedPath(vendor_.controller("C1").system);
+    faults().add(stopDuring("CIM_Chassis"));
+    buildInventory();
+    EXPECT_TRUE(StopRequested());
+    EXPECT_EQ(linesWith("BuildPoolInfo, ENTER"), 1u);
+    EXPECT_EQ(second->ControllerUpdateTime, 0);
+    EXPECT_EQ(associatorQueries(),
+              (Ids{"CIM_HostedStoragePool>CIM_StoragePool", "CIM_SystemPackaging>CIM_Chassis"}));
+}
+
+}  // namespace
+}  // namespace plexortest
