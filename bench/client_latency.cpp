@@ -15,7 +15,7 @@
 
 #include "bench_clients.h"
 #include "held_vendor.h"
-#include "polling_option.h"
+#include "polling_interval.h"
 #include "provider_session.h"
 #include "scenario_parser.h"
 #include "vendor_graphs.h"
@@ -140,7 +140,7 @@ int main(int argc, char** argv) {
     CLI11_PARSE(app, argc, argv);
 
     setlogmask(LOG_UPTO(LOG_EMERG));
-    const torture::PollingOption interval(1);
+    const testbed::PollingInterval interval(1);
     try {
         if (bench::run(testbed::readScenario(scenarioFile), library, count, limit))
             return EXIT_SUCCESS;

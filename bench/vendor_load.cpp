@@ -14,7 +14,7 @@
 #include <thread>
 
 #include "bench_clients.h"
-#include "polling_option.h"
+#include "polling_interval.h"
 #include "provider_session.h"
 #include "scenario_parser.h"
 
@@ -142,7 +142,7 @@ int main(int argc, char** argv) {
     CLI11_PARSE(app, argc, argv);
 
     setlogmask(LOG_UPTO(LOG_EMERG));
-    const torture::PollingOption interval(1);
+    const testbed::PollingInterval interval(1);
     try {
         const auto scenario = testbed::readScenario(scenarioFile);
         if (bench::run(scenario, library, std::chrono::seconds(window), clients, tolerance))

@@ -14,7 +14,7 @@
 #include "clients.h"
 #include "fast_clock.h"
 #include "formatted_log.h"
-#include "polling_option.h"
+#include "polling_interval.h"
 #include "process_view.h"
 #include "settlement.h"
 #include "vendor.h"
@@ -192,7 +192,7 @@ int main(int argc, char** argv) {
 
     std::cout << "seed " << settings.seed << ", " << settings.runSeconds << " s, "
               << settings.threads << " clients" << std::endl;
-    const torture::PollingOption interval(1);
+    const testbed::PollingInterval interval(1);
     torture::FastClock::setSpeed(settings.speed);
     const std::size_t failures = torture::ConcurrencyTest(settings).run();
     std::cout << failures << " failures" << std::endl;

@@ -9,7 +9,7 @@
 
 #include "fast_clock.h"
 #include "load_cycle.h"
-#include "polling_option.h"
+#include "polling_interval.h"
 #include "process_view.h"
 #include "scenario_parser.h"
 
@@ -67,7 +67,7 @@ int main(int argc, char** argv) {
         return torture::kSkipped;
     }
     setlogmask(LOG_UPTO(LOG_EMERG));
-    const torture::PollingOption interval(1);
+    const testbed::PollingInterval interval(1);
     torture::FastClock::setSpeed(torture::kSpeed);
     try {
         const testbed::Scenario scenario = testbed::readScenario(scenarioFile);
