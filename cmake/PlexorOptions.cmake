@@ -10,3 +10,12 @@ set(PLEXOR_HOSTCONFIG "" CACHE STRING
     "Library of the host's option store (empty: the file-backed stand-in in cim/hostconfig)")
 set(PLEXOR_SANITIZE "" CACHE STRING "Sanitizers for every target, as -fsanitize takes them")
 option(PLEXOR_COVERAGE "Instrument for coverage" OFF)
+
+# The two builds must not be taken for one another, so their packages have names of their own.
+if(PLEXOR_CONTEXT_FLUSH)
+    set(PLEXOR_PACKAGE plexor-provider)
+    set(PLEXOR_OTHER_PACKAGE plexor-provider-standard)
+else()
+    set(PLEXOR_PACKAGE plexor-provider-standard)
+    set(PLEXOR_OTHER_PACKAGE plexor-provider)
+endif()

@@ -21,6 +21,7 @@ constexpr int kProviderFailed = 3;
 struct CallsOptions {
     std::string scenario;
     std::string library;
+    std::string schema;
     std::string provider = "PlexorProvider";
     unsigned timeoutSeconds = 60;
 };
@@ -60,7 +61,8 @@ std::map<std::string, std::map<std::string, int>> countCalls(ProviderSession& se
 int printCalls(const CallsOptions& options) {
     const Scenario scenario = readScenario(options.scenario);
     directProviderLog(LOG_ERR, nullptr);
-    ProviderSession session(scenario, locateLibrary(options.library), options.provider);
+    ProviderSession session(scenario, locateLibrary(options.library), options.provider,
+                            options.schema);
     if (!session.waitForInventory(std::chrono::seconds(options.timeoutSeconds), "root/cimv2"))
         return kProviderFailed;
     int total = 0;
@@ -86,6 +88,7 @@ void addCallsCommand(CLI::App& app, int& status) {
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")
         ->capture_default_str();
+    command->add_option("--schema", options->schema, "directory of the provider's classes (MOF)");
     command->add_option("--timeout", options->timeoutSeconds, "seconds to wait for the inventory")
         ->capture_default_str();
     command->callback([options, &status] { status = printCalls(*options); });

@@ -6,6 +6,8 @@
 #include <iostream>
 #include <memory>
 
+#include "check_command.h"
+#include "colour.h"
 #include "inventory.h"
 #include "json_view.h"
 #include "library_locator.h"
@@ -28,7 +30,9 @@ struct ShowOptions {
     std::string nameSpace = "root/cimv2";
     unsigned timeoutSeconds = 60;
     bool json = false;
+    CheckOptions check;
     bool log = false;
+    ColourChoice colour;
 };
 
 /// The provider's lines go to standard error too, or are masked as managers mask them.
@@ -56,21 +60,43 @@ bool reportFailures(const Inventory& inventory) {
     return failed;
 }
 
-int show(const ShowOptions& options) {
+/// What the provider has when its inventory is complete, or when time has run out.
+struct Answers {
+    Inventory inventory;
+    bool complete = false;
+};
+
+Answers ask(const ShowOptions& options) {
     const Scenario scenario = readScenario(options.scenario);
     directLog(options.log);
     ProviderSession session(scenario, locateLibrary(options.library), options.provider,
                             options.schema, options.nameSpace);
-    const bool complete =
+    Answers answers;
+    answers.complete =
         session.waitForInventory(std::chrono::seconds(options.timeoutSeconds), options.nameSpace);
-    if (!complete)
-        std::cerr << "plexor-testbed: the inventory is not complete after "
-                  << options.timeoutSeconds << " s\n";
     InstanceClient client = session.client();
-    const Inventory inventory = collectInventory(client, classesToShow(options), options.nameSpace);
-    std::cout << (options.json ? jsonView(inventory) : treeView(inventory)) << std::flush;
+    answers.inventory = collectInventory(client, classesToShow(options), options.nameSpace);
+    return answers;
+}
+
+std::string incomplete(const ShowOptions& options) {
+    return "the inventory is not complete after " + std::to_string(options.timeoutSeconds) + " s";
+}
+
+int show(const ShowOptions& options) {
+    const auto [inventory, complete] = ask(options);
+    if (!complete) std::cerr << "plexor-testbed: " << incomplete(options) << "\n";
+    const bool colours = options.colour.onStandardOutput();
+    std::cout << (options.json ? jsonView(inventory) : treeView(inventory, colours)) << std::flush;
     const bool failed = reportFailures(inventory);
     return complete && !failed ? 0 : kProviderFailed;
+}
+
+int check(const ShowOptions& options) {
+    return printCheck([&] {
+        const auto [inventory, complete] = ask(options);
+        return summarize(inventory, {complete ? "" : incomplete(options), options.check.expected});
+    });
 }
 
 std::vector<std::string> knownClasses() {
@@ -94,9 +120,12 @@ void addShowCommand(CLI::App& app, int& status) {
         ->capture_default_str();
     command->add_option("--timeout", options->timeoutSeconds, "seconds to wait for the inventory")
         ->capture_default_str();
-    command->add_flag("--json", options->json, "print JSON instead of a tree");
+    CLI::Option* json = command->add_flag("--json", options->json, "print JSON instead of a tree");
+    addCheckOptions(*command, options->check)->excludes(json);
+    addColourOption(*command, options->colour);
     command->add_flag("--log", options->log, "print the provider's log lines on standard error");
-    command->callback([options, &status] { status = show(*options); });
+    command->callback(
+        [options, &status] { status = options->check.check ? check(*options) : show(*options); });
 }
 
 }  // namespace testbed

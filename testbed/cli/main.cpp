@@ -3,14 +3,16 @@
 #include <exception>
 #include <iostream>
 
+#include "check_command.h"
+#include "command_ask.h"
 #include "command_calls.h"
+#include "command_serve.h"
 #include "command_show.h"
 #include "command_watch.h"
 
 namespace {
 
 constexpr int kFailed = 1;
-constexpr int kUsage = 2;
 
 }  // namespace
 
@@ -21,10 +23,12 @@ int main(int argc, char** argv) {
     testbed::addShowCommand(app, status);
     testbed::addWatchCommand(app, status);
     testbed::addCallsCommand(app, status);
+    testbed::addAskCommand(app, status);
+    testbed::addServeCommand(app, status);
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& error) {
-        return app.exit(error) == 0 ? 0 : kUsage;
+        return app.exit(error) == 0 ? 0 : testbed::usageStatus(argc, argv);
     } catch (const std::exception& error) {
         std::cerr << "plexor-testbed: " << error.what() << "\n";
         return kFailed;

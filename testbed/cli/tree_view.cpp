@@ -4,6 +4,7 @@
 #include <optional>
 
 #include "cim_words.h"
+#include "colour.h"
 
 namespace testbed {
 namespace {
@@ -34,6 +35,7 @@ std::string textOf(const Instance& instance, const char* property) {
 /// The key that says to which controller an instance belongs, without its prefix.
 std::optional<std::string> identityOf(const Instance& instance, const ServedClass& served) {
     const CimValue* key = instance.path.findKey(served.identityKey);
+    if (!key) key = instance.find(served.identityKey);
     const std::string prefix = served.prefix;
     if (!key || !key->asString().starts_with(prefix)) return std::nullopt;
     return key->asString().substr(prefix.size());
@@ -57,11 +59,17 @@ std::string statesOf(const Instance& instance) {
     return text.empty() ? "" : "  [" + text + "]";
 }
 
-std::string lineOf(const Instance& instance) {
+std::string lineOf(const Instance& instance, const ServedClass& served, bool colours) {
     std::string name = textOf(instance, "VersionString");
     if (name.empty()) name = textOf(instance, "ElementName");
     if (name.empty()) name = instance.path.text();
-    return printable(name + statesOf(instance));
+    const std::string states = statesOf(instance);
+    const auto verdict = colours ? judge(served.name, instance) : std::nullopt;
+    if (!verdict) return printable(name + states);
+    // What is well is not to be louder than what is not.
+    if (verdict->level == CheckLevel::Ok)
+        return printable(name) + painted(printable(states), verdict->level);
+    return painted(printable(name + states), verdict->level);
 }
 
 bool belongsTo(const std::string& identity, const ServedClass& served,
@@ -102,22 +110,22 @@ void countChildren(std::vector<Branch>& sections) {
         branch.text += " (" + std::to_string(branch.children.size()) + ")";
 }
 
-std::vector<Root> controllersOf(const Inventory& inventory) {
+std::vector<Root> controllersOf(const Inventory& inventory, bool colours) {
     std::vector<Root> roots;
     const ServedClass& controllers = servedClasses().front();
     for (const ClassAnswer& answer : inventory) {
         if (!sameName(answer.className, controllers.name)) continue;
         for (const Instance& instance : answer.response.instances)
-            roots.push_back(
-                {identityOf(instance, controllers).value_or(""), {lineOf(instance), {}}});
+            roots.push_back({identityOf(instance, controllers).value_or(""),
+                             {lineOf(instance, controllers, colours), {}}});
     }
     return roots;
 }
 
 }  // namespace
 
-std::string treeView(const Inventory& inventory) {
-    std::vector<Root> roots = controllersOf(inventory);
+std::string treeView(const Inventory& inventory, bool colours) {
+    std::vector<Root> roots = controllersOf(inventory, colours);
     std::vector<Branch> strays;
     for (const ClassAnswer& answer : inventory) {
         const ServedClass* served = findServedClass(answer.className);
@@ -125,7 +133,8 @@ std::string treeView(const Inventory& inventory) {
         for (const Instance& instance : answer.response.instances) {
             Root* owner = ownerOf(roots, instance, *served);
             std::vector<Branch>& parent = owner ? owner->branch.children : strays;
-            section(parent, served->heading).children.push_back({lineOf(instance), {}});
+            section(parent, served->heading)
+                .children.push_back({lineOf(instance, *served, colours), {}});
         }
     }
     std::string out;

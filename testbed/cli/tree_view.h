@@ -7,7 +7,8 @@
 
 namespace testbed {
 
-/// Instances whose controller is not in the inventory come last, by class.
-std::string treeView(const Inventory& inventory);
+/// Instances whose controller is not in the inventory come last, by class. With `colours`, what a
+/// check would say of an element shows in its line.
+std::string treeView(const Inventory& inventory, bool colours = false);
 
 }  // namespace testbed

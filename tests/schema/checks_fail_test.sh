@@ -62,6 +62,10 @@ must_complain check_schema "key devicename of the schema" ${mof}StorageVolume.mo
     's/DeviceID/DeviceName/'
 must_complain check_schema "sets the key Label" cim/plexor/PlexorProviderIfcKeys.cpp \
     's/AddKey\(cop, "InstanceID"/AddKey(cop, "Label"/'
+must_complain check_schema "AddKey does not add strings" cim/plexor/PlexorProviderIfcKeys.cpp \
+    's/\(value\), CMPI_chars/(value), CMPI_uint16/'
+must_complain check_schema "SetNameAndCaption is defined in another file too" ${render}.cpp \
+    's/^void SetStatusAndHealth/void SetNameAndCaption/'
 must_complain check_schema "served, but not in the schema" cim/plexor/PlexorProviderIfcServe.cpp \
     's/\{"Tovexa_PlexorBattery"/{"Tovexa_PlexorCell"/'
 
@@ -70,6 +74,7 @@ must_complain check_schema "the schema says uint32" ${mof}StorageVolume.mof \
     's/uint64 NumberOfBlocks/uint32 NumberOfBlocks/'
 must_complain check_schema "BlockSize is set as uint16, the schema says uint64" \
     ${mof}StorageExtent.mof '/set as uint16/d'
+must_complain check_schema "without a default" ${mof}StorageExtent.mof 's/BlockSize = 512/BlockSize/'
 must_complain check_schema "ExtentStatus is set as uint16[], the schema says uint16" \
     ${mof}StorageVolume.mof 's/ExtentStatus\[\]/ExtentStatus/'
 must_complain check_schema "the provider sets the property Caption" ${mof}Battery.mof \

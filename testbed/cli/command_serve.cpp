@@ -1,0 +1,135 @@
+#include "command_serve.h"
+
+#include <signal.h>
+#include <syslog.h>
+#include <unistd.h>
+
+#include <CLI/CLI.hpp>
+#include <iostream>
+#include <memory>
+
+#include "cim_server.h"
+#include "http_server.h"
+#include "input_lines.h"
+#include "live_session.h"
+#include "provider_log.h"
+#include "stop_signals.h"
+#include "tree_view.h"
+
+namespace testbed {
+namespace {
+
+struct ServeOptions {
+    LiveOptions live;
+    HttpServerOptions http;
+    std::string user;
+    std::string passwordFile;
+    bool log = false;
+};
+
+std::string hostName() {
+    char name[256] = "";
+    gethostname(name, sizeof name - 1);
+    return *name == '\0' ? "localhost" : name;
+}
+
+Registration registrationOf(ProviderSession& session) {
+    Registration registration{session.client(), kServedNamespace, {}};
+    for (const ServedClass& served : servedClasses())
+        registration.classes.emplace_back(served.name);
+    return registration;
+}
+
+std::optional<Credentials> credentialsOf(const ServeOptions& options) {
+    if (options.user.empty()) return std::nullopt;
+    return Credentials{options.user, readPassword(options.passwordFile)};
+}
+
+class Serve : private LiveSession {
+public:
+    Serve(const ServeOptions& options, std::optional<Credentials> credentials,
+          const StopSignals& signals)
+        : LiveSession(options.live),
+          signals_(signals),
+          manager_(session().repository(), registrationOf(session())),
+          cim_(manager_, hostName(), std::move(credentials)),
+          http_(options.http, [this](const HttpRequest& request) { return cim_.answer(request); }),
+          url_(urlOf(options)) {
+        // Nobody asks for the calls, and there is no end to them.
+        session().broker().books().keepCalls(false);
+    }
+
+    void run() {
+        printer().line("serving " + url_);
+        while (!signals_.arrived()) {
+            const auto line = input_.next(std::chrono::seconds(1), signals_.descriptor());
+            if (line && !execute(*line)) return;
+            takeNewFile();
+        }
+    }
+
+private:
+    std::string urlOf(const ServeOptions& options) const {
+        const std::string& address = options.http.address;
+        const bool isIpv6 = address.find(':') != std::string::npos;
+        return "http://" + (isIpv6 ? "[" + address + "]" : address) + ":" +
+               std::to_string(http_.port()) + "/cimom";
+    }
+
+    void show() override { printer().line(treeView(ask())); }
+
+    void wait(int seconds) override {
+        for (int i = 0; i < seconds && !signals_.arrived(); i++) sleep(1);
+    }
+
+    const StopSignals& signals_;
+    InputLines input_;
+    ObjectManager manager_;
+    CimServer cim_;
+    HttpServer http_;
+    std::string url_;
+};
+
+void serve(const ServeOptions& options) {
+    StopSignals signals;
+    // Whoever reads the lines may go away; the clients stay.
+    signal(SIGPIPE, SIG_IGN);
+    directProviderLog(options.log ? LOG_DEBUG : LOG_ERR,
+                      [show = options.log](int, const std::string& line) {
+                          if (show) std::cerr << line << "\n";
+                      });
+    Serve server(options, credentialsOf(options), signals);
+    server.run();
+    // A provider that does not return keeps the server from ending.
+    signals.letNextOneEnd();
+}
+
+}  // namespace
+
+void addServeCommand(CLI::App& app, int& status) {
+    const auto options = std::make_shared<ServeOptions>();
+    CLI::App* command = app.add_subcommand(
+        "serve",
+        "Answers WBEM clients over HTTP (CIM-XML) until it gets a signal or the command quit; "
+        "takes the commands of watch on standard input");
+    addLiveOptions(*command, options->live);
+    command->add_option("--listen", options->http.address, "numeric address to listen on")
+        ->capture_default_str();
+    command->add_option("--port", options->http.port, "port to listen on; 0: any that is free")
+        ->capture_default_str();
+    CLI::Option* user = command->add_option("--user", options->user,
+                                            "the only user who may ask (default: anybody)");
+    CLI::Option* file = command->add_option("--password-file", options->passwordFile,
+                                            "file whose first line is the user's password");
+    user->needs(file);
+    file->needs(user);
+    command->add_option("--interval", options->live.intervalSeconds,
+                        "the provider's polling interval in seconds");
+    command->add_flag("--log", options->log, "print the provider's log lines on standard error");
+    command->callback([options, &status] {
+        serve(*options);
+        status = 0;
+    });
+}
+
+}  // namespace testbed

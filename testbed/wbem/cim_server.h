@@ -1,0 +1,34 @@
+// Answers CIM-XML requests.
+#pragma once
+
+#include <optional>
+#include <string>
+
+#include "credentials.h"
+#include "http_message.h"
+#include "object_manager.h"
+#include "operations.h"
+
+namespace testbed {
+
+class CimServer {
+public:
+    /// `manager` must outlive the server. Without credentials everybody may ask. `host` is told in
+    /// paths when the client does not say what it calls the server.
+    CimServer(const ObjectManager& manager, std::string host,
+              std::optional<Credentials> credentials = {})
+        : manager_(manager), host_(std::move(host)), credentials_(std::move(credentials)) {}
+
+    /// Thread-safe. Does not throw but for lack of memory.
+    HttpResponse answer(const HttpRequest& request) const;
+
+private:
+    HttpResponse answerCall(const HttpRequest& request) const;
+    void carryOut(const CimRequest& request, const std::string& host, pugi::xml_node result) const;
+
+    const ObjectManager& manager_;
+    std::string host_;
+    std::optional<Credentials> credentials_;
+};
+
+}  // namespace testbed

@@ -1,0 +1,30 @@
+// A file descriptor with an owner.
+#pragma once
+
+#include <unistd.h>
+
+#include <utility>
+
+namespace testbed {
+
+class FileDescriptor {
+public:
+    FileDescriptor() = default;
+    explicit FileDescriptor(int number) : number_(number) {}
+    FileDescriptor(FileDescriptor&& other) noexcept : number_(std::exchange(other.number_, -1)) {}
+    FileDescriptor& operator=(FileDescriptor&& other) noexcept {
+        std::swap(number_, other.number_);
+        return *this;
+    }
+    ~FileDescriptor() {
+        if (number_ >= 0) close(number_);
+    }
+
+    int get() const { return number_; }
+    bool isOpen() const { return number_ >= 0; }
+
+private:
+    int number_ = -1;
+};
+
+}  // namespace testbed
