@@ -191,7 +191,7 @@ private:
                 finding.names.size();
         std::string text = " |";
         for (const auto& [noun, count] : counts_)
-            text += " " + std::string(noun->plural) + "=" + std::to_string(count);
+            text.append(" ").append(noun->plural).append("=").append(std::to_string(count));
         return text + " warning=" + std::to_string(warnings) +
                " critical=" + std::to_string(criticals);
     }

@@ -30,7 +30,7 @@ std::string* textToFail = nullptr;
 bool shouldFail(Allocator which, const char* text) {
     if (!armed.load(std::memory_order_acquire)) return false;
     if ((watched & static_cast<unsigned>(which)) == 0) return false;
-    if (textToFail != nullptr && *textToFail != text) return false;
+    if (textToFail != nullptr && (text == nullptr || *textToFail != text)) return false;
     const std::size_t index = seen.fetch_add(1, std::memory_order_relaxed) + 1;
     const bool fails = index == firstToFail || (allFurtherFail && index > firstToFail);
     if (!fails) return false;
