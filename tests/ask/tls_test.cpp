@@ -1,6 +1,7 @@
 // The client against another implementation of HTTP and TLS.
 #include <gtest/gtest.h>
 #include <httplib.h>
+#include <netdb.h>
 #include <openssl/pem.h>
 
 #include "canned_answers.h"
@@ -127,6 +128,12 @@ TEST(Tls, CertificateMustBeTheHosts) {
     const Serving serving(secureServer(identity));
     EXPECT_EQ(failure(urlOf(serving, "https://"), {identity.file, true}),
               "the server's certificate is not trusted: IP address mismatch");
+}
+
+TEST(Tls, CertificateMustBeForTheHostsName) {
+    if (gethostbyname("localhost") == nullptr) GTEST_SKIP() << "nobody knows localhost here";
+    const Identity identity("DNS:other.example.com,IP:127.0.0.2");
+    const Serving serving(secureServer(identity));
     EXPECT_EQ(failure("https://localhost:" + std::to_string(serving.port), {identity.file, true}),
               "the server's certificate is not trusted: hostname mismatch");
 }
