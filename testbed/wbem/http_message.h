@@ -10,17 +10,16 @@ namespace testbed {
 
 using HttpHeaders = std::vector<std::pair<std::string, std::string>>;
 
+/// The first header of that name, without regard to case; NULL when there is none.
+const std::string* findHeader(const HttpHeaders& headers, std::string_view name);
+
 struct HttpRequest {
     std::string method;
     std::string target;
-    int minorVersion = 1;  ///< of HTTP/1.x
     HttpHeaders headers;
     std::string body;
 
-    /// The first header of that name, without regard to case; NULL when there is none.
-    const std::string* header(std::string_view name) const;
-    /// What the client wishes, by the version's default and the header Connection.
-    bool keepsConnection() const;
+    const std::string* header(std::string_view name) const { return findHeader(headers, name); }
 };
 
 struct HttpResponse {
@@ -28,8 +27,5 @@ struct HttpResponse {
     HttpHeaders headers;  ///< without Content-Length and Connection
     std::string body;
 };
-
-/// The response as it travels. `keepConnection` tells the client whether it may ask again.
-std::string httpText(const HttpResponse& response, bool keepConnection);
 
 }  // namespace testbed

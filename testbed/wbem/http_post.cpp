@@ -1,164 +1,234 @@
 #include "http_post.h"
 
-#include <algorithm>
-#include <array>
-#include <charconv>
+#include <openssl/ssl.h>
+#include <openssl/x509v3.h>
 
-#include "cim_object.h"
+#include <boost/asio/co_spawn.hpp>
+#include <boost/asio/io_context.hpp>
+#include <boost/asio/ip/tcp.hpp>
+#include <boost/asio/redirect_error.hpp>
+#include <boost/asio/ssl.hpp>
+#include <boost/asio/use_awaitable.hpp>
+#include <boost/asio/use_future.hpp>
+#include <boost/beast/core/flat_buffer.hpp>
+#include <boost/beast/core/tcp_stream.hpp>
+#include <boost/beast/http.hpp>
+#include <boost/beast/ssl.hpp>
+#include <utility>
 
 namespace testbed {
 namespace {
 
-constexpr std::size_t kLongestLine = 8192;
-constexpr std::size_t kMostHeaders = 200;
-constexpr std::size_t kToTheEnd = static_cast<std::size_t>(-1);
+namespace asio = boost::asio;
+namespace beast = boost::beast;
+namespace http = beast::http;
+namespace ssl = asio::ssl;
+using asio::use_awaitable;
+using asio::ip::tcp;
+using Clock = std::chrono::steady_clock;
+using Parser = http::response_parser<http::string_body>;
+using TlsStream = beast::ssl_stream<beast::tcp_stream&>;
 
-std::string_view trimmed(std::string_view text) {
-    const std::size_t first = text.find_first_not_of(" \t");
-    if (first == std::string_view::npos) return {};
-    return text.substr(first, text.find_last_not_of(" \t") - first + 1);
+constexpr const char* kLate = "no answer in time";
+constexpr std::uint32_t kLargestHead = 64 * 1024;
+constexpr std::size_t kBufferSize = std::size_t{2} * kLargestHead;
+
+bool isOfTls(const beast::error_code& error) {
+    return error.category() == asio::error::get_ssl_category() ||
+           error.category() == ssl::error::get_stream_category();
 }
 
-std::size_t numberIn(std::string_view text, int base, const char* what) {
-    std::size_t number = 0;
-    const char* end = text.data() + text.size();
-    const auto [stop, error] = std::from_chars(text.data(), end, number, base);
-    if (error != std::errc() || stop != end || number == kToTheEnd)
-        throw WbemError(std::string("no HTTP: a bad ") + what);
-    return number;
+[[noreturn]] void failTls(const beast::error_code& error) {
+    const bool cut = error == ssl::error::stream_truncated || error == asio::error::eof;
+    throw WbemError("TLS failed: " + (cut ? "the connection was cut" : error.message()));
 }
 
-/// An answer as it arrives.
-class AnswerReader {
+/// Throws what a failed step means; `what` is for an error of the connection.
+[[noreturn]] void fail(const std::string& what, const beast::error_code& error) {
+    if (error == beast::error::timeout) throw WbemError(kLate);
+    if (isOfTls(error)) failTls(error);
+    throw WbemError(what + ": " + error.message());
+}
+
+ssl::context contextFor(const TlsOptions& options) {
+    ssl::context context(ssl::context::tls_client);
+    SSL_CTX_set_min_proto_version(context.native_handle(), TLS1_2_VERSION);
+    if (!options.verify) return context;
+    context.set_verify_mode(ssl::verify_peer);
+    beast::error_code error;
+    if (options.authorities.empty())
+        context.set_default_verify_paths(error);
+    else
+        context.load_verify_file(options.authorities, error);
+    if (error) throw WbemError(options.authorities + ": no certificates: " + error.message());
+    return context;
+}
+
+/// OpenSSL compares the name itself, so that its verdict tells what is wrong.
+void expectHost(SSL* session, const std::string& host, bool verify) {
+    beast::error_code error;
+    asio::ip::make_address(host, error);
+    const bool isAddress = !error;
+    if (!isAddress) SSL_set_tlsext_host_name(session, host.c_str());
+    if (!verify) return;
+    if (isAddress)
+        X509_VERIFY_PARAM_set1_ip_asc(SSL_get0_param(session), host.c_str());
+    else
+        SSL_set1_host(session, host.c_str());
+}
+
+http::request<http::string_body> messageFrom(const PostRequest& request) {
+    http::request<http::string_body> message(http::verb::post, request.path, 11);
+    message.set(http::field::host, request.authority);
+    message.keep_alive(false);
+    for (const auto& [name, value] : request.headers) message.insert(name, value);
+    message.body() = request.body;
+    message.prepare_payload();
+    return message;
+}
+
+PostAnswer answerFrom(http::response<http::string_body> message) {
+    PostAnswer answer{
+        static_cast<int>(message.result_int()), std::string(message.reason()), {}, {}};
+    for (const auto& field : message)
+        answer.headers.emplace_back(field.name_string(), field.value());
+    answer.body = std::move(message.body());
+    return answer;
+}
+
+class Post {
 public:
-    AnswerReader(ByteStream& stream, std::size_t largestBody)
-        : stream_(stream), largestBody_(largestBody) {}
+    Post(const PostRequest& request, const PostBounds& bounds)
+        : request_(request), bounds_(bounds) {}
 
-    PostAnswer read() {
-        PostAnswer answer;
-        do {
-            answer = PostAnswer();
-            readStatus(answer);
-            readHeaders(answer.headers);
-        } while (answer.status / 100 == 1);  // the real one follows
-        readBody(answer);
-        return answer;
+    PostAnswer run() {
+        auto answer = asio::co_spawn(io_, exchange(), asio::use_future);
+        io_.run();
+        return answer.get();
     }
 
 private:
-    bool fill() {
-        if (next_ < size_) return true;
-        next_ = 0;
-        size_ = stream_.read(buffer_.data(), buffer_.size());
-        return size_ > 0;
+    asio::awaitable<PostAnswer> exchange() {
+        co_await connect();
+        stream_->expires_at(bounds_.deadline);
+        if (!request_.tls) co_return co_await ask(*stream_);
+        ssl::context context = contextFor(*request_.tls);
+        TlsStream secure(*stream_, context);
+        expectHost(secure.native_handle(), request_.host, request_.tls->verify);
+        co_await shakeHands(secure);
+        co_return co_await ask(secure);
     }
 
-    std::string readLine() {
-        std::string line;
-        for (;;) {
-            if (!fill())
-                throw WbemError(started_ ? "the answer ends early" : "the server sent no answer");
-            started_ = true;
-            const char c = buffer_[next_++];
-            if (c == '\n') break;
-            line += c;
-            if (line.size() > kLongestLine) throw WbemError("no HTTP: a line without an end");
+    tcp::resolver::results_type addresses() {
+        beast::error_code error;
+        auto found =
+            tcp::resolver(io_).resolve(request_.host, std::to_string(request_.port), error);
+        if (error) throw WbemError("the host is not known: " + error.message());
+        return found;
+    }
+
+    /// Tries the host's addresses one after the other.
+    asio::awaitable<void> connect() {
+        const auto found = addresses();
+        std::size_t left = found.size();
+        beast::error_code error;
+        for (const auto& address : found) {
+            stream_.emplace(io_);
+            stream_->expires_at(deadlineWith(--left));
+            co_await stream_->async_connect(address.endpoint(),
+                                            asio::redirect_error(use_awaitable, error));
+            if (!error) co_return;
         }
-        if (line.ends_with('\r')) line.pop_back();
-        return line;
+        if (error == beast::error::timeout) error = asio::error::timed_out;
+        throw WbemError("no connection: " + error.message());
     }
 
-    void readStatus(PostAnswer& answer) {
-        const std::string line = readLine();
-        const std::string_view text = line;
-        if (!text.starts_with("HTTP/1.") || text.size() < 12 || text[8] != ' ')
-            throw WbemError("the answer is no HTTP");
-        answer.status = static_cast<int>(numberIn(text.substr(9, 3), 10, "status"));
-        answer.reason = trimmed(text.substr(12));
+    /// An address that never answers must leave time for the others.
+    Deadline deadlineWith(std::size_t others) const {
+        const Deadline now = Clock::now();
+        return others == 0 || now >= bounds_.deadline ? bounds_.deadline
+                                                      : now + (bounds_.deadline - now) / 2;
     }
 
-    void readHeaders(HttpHeaders& headers) {
-        for (std::string line = readLine(); !line.empty(); line = readLine()) {
-            const std::size_t colon = std::min(line.find(':'), line.size());
-            const std::string_view text = line;
-            headers.emplace_back(trimmed(text.substr(0, colon)),
-                                 trimmed(text.substr(std::min(colon + 1, text.size()))));
-            if (headers.size() > kMostHeaders) throw WbemError("no HTTP: too many headers");
-        }
+    asio::awaitable<void> shakeHands(TlsStream& stream) {
+        beast::error_code error;
+        co_await stream.async_handshake(ssl::stream_base::client,
+                                        asio::redirect_error(use_awaitable, error));
+        if (!error) co_return;
+        const long verdict = SSL_get_verify_result(stream.native_handle());
+        if (verdict != X509_V_OK)
+            throw WbemError("the server's certificate is not trusted: " +
+                            std::string(X509_verify_cert_error_string(verdict)));
+        if (error == beast::error::timeout) throw WbemError(kLate);
+        failTls(error);
     }
 
-    void readBody(PostAnswer& answer) {
-        const std::string& coding = answer.header("Content-Encoding");
-        if (!coding.empty() && !sameName(coding, "identity"))
+    template <class Stream>
+    asio::awaitable<PostAnswer> ask(Stream& stream) {
+        const http::request<http::string_body> message = messageFrom(request_);
+        beast::error_code error;
+        co_await http::async_write(stream, message, asio::redirect_error(use_awaitable, error));
+        if (error) fail("the server takes no request", error);
+        std::optional<Parser> parser;
+        do {
+            parser.emplace();
+            parser->header_limit(kLargestHead);
+            parser->body_limit(bounds_.largestBody);
+            while (!parser->is_header_done()) co_await readSome(stream, *parser);
+        } while (parser->get().result_int() / 100 == 1);  // the real one follows
+        refuseCodings(*parser);
+        while (!parser->is_done()) co_await readSome(stream, *parser);
+        co_return answerFrom(parser->release());
+    }
+
+    template <class Stream>
+    asio::awaitable<void> readSome(Stream& stream, Parser& parser) {
+        // The stream's own deadline does not stop a peer whose bytes are always there already.
+        if (Clock::now() >= bounds_.deadline) throw WbemError(kLate);
+        beast::error_code error;
+        co_await http::async_read_some(stream, buffer_, parser,
+                                       asio::redirect_error(use_awaitable, error));
+        if (error) failRead(error);
+    }
+
+    [[noreturn]] void failRead(const beast::error_code& error) const {
+        if (error == http::error::body_limit)
+            throw WbemError("the answer has more than " + std::to_string(bounds_.largestBody) +
+                            " bytes");
+        if (error == http::error::end_of_stream) throw WbemError("the server sent no answer");
+        if (error == http::error::partial_message) throw WbemError("the answer ends early");
+        if (error.category() == make_error_code(http::error::bad_version).category())
+            throw WbemError("the answer is no HTTP: " + error.message());
+        fail("the server closed the connection", error);
+    }
+
+    static void refuseCodings(const Parser& parser) {
+        const auto& message = parser.get();
+        const auto coding = message.find(http::field::content_encoding);
+        if (coding != message.end() && !beast::iequals(coding->value(), "identity"))
             throw WbemError("the answer is compressed, which was not asked for");
-        const std::string& transfer = answer.header("Transfer-Encoding");
-        const std::string& length = answer.header("Content-Length");
-        if (answer.status == 204 || answer.status == 304) return;
-        if (!transfer.empty() && !sameName(transfer, "identity"))
-            readChunks(answer.body);
-        else if (!length.empty())
-            append(answer.body, numberIn(length, 10, "length"));
-        else
-            append(answer.body, kToTheEnd);
+        const auto transfer = message.find(http::field::transfer_encoding);
+        if (transfer != message.end() && !beast::iequals(transfer->value(), "chunked") &&
+            !beast::iequals(transfer->value(), "identity"))
+            throw WbemError("the answer comes in a form that was not asked for");
     }
 
-    void readChunks(std::string& body) {
-        for (;;) {
-            const std::string line = readLine();
-            const std::size_t end = std::min(line.find(';'), line.size());
-            const std::string_view digits = trimmed(std::string_view(line).substr(0, end));
-            const std::size_t size = numberIn(digits, 16, "chunk");
-            if (size == 0) return;  // trailers say nothing of use
-            append(body, size);
-            if (!readLine().empty()) throw WbemError("no HTTP: a chunk of another size");
-        }
-    }
-
-    /// `size` bytes, or all that come.
-    void append(std::string& body, std::size_t size) {
-        if (size != kToTheEnd && size > largestBody_ - body.size()) refuseSize();
-        while (size > 0) {
-            if (!fill()) {
-                if (size == kToTheEnd) return;
-                throw WbemError("the answer ends early");
-            }
-            const std::size_t count = std::min(size_ - next_, size);
-            if (count > largestBody_ - body.size()) refuseSize();
-            body.append(buffer_.data() + next_, count);
-            next_ += count;
-            if (size != kToTheEnd) size -= count;
-        }
-    }
-
-    [[noreturn]] void refuseSize() const {
-        throw WbemError("the answer has more than " + std::to_string(largestBody_) + " bytes");
-    }
-
-    ByteStream& stream_;
-    std::size_t largestBody_;
-    std::array<char, 16384> buffer_;
-    std::size_t next_ = 0;
-    std::size_t size_ = 0;
-    bool started_ = false;
+    const PostRequest& request_;
+    const PostBounds& bounds_;
+    asio::io_context io_{1};
+    std::optional<beast::tcp_stream> stream_;
+    beast::flat_buffer buffer_{kBufferSize};
 };
 
 }  // namespace
 
-const std::string& PostAnswer::header(std::string_view name) const {
-    static const std::string none;
-    for (const auto& [known, value] : headers)
-        if (sameName(known, name)) return value;
-    return none;
+std::string PostAnswer::header(std::string_view name) const {
+    const std::string* value = findHeader(headers, name);
+    return value ? *value : "";
 }
 
-PostAnswer httpPost(ByteStream& stream, const PostRequest& request, std::size_t largestBody) {
-    std::string text =
-        "POST " + request.path + " HTTP/1.1\r\nHost: " + request.host +
-        "\r\nConnection: close\r\nContent-Length: " + std::to_string(request.body.size()) + "\r\n";
-    for (const auto& [name, value] : request.headers) text += name + ": " + value + "\r\n";
-    text += "\r\n" + request.body;
-    stream.write(text);
-    return AnswerReader(stream, largestBody).read();
+PostAnswer httpPost(const PostRequest& request, const PostBounds& bounds) {
+    return Post(request, bounds).run();
 }
 
 }  // namespace testbed

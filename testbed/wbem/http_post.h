@@ -1,13 +1,40 @@
 // One HTTP request, and its answer within bounds.
 #pragma once
 
+#include <chrono>
+#include <cstddef>
+#include <optional>
 #include <string>
 #include <string_view>
 
-#include "byte_stream.h"
 #include "http_message.h"
+#include "wbem_error.h"
 
 namespace testbed {
+
+using Deadline = std::chrono::steady_clock::time_point;
+
+/// How the server's certificate is judged.
+struct TlsOptions {
+    std::string authorities;  ///< file with certificates to trust; "" for the system's
+    bool verify = true;
+};
+
+struct PostRequest {
+    std::string host;  ///< a name or a numeric address
+    unsigned short port = 0;
+    std::optional<TlsOptions> tls;  ///< plain HTTP without
+    std::string authority;          ///< for the header Host
+    std::string path;
+    HttpHeaders headers;
+    std::string body;
+};
+
+/// What the answer may take.
+struct PostBounds {
+    Deadline deadline = Deadline::max();
+    std::size_t largestBody = 0;  ///< bytes
+};
 
 struct PostAnswer {
     int status = 0;
@@ -16,18 +43,12 @@ struct PostAnswer {
     std::string body;
 
     /// The first header of that name, without regard to case; "" without one.
-    const std::string& header(std::string_view name) const;
+    std::string header(std::string_view name) const;
 };
 
-struct PostRequest {
-    std::string host;  ///< for the header Host
-    std::string path;
-    HttpHeaders headers;
-    std::string body;
-};
-
-/// Posts the request and reads the answer; the server is asked to close afterwards. Throws
-/// WbemError for an answer that is no HTTP, ends early, or has a body beyond `largestBody` bytes.
-PostAnswer httpPost(ByteStream& stream, const PostRequest& request, std::size_t largestBody);
+/// Posts the request on a connection of its own and reads the answer. Looking the host up is not
+/// bounded by the deadline. Throws WbemError for a server that cannot be reached or not be trusted,
+/// and for an answer that is no HTTP, ends early, or is beyond the bounds.
+PostAnswer httpPost(const PostRequest& request, const PostBounds& bounds);
 
 }  // namespace testbed

@@ -5,23 +5,29 @@
 // many, the one that has kept the server waiting the longest is closed for a new one.
 #pragma once
 
-#include <atomic>
 #include <chrono>
+#include <cstddef>
 #include <cstdint>
 #include <functional>
-#include <map>
 #include <memory>
-#include <mutex>
 #include <string>
-#include <thread>
-#include <vector>
 
-#include "file_descriptor.h"
-#include "http_connection.h"
 #include "http_message.h"
-#include "worker_pool.h"
 
 namespace testbed {
+
+struct HttpLimits {
+    std::size_t head = 16 * 1024;   ///< bytes of request line and headers
+    std::size_t body = 256 * 1024;  ///< bytes
+};
+
+/// What a client may take, from the first byte to the last, however it spreads them.
+struct HttpTimes {
+    std::chrono::milliseconds request{10'000};
+    std::chrono::milliseconds idle{30'000};      ///< between two requests
+    std::chrono::milliseconds response{30'000};  ///< to take a response
+    std::chrono::milliseconds drain{2'000};      ///< to stop sending after a refusal
+};
 
 struct HttpServerOptions {
     std::string address = "127.0.0.1";  ///< a numeric address, IPv4 or IPv6
@@ -44,41 +50,11 @@ public:
     HttpServer(const HttpServer&) = delete;
     HttpServer& operator=(const HttpServer&) = delete;
 
-    std::uint16_t port() const { return port_; }
+    std::uint16_t port() const;
 
 private:
-    struct Answer {
-        std::uint64_t connection;
-        HttpResponse response;
-    };
-    using Connections = std::map<std::uint64_t, HttpConnection>;
-
-    void run();
-    void acceptAll();
-    bool makeRoom();
-    void add(FileDescriptor socket);
-    void handle(std::uint64_t id, std::uint32_t events);
-    /// Hands a complete request to a worker, arms the socket for what is awaited, or closes.
-    void follow(Connections::iterator position);
-    void work(std::uint64_t id, const HttpRequest& request);
-    void deliverAnswers();
-    void closeLate();
-
-    HttpServerOptions options_;
-    Handler handler_;
-    FileDescriptor listener_;
-    FileDescriptor epoll_;
-    FileDescriptor wake_;  // an eventfd: an answer is there, or the server stops
-    std::uint16_t port_ = 0;
-    std::atomic<bool> stopping_ = false;
-
-    std::uint64_t nextId_ = 2;  // the I/O thread's, as connections_; 0 and 1 are not connections
-    Connections connections_;
-
-    std::mutex answersMutex_;
-    std::vector<Answer> answers_;  // guarded by answersMutex_
-    std::unique_ptr<WorkerPool> pool_;
-    std::thread thread_;
+    class Engine;
+    std::unique_ptr<Engine> engine_;
 };
 
 }  // namespace testbed

@@ -5,7 +5,6 @@
 
 #include "cim_xml_read.h"
 #include "cim_xml_write.h"
-#include "http_post.h"
 #include "xml_text.h"
 
 namespace testbed {
@@ -141,9 +140,10 @@ WbemClient::WbemClient(WbemUrl url, WbemClientOptions options)
 
 std::string WbemClient::post(const std::string& method, const std::string& nameSpace,
                              const std::string& body) const {
-    auto stream = connectTcp(url_.host, url_.port, options_.deadline);
-    if (url_.tls) stream = startTls(std::move(stream), url_.host, options_.tls);
-    PostRequest request{url_.authority(),
+    PostRequest request{url_.host,
+                        url_.port,
+                        url_.tls ? std::optional(options_.tls) : std::nullopt,
+                        url_.authority(),
                         url_.path,
                         {{"Content-Type", "application/xml; charset=\"utf-8\""},
                          {"Accept", "application/xml, text/xml"},
@@ -154,7 +154,7 @@ std::string WbemClient::post(const std::string& method, const std::string& nameS
     if (const auto& known = url_.credentials)
         request.headers.emplace_back("Authorization",
                                      "Basic " + base64(known->user + ":" + known->password));
-    PostAnswer answer = httpPost(*stream, request, options_.largestAnswer);
+    PostAnswer answer = httpPost(request, {options_.deadline, options_.largestAnswer});
     if (answer.status != 200) refuse(answer);
     return std::move(answer.body);
 }

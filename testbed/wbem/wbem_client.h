@@ -4,7 +4,7 @@
 #include <pugixml.hpp>
 #include <string>
 
-#include "byte_stream.h"
+#include "http_post.h"
 #include "instance_client.h"
 #include "wbem_url.h"
 

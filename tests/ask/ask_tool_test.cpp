@@ -181,7 +181,7 @@ TEST_F(Ask, CheckIsUnknownWithoutAnAnswer) {
     always(whole.substr(0, whole.size() - 20));
     expectUnknown(check(), "the answer ends early");
     always("HTTP/1.1 200 " + std::string(5'000'000, 'A') + "\r\n\r\n");
-    expectUnknown(check(), "a line without an end");
+    expectUnknown(check(), "the answer is no HTTP: ");
     always(http(cimError(5, "no | such\nclass")));
     expectUnknown(check(),
                   "Tovexa_PlexorController and 5 more answered with status 5 (no / such class) |");
