@@ -247,16 +247,16 @@ TEST_F(ControllerFailures, ElementOfAnotherTypeCostsAtMostItsController) {
 
 TEST_F(ControllerFailures, EnumerationThatFailsEndsItsWalk) {
     addTwo();
-    const std::string second = "Model C1 FW-C1 BIOS-C1 DRV-C1 PKG-C1 5 2";
+    const std::string onlySecond = "Model C1 FW-C1 BIOS-C1 DRV-C1 PKG-C1 5 2";
     // In the order above; the eighth is the second port controller.
     const Texts expected[] = {
         {},
-        {second},
-        {"absent FW-C0 BIOS-C0 DRV-C0 PKG-C0 0 2", second},
-        {"Model C0 absent absent absent absent 5 2", second},
-        {"Model C0 FW-C0 absent absent absent 5 2", second},
-        {"Model C0 FW-C0 BIOS-C0 absent absent 5 2", second},
-        {"Model C0 FW-C0 BIOS-C0 DRV-C0 absent 5 2", second},
+        {onlySecond},
+        {"absent FW-C0 BIOS-C0 DRV-C0 PKG-C0 0 2", onlySecond},
+        {"Model C0 absent absent absent absent 5 2", onlySecond},
+        {"Model C0 FW-C0 absent absent absent 5 2", onlySecond},
+        {"Model C0 FW-C0 BIOS-C0 absent absent 5 2", onlySecond},
+        {"Model C0 FW-C0 BIOS-C0 DRV-C0 absent 5 2", onlySecond},
         {"Model C0 FW-C0 BIOS-C0 DRV-C0 PKG-C0 5 2"},
     };
     for (std::size_t good = 0; good < std::size(expected); good++) {

@@ -131,7 +131,8 @@ TEST_F(StopChecks, TheWaitForTheQueueToDrainEnds) {
     addPort("P0");
     int sleeps = 0;
     VirtualClock::onSleep([&sleeps](unsigned int) {
-        if (++sleeps == 3) EXPECT_TRUE(QuiesceWorkers());
+        sleeps++;
+        EXPECT_TRUE(sleeps != 3 || QuiesceWorkers());
         if (sleeps == 50) ReleaseDeviceItem(static_cast<Thread_Args_t*>(GetItem(&__FIFO)));
     });
     EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
@@ -143,7 +144,8 @@ TEST_F(StopChecks, TheWaitForRoomInTheQueueEndsAndTheDeviceIsDropped) {
     for (int i = 0; i < 22; i++) addPort("P" + std::to_string(i));
     int sleeps = 0;
     VirtualClock::onSleep([&sleeps](unsigned int) {
-        if (++sleeps == 3) EXPECT_TRUE(QuiesceWorkers());
+        sleeps++;
+        EXPECT_TRUE(sleeps != 3 || QuiesceWorkers());
         if (sleeps >= 50) ReleaseDeviceItem(static_cast<Thread_Args_t*>(GetItem(&__FIFO)));
     });
     EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
