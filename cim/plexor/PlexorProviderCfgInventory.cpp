@@ -1,0 +1,84 @@
+// The initial inventory: one work item that walks every controller, and the gate that keeps
+// refreshes back until it is done.
+#include <stdlib.h>
+
+#include <atomic>
+
+#include "PlexorProviderCfg.h"
+#include "PlexorProviderLock.h"
+
+unsigned int ThreadActivityDone = 0;
+
+namespace {
+
+std::atomic<unsigned int> __DoneLife = 0;  // whose inventory set ThreadActivityDone; 0: unknown
+
+/// One moment for all classes, so that all become due together.
+void StampAll(RaidController_t* ctrl) {
+    const time_t now = time(nullptr);
+    StoreTime(ctrl->BatteryUpdateTime, now);
+    StoreTime(ctrl->PortUpdateTime, now);
+    StoreTime(ctrl->DiskUpdateTime, now);
+    StoreTime(ctrl->VolumeUpdateTime, now);
+    StoreTime(ctrl->PoolUpdateTime, now);
+    StoreTime(ctrl->ChassisUpdateTime, now);
+    StoreTime(ctrl->ControllerUpdateTime, now);
+}
+
+/// Opens the gate, unless a later life has closed it for itself.
+void OpenGate() {
+    MutexGuard lock(PlexorThreadMutex);
+    if (LifeIsOver()) return;
+    ThreadActivityDone = 1;
+    __DoneLife = PresentLife();
+    pthread_cond_broadcast(&PlexorThreadCond);
+}
+
+}  // namespace
+
+void CloseInventoryGate() {
+    // A word that has been reset is nobody's any more.
+    if (__atomic_load_n(&ThreadActivityDone, __ATOMIC_RELAXED) == 0) __DoneLife = 0;
+}
+
+bool InventoryDone() {
+    MutexGuard lock(PlexorThreadMutex);
+    return ThreadActivityDone != 0 && (__DoneLife == 0 || __DoneLife == PresentLife());
+}
+
+int BuildDeviceInfoAsync(const CMPIInstanceMI* mi, const CMPIContext*) {
+    auto* item = NewRecord<Thread_Args_t>();
+    if (item == nullptr) {
+        syslog(LOG_ERR, "%s, failed to allocate threadArgs\n", __func__);
+        return RESULT_NO_MEMORY;
+    }
+    item->Func = DoBuildDeviceInfoAsync;
+    item->Arg0 = reinterpret_cast<uintptr_t>(mi);
+    const int rc = PutItem(&__FIFO, item);
+    if (rc == RESULT_FIFO_FULL) {
+        free(item);
+        syslog(LOG_ERR, "%s, failed to put threadArgs in FIFO\n", __func__);
+        return rc;
+    }
+    if (rc != RESULT_OK) free(item);
+    pthread_cond_signal(&PlexorThreadCond);
+    return rc;
+}
+
+void DoBuildDeviceInfoAsync(CMPIContext* ctx, void* args) {
+    auto* item = static_cast<Thread_Args_t*>(args);
+    auto* mi = reinterpret_cast<const CMPIInstanceMI*>(item->Arg0);
+    free(item);
+
+    const List_Entry_t* entry = StopRequested() ? nullptr : RaidControllerList->Head;
+    for (; entry != nullptr && !StopRequested(); entry = entry->Next) {
+        auto* ctrl = static_cast<RaidController_t*>(entry->Data);
+        if (ctrl == nullptr) continue;
+        BuildPoolInfo(mi, ctx, ctrl);
+        BuildChassisInfo(mi, ctx, ctrl);
+        BuildLogicalDeviceInfo(mi, ctx, ctrl);
+        StampAll(ctrl);
+    }
+    OpenGate();
+    syslog(LOG_DEBUG, "%s done.", __func__);
+}

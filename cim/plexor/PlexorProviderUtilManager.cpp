@@ -1,0 +1,132 @@
+// What differs between object managers, in one place.
+#include "PlexorProviderUtilManager.h"
+
+#include <atomic>
+
+#include "PlexorProviderUtil.h"
+#include "PlexorProviderUtilLife.h"
+
+// Exported by one manager for providers whose context table has no flush; does the same for the
+// calling thread. Elsewhere the weak reference stays null.
+extern "C" void tool_mm_flush(void) __attribute__((weak));
+
+namespace {
+
+#if defined(PLEXOR_CONTEXT_FLUSH) && PLEXOR_CONTEXT_FLUSH
+
+std::atomic<bool> __FlushMissed = false;
+
+/// True after a flush by the context's own entry. The build for a host that has the entry may be
+/// loaded by a manager that has not; that is said once.
+bool FlushByEntry(CMPIContext* ctx) {
+    if (ctx->ft->flush != nullptr) {
+        ctx->ft->flush(ctx);
+        return true;
+    }
+    if (!__FlushMissed.exchange(true)) {
+        syslog(LOG_ERR,
+               "%s: the manager's context table has no flush: this build of the provider is for "
+               "another manager\n",
+               "PlexorProvider");
+    }
+    return false;
+}
+
+bool HasFlushEntry(const CMPIContext* ctx) {
+    return ctx->ft->flush != nullptr;
+}
+
+/// Whether this manager is one of those that the standard build is for.
+bool IsStandardManager() {
+    return __FlushMissed;
+}
+
+#else
+
+bool FlushByEntry(CMPIContext*) {
+    return false;
+}
+
+bool HasFlushEntry(const CMPIContext*) {
+    return false;
+}
+
+bool IsStandardManager() {
+    return true;
+}
+
+#endif
+
+bool ReadsNull(const CMPIInstance* inst, const char* property) {
+    CMPIStatus status = {CMPI_RC_OK, nullptr};
+    const CMPIData data = inst->ft->getProperty(inst, property, &status);
+    return status.rc != CMPI_RC_OK || (data.state & CMPI_nullValue) != 0;
+}
+
+/// Sets key number `index` where the instance lacks it. False when it was there already.
+bool CompleteKey(CMPIInstance* inst, const CMPIObjectPath* path, unsigned int index) {
+    CMPIString* name = nullptr;
+    CMPIStatus status = {CMPI_RC_OK, nullptr};
+    const CMPIData key = path->ft->getKeyAt(path, index, &name, &status);
+    const char* property = StringText(name);
+    if (status.rc != CMPI_RC_OK || property == nullptr || !ReadsNull(inst, property)) return false;
+    const char* text = ValueText(key);
+    if (text == nullptr) return true;
+    // CMPI_chars values are passed as the address of the characters.
+    inst->ft->setProperty(inst, property, reinterpret_cast<const CMPIValue*>(text), CMPI_chars);
+    return true;
+}
+
+}  // namespace
+
+ItemSpan::ItemSpan(CMPIContext* workerContext) : worker_(workerContext) {
+    if (worker_ == nullptr || HasFlushEntry(worker_) || tool_mm_flush != nullptr) return;
+    const CMPIBroker* broker = CurrentBroker();
+    own_ = broker->bft->prepareAttachThread(broker, worker_);
+    if (own_ != nullptr) broker->bft->attachThread(broker, own_);
+}
+
+void ItemSpan::End() {
+    if (own_ != nullptr) {
+        const CMPIBroker* broker = CurrentBroker();
+        broker->bft->detachThread(broker, own_);
+        own_ = nullptr;
+        return;
+    }
+    if (worker_ == nullptr || FlushByEntry(worker_)) return;
+    if (tool_mm_flush != nullptr) tool_mm_flush();
+}
+
+void FlushFactoryContext(CMPIContext* ctx) {
+    if (ctx != nullptr) FlushByEntry(ctx);
+}
+
+void EndUnusedContext(CMPIContext* prepared) {
+    // The interface ends a prepared context by detaching it, on a thread that was attached with it.
+    const CMPIBroker* broker = CurrentBroker();
+    broker->bft->attachThread(broker, prepared);
+    broker->bft->detachThread(broker, prepared);
+}
+
+void CompleteKeys(CMPIInstance* inst, const CMPIObjectPath* path, KeyCopying& copying) {
+    if (!IsStandardManager()) return;
+    const unsigned int life = PresentLife();
+    if (__atomic_load_n(&copying.copiedInLife, __ATOMIC_RELAXED) == life) return;
+    bool copied = true;
+    const unsigned int count = path->ft->getKeyCount(path, nullptr);
+    for (unsigned int i = 0; i < count; i++) {
+        if (CompleteKey(inst, path, i)) copied = false;
+    }
+    if (copied) __atomic_store_n(&copying.copiedInLife, life, __ATOMIC_RELAXED);
+}
+
+void SetFirstString(CMPIArray* array, const char* text) {
+    const CMPIStatus status =
+        array->ft->setElementAt(array, 0, reinterpret_cast<const CMPIValue*>(text), CMPI_chars);
+    if (status.rc == CMPI_RC_OK || !IsStandardManager()) return;
+    const CMPIBroker* broker = CurrentBroker();
+    CMPIValue value;
+    memset(&value, 0, sizeof value);
+    value.string = broker->eft->newString(broker, text, nullptr);
+    if (value.string != nullptr) array->ft->setElementAt(array, 0, &value, CMPI_string);
+}
