@@ -1,9 +1,11 @@
-// What the inventory's files share: broker queries and the quiet stop of the workers.
+// What the inventory's files share: broker queries, the workers' gate and their quiet stop.
 #pragma once
 
 #include <stdlib.h>
 
+#include "PlexorProviderDeadline.h"
 #include "PlexorProviderUtil.h"
+#include "PlexorProviderUtilLife.h"
 
 /// A query of the broker: everything that its call and its log lines name.
 struct Query_t {
@@ -53,14 +55,21 @@ void ReleaseDeviceItem(Thread_Args_t* item);
 /// caller itself has obtained.
 bool RunQueuedItemAlone(const CMPIContext* ctx);
 
-// Stopping the workers before the inventory is released.
+// Beginning a life of the provider and stopping its work before the inventory is released.
 
-/// Takes back an earlier QuiesceWorkers; called before an inventory is begun.
-void AdmitWork();
+/// Begins a life: what earlier ones left behind in the workers' words (TerminateThread,
+/// ThreadActivityDone, ActiveThreads) does not count for it. Takes no lock but the life's.
+void BeginWork();
 
-/// True from the start of QuiesceWorkers: work functions come to an end soon, asking nothing more.
-bool StopRequested();
+/// Workers of the present life among ActiveThreads. The caller holds PlexorThreadMutex.
+unsigned int ActiveWorkers();
 
-/// Waits until no work function is running and lets none start. False when one is still running
-/// after the time limit: then nothing that it may use can be released.
-bool QuiesceWorkers();
+/// Whether the initial inventory of the present life is done. Takes PlexorThreadMutex.
+bool InventoryDone();
+
+/// Closes the gate for the life that is about to begin.
+void CloseInventoryGate();
+
+/// Asks the present life to end and waits until no work function is running. False when one still
+/// is after the deadline: then nothing that it may use can be released.
+bool QuiesceWorkers(const Deadline& deadline);

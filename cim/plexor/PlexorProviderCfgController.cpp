@@ -101,6 +101,15 @@ void DumpController(const RaidController_t* ctrl) {
            ctrl->DriverVersion, ctrl->BundleVersion, ctrl->HealthState, ctrl->OperationalStatus);
 }
 
+/// Appends the controller, with the list's code in `rc`. False after a stop: the list is not this
+/// thread's any more.
+bool Publish(RaidController_t* ctrl, int& rc) {
+    const LifeGuard life;
+    if (!life.Stands()) return false;
+    rc = AddEntryAtListTail(RaidControllerList, ctrl);
+    return true;
+}
+
 /// Builds and appends one controller. Not 0 only when memory is short; an unusable port controller
 /// is skipped with 0.
 int BuildController(const CMPIContext* ctx, const CMPIInstance* inst) {
@@ -119,7 +128,11 @@ int BuildController(const CMPIContext* ctx, const CMPIInstance* inst) {
     StoreTime(ctrl->ControllerUpdateTime, time(nullptr));
     DumpController(ctrl);
 
-    const int rc = AddEntryAtListTail(RaidControllerList, ctrl);
+    int rc = RESULT_OK;
+    if (!Publish(ctrl, rc)) {
+        FreeController(ctrl);
+        return RESULT_OK;
+    }
     if (rc != RESULT_OK) {
         syslog(LOG_ERR, "%s: failed to add controller to list, rc %d.\n", kBuilder, rc);
         FreeController(ctrl);
@@ -134,7 +147,9 @@ int BuildControllersOfProfile(const CMPIContext* ctx, const CMPIInstance* profil
     if (path == nullptr) return RESULT_OK;
     CMPIEnumeration* found = QueryAssociators(
         {kBuilder, ctx, path, "CIM_ElementConformsToProfile", "CIM_PortController"});
-    while (const CMPIInstance* inst = NextInstance(found)) {
+    while (!StopRequested()) {
+        const CMPIInstance* inst = NextInstance(found);
+        if (inst == nullptr) break;
         const int rc = BuildController(ctx, inst);
         if (rc != RESULT_OK) return rc;
     }
@@ -150,7 +165,7 @@ int BuildControllerInfo(const CMPIInstanceMI*, const CMPIContext* ctx, Array_t* 
         rc = BuildControllersOfProfile(ctx, static_cast<CMPIInstance*>(profiles->Array[i]));
     }
     // Short of memory, half an inventory would pass for the whole: have none.
-    if (rc != RESULT_OK) FreeList(RaidControllerList, FreeController);
+    if (rc != RESULT_OK && !StopRequested()) FreeList(RaidControllerList, FreeController);
     syslog(LOG_DEBUG, "%s, EXIT(%d).\n", __func__, rc);
     return rc;
 }

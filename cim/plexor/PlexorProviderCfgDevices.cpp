@@ -4,6 +4,7 @@
 #include <unistd.h>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgClassLock.h"
 #include "PlexorProviderLock.h"
 
 namespace {
@@ -109,7 +110,7 @@ void QueueDevice(const CMPIInstanceMI* mi, const CMPIContext* ctx, RaidControlle
 
 bool WorkDone() {
     MutexGuard lock(PlexorThreadMutex);
-    return IsFifoEmpty(&__FIFO) && ActiveThreads <= 1;
+    return IsFifoEmpty(&__FIFO) && ActiveWorkers() <= 1;
 }
 
 /// Waits until the queue is empty and the caller is the only active worker. No time limit, but the
@@ -160,8 +161,9 @@ void ProcessBuildLogicalDeviceInfo(CMPIContext* ctx, void* args) {
 
     if (code >= 1 && code <= kDeviceKindCount) {
         const DeviceKind& kind = kDeviceKinds[code - 1];
-        MutexGuard lock(ctrl->*kind.classMutex);
-        kind.build(mi, ctx, ctrl, inst, op);
+        ClassLock lock(ctrl, ctrl->*kind.classMutex, kind.className);
+        if (lock.Locked()) kind.build(mi, ctx, ctrl, inst, op);
+        lock.Unlock();
     } else {
         syslog(LOG_ERR, "%s: invalid type %d\n", __func__, code);
     }

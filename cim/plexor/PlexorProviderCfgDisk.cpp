@@ -132,6 +132,7 @@ int Place(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx) {
         if (JoinAndInsert(ctrl, disk, candidate, rc)) return rc;
     }
     if (disk->Pool == nullptr) {
+        if (StopRequested()) return RESULT_BAD_ARGUMENT;  // it may not have been asked for
         syslog(LOG_ERR, "No pool associated with disk %s\n", PathText(LOG_ERR, disk->DiskOp));
         return RESULT_BAD_ARGUMENT;
     }

@@ -2,6 +2,7 @@
 #include <stdlib.h>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgClassLock.h"
 #include "PlexorProviderLock.h"
 
 namespace {
@@ -22,12 +23,15 @@ int BuildAll(const Walk& walk, const CMPIInstanceMI* mi, const CMPIContext* ctx,
         QueryAssociators({walk.caller, ctx, ctrl->ControllerOp, walk.assocClass, walk.resultClass});
     if (found == nullptr) return RESULT_OK;
 
-    MutexGuard lock(ctrl->*walk.classMutex);
-    while (const CMPIInstance* inst = NextInstance(found)) {
-        const int rc = walk.build(mi, ctx, ctrl, inst, InstancePath(inst));
-        if (rc != RESULT_OK) return rc;
+    ClassLock lock(ctrl, ctrl->*walk.classMutex, walk.resultClass);
+    int rc = RESULT_OK;
+    while (rc == RESULT_OK && !StopRequested()) {
+        const CMPIInstance* inst = NextInstance(found);
+        if (inst == nullptr) break;
+        rc = walk.build(mi, ctx, ctrl, inst, InstancePath(inst));
     }
-    return RESULT_OK;
+    lock.Unlock();
+    return rc;
 }
 
 /// The tag without the controller's DeviceID and the underscores behind it; null when it does not

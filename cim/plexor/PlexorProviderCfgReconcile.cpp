@@ -2,6 +2,7 @@
 #include <stdlib.h>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgClassLock.h"
 #include "PlexorProviderLock.h"
 
 namespace {
@@ -148,7 +149,8 @@ bool IsDue(const Refresh& refresh, const pthread_mutex_t& classMutex, time_t las
 void ReconcileRow(const Refresh& refresh) {
     pthread_mutex_t& classMutex = refresh.ctrl->*refresh.fields->classMutex;
     time_t& updateTime = refresh.ctrl->*refresh.fields->updateTime;
-    MutexGuard lock(classMutex);
+    ClassLock lock(refresh.ctrl, classMutex, refresh.row->AssociatedClassName,
+                   ClassLock::Patience::kLimited);
     if (!lock.Locked()) return;
     if (!IsDue(refresh, classMutex, LoadTime(updateTime), time(nullptr))) return;
 
@@ -158,6 +160,7 @@ void ReconcileRow(const Refresh& refresh) {
     if (results != nullptr) ApplyResults(refresh, results);
     // Also after a failure: the vendor is not asked again before the next interval.
     StoreTime(updateTime, time(nullptr));
+    lock.Unlock();
 }
 
 /// Queues a refresh. The queue's code.
@@ -172,11 +175,6 @@ int QueueRefresh(const CMPIInstanceMI* mi, RaidController_t* ctrl, int action) {
     if (rc != RESULT_OK) free(item);
     if (rc != RESULT_FIFO_FULL) pthread_cond_signal(&PlexorThreadCond);
     return rc;
-}
-
-bool InventoryDone() {
-    MutexGuard lock(PlexorThreadMutex);
-    return ThreadActivityDone != 0;
 }
 
 }  // namespace

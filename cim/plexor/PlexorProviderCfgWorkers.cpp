@@ -1,11 +1,13 @@
-// The two workers: start, body, initial inventory, stop.
-#include <dlfcn.h>
+// The two workers: start, body, stop.
 #include <errno.h>
 #include <stdlib.h>
 #include <unistd.h>
 
+#include <atomic>
+
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderLock.h"
+#include "PlexorProviderUtilManager.h"
 
 // Two, not fewer: one may wait for the queue to drain while the other drains it.
 pthread_t PlexorThreads[2];
@@ -14,85 +16,168 @@ pthread_mutex_t PlexorThreadMutex = PTHREAD_MUTEX_INITIALIZER;
 pthread_cond_t PlexorThreadCond = PTHREAD_COND_INITIALIZER;
 unsigned int ActiveThreads = 0;
 unsigned int TerminateThread = 0;
-unsigned int ThreadActivityDone = 0;
 time_t StateUpdateInterval = 20;
 
 namespace {
 
 constexpr int kThreadCount = sizeof PlexorThreads / sizeof PlexorThreads[0];
 constexpr int kDefaultIntervalSeconds = 20;
-constexpr unsigned int kExitSeconds = 3;     // what the workers get to leave
-constexpr time_t kQuiesceLimitSeconds = 30;  // what a work function gets to end
+constexpr unsigned int kExitSeconds = 3;  // what the workers get to leave
 constexpr time_t kJoinLimitSeconds = 1;
 constexpr time_t kMissedSignalSeconds = 1;
 
-bool __Started[kThreadCount];  // workers to join; factory and cleanup only
-unsigned int __WorkerCount;    // workers that were started; relaxed atomic
-unsigned int __RunningItems;   // work functions running; guarded by PlexorThreadMutex
-unsigned int __StopRequested;  // written under PlexorThreadMutex, read as relaxed atomic
+bool __Started[kThreadCount];                           // workers to join; factory and cleanup only
+std::atomic<unsigned int> __LivingWorkers;              // of the present life
 pthread_cond_t __ItemEnded = PTHREAD_COND_INITIALIZER;  // with PlexorThreadMutex
 
-timespec DeadlineIn(time_t seconds) {
-    timespec deadline;
-    clock_gettime(CLOCK_MONOTONIC, &deadline);
-    deadline.tv_sec += seconds;
-    return deadline;
+/// A worker between two waits. They are linked, so that the present life's can be told from one
+/// that an earlier life left behind. Guarded by PlexorThreadMutex, which the caller holds at both
+/// ends of the scope.
+class ActiveWorker {
+public:
+    ActiveWorker() : next_(first_) {
+        first_ = this;
+        ActiveThreads++;
+    }
+    ~ActiveWorker() {
+        ActiveWorker** link = &first_;
+        while (*link != this) link = &(*link)->next_;
+        *link = next_;
+        ActiveThreads--;
+    }
+    ActiveWorker(const ActiveWorker&) = delete;
+    ActiveWorker& operator=(const ActiveWorker&) = delete;
+
+    void SetRunning(bool running) { running_ = running; }
+
+    /// How many of the present life run an item.
+    static unsigned int CountRunning() {
+        return Count([](const ActiveWorker& worker) {
+            return worker.running_ && worker.life_ == PresentLife();
+        });
+    }
+    /// How many belong to earlier lives.
+    static unsigned int CountOld() {
+        return Count([](const ActiveWorker& worker) { return worker.life_ != PresentLife(); });
+    }
+
+private:
+    template <typename Condition>
+    static unsigned int Count(Condition condition) {
+        unsigned int count = 0;
+        for (const ActiveWorker* worker = first_; worker != nullptr; worker = worker->next_) {
+            if (condition(*worker)) count++;
+        }
+        return count;
+    }
+
+    static ActiveWorker* first_;
+    const unsigned int life_ = OwnLife();
+    bool running_ = false;
+    ActiveWorker* next_;
+};
+
+ActiveWorker* ActiveWorker::first_ = nullptr;
+
+std::atomic<unsigned int> __TerminatedLife = 0;  // whose stop set TerminateThread; 0: unknown
+
+/// Told to leave by the stop of this worker's life, not by an earlier one's. The caller holds
+/// PlexorThreadMutex.
+bool ToldToLeave() {
+    if (LifeIsOver()) return true;
+    return TerminateThread != 0 && (__TerminatedLife == 0 || __TerminatedLife == PresentLife());
 }
 
-void SetStopRequested(unsigned int value) {
-    __atomic_store_n(&__StopRequested, value, __ATOMIC_RELAXED);
+/// A work function's run, with PlexorThreadMutex released.
+class RunningItem {
+public:
+    RunningItem(ActiveWorker& worker, MutexGuard& lock) : worker_(worker), lock_(lock) {
+        worker_.SetRunning(true);
+        lock_.Unlock();
+    }
+    ~RunningItem() {
+        lock_.Lock();
+        worker_.SetRunning(false);
+        pthread_cond_broadcast(&__ItemEnded);
+    }
+    RunningItem(const RunningItem&) = delete;
+    RunningItem& operator=(const RunningItem&) = delete;
+
+private:
+    ActiveWorker& worker_;
+    MutexGuard& lock_;
+};
+
+/// Counts a worker as living until its thread ends, be it cancelled.
+class LivingWorker {
+public:
+    LivingWorker() = default;
+    ~LivingWorker() {
+        if (LifeIsOver()) return;
+        // A thread that InitPlexorThreads has not started was never counted.
+        unsigned int living = __LivingWorkers;
+        while (living != 0 && !__LivingWorkers.compare_exchange_weak(living, living - 1)) {
+        }
+    }
+    LivingWorker(const LivingWorker&) = delete;
+    LivingWorker& operator=(const LivingWorker&) = delete;
+};
+
+Thread_Args_t* TakeItem() {
+    return StopRequested() ? nullptr : static_cast<Thread_Args_t*>(GetItem(&__FIFO));
 }
 
-void SetWorkerCount(unsigned int value) {
-    __atomic_store_n(&__WorkerCount, value, __ATOMIC_RELAXED);
-}
-
-/// Runs one item with PlexorThreadMutex released; locked again on return.
-void RunItem(Thread_Args_t* item, CMPIContext* ctx, long index) {
-    __RunningItems++;
-    pthread_mutex_unlock(&PlexorThreadMutex);
+/// Runs the next item. False when there is none, or none may begin.
+bool RunNextItem(CMPIContext* ctx, long index, MutexGuard& lock) {
+    ActiveWorker worker;
+    Thread_Args_t* item = TakeItem();
+    if (item == nullptr) return false;
+    const RunningItem running(worker, lock);
     syslog(LOG_DEBUG, "%s(%ld): running...\n", "PlexorThread", index);
-    if (item->Func != nullptr) item->Func(ctx, item);
-    FlushContext(ctx);
-    pthread_mutex_lock(&PlexorThreadMutex);
-    __RunningItems--;
-    pthread_cond_broadcast(&__ItemEnded);
+    ItemSpan span(ctx);
+    if (item->Func != nullptr) item->Func(span.Context(), item);
+    span.End();
+    return true;
 }
 
-/// Waits until it is woken. The producers signal without PlexorThreadMutex, so a signal can fall
-/// between an empty GetItem and the wait; work that is queued then is found at the next look, not
-/// at the next signal, which might never come. So is a stop, unless the worker was busy when it was
-/// asked for: then it waits for the next wake-up. The caller holds PlexorThreadMutex.
-void WaitForWork(bool wasBusyAtStop) {
-    while (!TerminateThread || wasBusyAtStop) {
-        const timespec deadline = DeadlineIn(kMissedSignalSeconds);
-        const int rc = pthread_cond_clockwait(&PlexorThreadCond, &PlexorThreadMutex,
-                                              CLOCK_MONOTONIC, &deadline);
-        if (rc != ETIMEDOUT) return;
+/// Waits for the next reason to look around. The producers signal without PlexorThreadMutex, so a
+/// signal can fall between an empty GetItem and the wait; hence a look each second. What ends the
+/// wait of a worker that was
+///                            idle when told to leave   busy when told to leave
+///   a wake-up                yes                       yes
+///   a look: told to leave    yes                       no, it waits for the next wake-up
+///   a look: work is queued   yes, without a stop       yes, without a stop
+///   a look: a later life     yes                       yes
+/// The caller holds PlexorThreadMutex.
+void WaitForWork(bool wasBusyWhenTold) {
+    for (;;) {
+        if (LifeIsOver()) return;
+        if (ToldToLeave() && !wasBusyWhenTold) return;
+        if (WaitUntil(PlexorThreadCond, PlexorThreadMutex, Deadline::In(kMissedSignalSeconds))) {
+            return;
+        }
         if (!StopRequested() && !IsFifoEmpty(&__FIFO)) return;
     }
 }
 
-/// Takes items until it is woken to terminate. The caller holds PlexorThreadMutex.
-void WorkUntilTerminated(CMPIContext* ctx, long index) {
-    bool ranItem = false;
+/// Takes items until it is told to leave. The caller holds PlexorThreadMutex.
+void WorkUntilTerminated(CMPIContext* ctx, long index, MutexGuard& lock) {
+    bool wasBusy = false;
     for (;;) {
-        ActiveThreads++;
-        auto* item = StopRequested() ? nullptr : static_cast<Thread_Args_t*>(GetItem(&__FIFO));
-        if (item != nullptr) RunItem(item, ctx, index);
-        ActiveThreads--;
-        if (item != nullptr) {
-            ranItem = true;
+        if (RunNextItem(ctx, index, lock)) {
+            wasBusy = true;
             continue;
         }
         syslog(LOG_DEBUG, "%s(%ld): no item to process, wait...\n", "PlexorThread", index);
-        WaitForWork(ranItem && TerminateThread);
-        if (TerminateThread) return;
-        ranItem = false;
+        WaitForWork(wasBusy && ToldToLeave());
+        if (ToldToLeave()) return;
+        wasBusy = false;
     }
 }
 
-void StartWorker(int i, const CMPIContext* ctx) {
+/// Starts worker `i`. False without memory, a context or a thread, and when the life has been asked
+/// to end meanwhile.
+bool StartWorker(int i, const CMPIContext* ctx) {
     const CMPIBroker* broker = CurrentBroker();
     auto* args = NewRecord<Thread_Args_t>();
     CMPIContext* prepared = broker->bft->prepareAttachThread(broker, ctx);
@@ -100,22 +185,14 @@ void StartWorker(int i, const CMPIContext* ctx) {
     if (args != nullptr && prepared != nullptr) {
         args->Arg0 = static_cast<uintptr_t>(i);
         args->Arg1 = reinterpret_cast<uintptr_t>(prepared);
-        __Started[i] =
-            pthread_create(&PlexorThreads[i], &PlexorThreadAttr, PlexorThread, args) == 0;
+        const LifeGuard life;
+        __Started[i] = life.Stands() && pthread_create(&PlexorThreads[i], &PlexorThreadAttr,
+                                                       PlexorThread, args) == 0;
+        if (__Started[i]) return true;
     }
-    if (!__Started[i]) free(args);
-    syslog(LOG_DEBUG, "%s: thread %d created\n", "InitPlexorThreads", i);
-}
-
-void StampAll(RaidController_t* ctrl) {
-    const time_t now = time(nullptr);
-    StoreTime(ctrl->BatteryUpdateTime, now);
-    StoreTime(ctrl->PortUpdateTime, now);
-    StoreTime(ctrl->DiskUpdateTime, now);
-    StoreTime(ctrl->VolumeUpdateTime, now);
-    StoreTime(ctrl->PoolUpdateTime, now);
-    StoreTime(ctrl->ChassisUpdateTime, now);
-    StoreTime(ctrl->ControllerUpdateTime, now);
+    free(args);
+    if (prepared != nullptr) EndUnusedContext(prepared);
+    return false;
 }
 
 /// Frees what a stop left in the queue, clones included.
@@ -131,23 +208,15 @@ void DiscardQueuedWork() {
     }
 }
 
-/// Keeps the library mapped for the rest of the process: a thread that is still inside it would
-/// otherwise return into unmapped memory.
-void PinLibrary() {
-    Dl_info info;
-    if (dladdr(reinterpret_cast<void*>(&PlexorThread), &info) == 0) return;
-    dlopen(info.dli_fname, RTLD_NOW | RTLD_NOLOAD | RTLD_NODELETE);
-}
-
-/// Joins the workers that have ended. False when one has not.
+/// Joins the workers that have ended. False when one has not: it is left to itself.
 bool JoinWorkers() {
     bool allEnded = true;
     for (int i = 0; i < kThreadCount; i++) {
         if (!__Started[i]) continue;
-        const timespec deadline = DeadlineIn(kJoinLimitSeconds);
-        if (pthread_clockjoin_np(PlexorThreads[i], nullptr, CLOCK_MONOTONIC, &deadline) == 0) {
-            __Started[i] = false;
-        } else {
+        __Started[i] = false;
+        const Deadline deadline = Deadline::In(kJoinLimitSeconds);
+        if (pthread_clockjoin_np(PlexorThreads[i], nullptr, CLOCK_MONOTONIC, &deadline.Moment()) !=
+            0) {
             allEnded = false;
         }
     }
@@ -156,35 +225,36 @@ bool JoinWorkers() {
 
 }  // namespace
 
+void BeginWork() {
+    __LivingWorkers = 0;
+    // A word that has been reset is nobody's any more.
+    if (__atomic_load_n(&TerminateThread, __ATOMIC_RELAXED) == 0) __TerminatedLife = 0;
+    CloseInventoryGate();
+    BeginLife();
+}
+
+unsigned int ActiveWorkers() {
+    const unsigned int old = ActiveWorker::CountOld();
+    return ActiveThreads > old ? ActiveThreads - old : 0;
+}
+
 bool RunQueuedItemAlone(const CMPIContext* ctx) {
-    if (__atomic_load_n(&__WorkerCount, __ATOMIC_RELAXED) != 1) return false;
+    if (__LivingWorkers != 1) return false;
     MutexGuard lock(PlexorThreadMutex);
-    auto* item = StopRequested() ? nullptr : static_cast<Thread_Args_t*>(GetItem(&__FIFO));
+    Thread_Args_t* item = TakeItem();
     lock.Unlock();
     if (item == nullptr) return false;
     if (item->Func != nullptr) item->Func(const_cast<CMPIContext*>(ctx), item);
     return true;
 }
 
-bool StopRequested() {
-    return __atomic_load_n(&__StopRequested, __ATOMIC_RELAXED) != 0;
-}
-
-void AdmitWork() {
-    SetStopRequested(0);
-}
-
-bool QuiesceWorkers() {
-    const timespec deadline = DeadlineIn(kQuiesceLimitSeconds);
+bool QuiesceWorkers(const Deadline& deadline) {
+    RequestStop();
     MutexGuard lock(PlexorThreadMutex);
-    SetStopRequested(1);
-    while (__RunningItems != 0) {
-        if (pthread_cond_clockwait(&__ItemEnded, &PlexorThreadMutex, CLOCK_MONOTONIC, &deadline) !=
-            0) {
-            break;
-        }
+    while (ActiveWorker::CountRunning() != 0) {
+        if (!WaitUntil(__ItemEnded, PlexorThreadMutex, deadline)) break;
     }
-    return __RunningItems == 0;
+    return ActiveWorker::CountRunning() == 0;
 }
 
 void InitPlexorThreads(const CMPIContext* ctx) {
@@ -195,8 +265,12 @@ void InitPlexorThreads(const CMPIContext* ctx) {
            static_cast<unsigned long>(LoadTime(StateUpdateInterval)));
     pthread_attr_init(&PlexorThreadAttr);
     pthread_attr_setdetachstate(&PlexorThreadAttr, PTHREAD_CREATE_JOINABLE);
-    for (int i = 0; i < kThreadCount; i++) StartWorker(i, ctx);
-    SetWorkerCount(static_cast<unsigned int>(__Started[0]) + __Started[1]);
+    // Counted before they run: one that looks at once must not take itself for the only one.
+    __LivingWorkers = kThreadCount;
+    for (int i = 0; i < kThreadCount; i++) {
+        if (!StartWorker(i, ctx)) __LivingWorkers--;
+        syslog(LOG_DEBUG, "%s: thread %d created\n", __func__, i);
+    }
 }
 
 void* PlexorThread(void* args) {
@@ -206,64 +280,26 @@ void* PlexorThread(void* args) {
     free(start);
 
     const CMPIBroker* broker = CurrentBroker();
+    const LifeMember member;
+    const LivingWorker living;
     broker->bft->attachThread(broker, ctx);
-    pthread_mutex_lock(&PlexorThreadMutex);
-    WorkUntilTerminated(ctx, index);
-    pthread_mutex_unlock(&PlexorThreadMutex);
+    MutexGuard lock(PlexorThreadMutex);
+    WorkUntilTerminated(ctx, index, lock);
+    lock.Unlock();
     broker->bft->detachThread(broker, ctx);
     syslog(LOG_DEBUG, "Thread %ld exiting...\n", index);
     pthread_exit(nullptr);
 }
 
-int BuildDeviceInfoAsync(const CMPIInstanceMI* mi, const CMPIContext*) {
-    auto* item = NewRecord<Thread_Args_t>();
-    if (item == nullptr) {
-        syslog(LOG_ERR, "%s, failed to allocate threadArgs\n", __func__);
-        return RESULT_NO_MEMORY;
-    }
-    item->Func = DoBuildDeviceInfoAsync;
-    item->Arg0 = reinterpret_cast<uintptr_t>(mi);
-    const int rc = PutItem(&__FIFO, item);
-    if (rc == RESULT_FIFO_FULL) {
-        free(item);
-        syslog(LOG_ERR, "%s, failed to put threadArgs in FIFO\n", __func__);
-        return rc;
-    }
-    if (rc != RESULT_OK) free(item);
-    pthread_cond_signal(&PlexorThreadCond);
-    return rc;
-}
-
-void DoBuildDeviceInfoAsync(CMPIContext* ctx, void* args) {
-    auto* item = static_cast<Thread_Args_t*>(args);
-    auto* mi = reinterpret_cast<const CMPIInstanceMI*>(item->Arg0);
-    free(item);
-
-    const List_Entry_t* entry = RaidControllerList->Head;
-    for (; entry != nullptr && !StopRequested(); entry = entry->Next) {
-        auto* ctrl = static_cast<RaidController_t*>(entry->Data);
-        if (ctrl == nullptr) continue;
-        BuildPoolInfo(mi, ctx, ctrl);
-        BuildChassisInfo(mi, ctx, ctrl);
-        BuildLogicalDeviceInfo(mi, ctx, ctrl);
-        StampAll(ctrl);
-    }
-
-    MutexGuard lock(PlexorThreadMutex);
-    ThreadActivityDone = 1;
-    pthread_cond_broadcast(&PlexorThreadCond);
-    lock.Unlock();
-    syslog(LOG_DEBUG, "%s done.", __func__);
-}
-
 void CleanupPlexorThreads() {
     MutexGuard lock(PlexorThreadMutex);
     TerminateThread = 1;
+    __TerminatedLife = PresentLife();
     lock.Unlock();
     pthread_cond_broadcast(&PlexorThreadCond);
     sleep(kExitSeconds);
     pthread_attr_destroy(&PlexorThreadAttr);
-    SetWorkerCount(0);
-    if (!JoinWorkers()) PinLibrary();
+    __LivingWorkers = 0;
+    if (!JoinWorkers()) KeepLibraryMapped();
     DiscardQueuedWork();
 }

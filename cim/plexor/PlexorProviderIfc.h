@@ -3,9 +3,8 @@
 
 #include "PlexorProviderUtil.h"
 
-/// The first controller's entry for a request. Null without controllers, and while they are still
-/// being looked for: such a request comes from the search itself.
-const List_Entry_t* FirstController();
+/// Whether an initialisation has been started and did not fail.
+bool IsInitialized();
 
 // Keys. The caller frees the strings; null after a failed copy (logged) or, for the retrieval
 // functions, a negative code with nothing stored.

@@ -4,7 +4,9 @@
 
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderIfc.h"
+#include "PlexorProviderIfcTurns.h"
 #include "PlexorProviderLock.h"
+#include "PlexorProviderUtilManager.h"
 
 const CMPIBroker* Broker = nullptr;
 int _ProviderInitialized = 0;
@@ -25,43 +27,14 @@ CMPIInstanceMIFT instMIFT__ = {100,
 
 namespace {
 
-/// One initialisation at a time. A manager calls the factory once for each class it serves, on
-/// several threads; a later call returns when the first has built the inventory, not before.
-pthread_mutex_t __InitMutex = PTHREAD_ERRORCHECK_MUTEX_INITIALIZER_NP;
-int __Initializing = 0;  // 1 while the controllers are looked for; atomic
-
-constexpr time_t kTurnLimitSeconds = 30;
-
-/// The right to initialise, for a scope. A vendor that is asked for its controllers may itself ask
-/// the manager for computer systems, and so have the factory called before it answers: on the same
-/// thread such a call gets no turn, on another one none after a time limit.
-class InitTurn {
-public:
-    InitTurn() {
-        timespec deadline;
-        clock_gettime(CLOCK_REALTIME, &deadline);
-        deadline.tv_sec += kTurnLimitSeconds;
-        taken_ = pthread_mutex_timedlock(&__InitMutex, &deadline) == 0;
-    }
-    ~InitTurn() {
-        if (taken_) pthread_mutex_unlock(&__InitMutex);
-    }
-    InitTurn(const InitTurn&) = delete;
-    InitTurn& operator=(const InitTurn&) = delete;
-
-    bool Taken() const { return taken_; }
-
-private:
-    bool taken_;
-};
-
 void SetInitialized(int value) {
     __atomic_store_n(&_ProviderInitialized, value, __ATOMIC_RELAXED);
 }
 
 /// Factory calls on several threads may be here at once.
 void WaitDebug() {
-    const int wait = getenv("WAIT_PROC") != nullptr ? 1 : 0;
+    // Nobody who starts a set-user-id process may make it wait.
+    const int wait = secure_getenv("WAIT_PROC") != nullptr ? 1 : 0;
     __atomic_store_n(&waitDebug, wait, __ATOMIC_RELAXED);
     if (!wait) {
         syslog(LOG_DEBUG, "Current process:pid=%d, ppid=%d\n", getpid(), getppid());
@@ -74,26 +47,39 @@ void WaitDebug() {
     } while (__atomic_load_n(&waitDebug, __ATOMIC_RELAXED));
 }
 
+void ReleaseIdentity() {
+    const LifeGuard life;
+    if (life.Stands()) ReleaseSystemInfo();
+}
+
 /// Builds the inventory's controllers and sets the workers going. False when the host has no
-/// identity or no RAID vendor.
+/// identity or no RAID vendor, and, silently, when a cleanup has asked for the end meanwhile.
 bool BuildInventory(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
     Array_t profileArray = {};
-    AdmitWork();
     int rc = InitSystemInfo(mi, ctx);
+    if (StopRequested()) return false;
     if (rc < 0) {
         syslog(LOG_ERR, "Cannot get system info, rc %d\n", rc);
         return false;
     }
     rc = GetHHRCProfiles(mi, ctx, &profileArray);
+    if (StopRequested()) return false;
     if (rc <= 0) {
         syslog(LOG_INFO, "No instance of Host Hard RAID Controller is found, rc %d\n", rc);
-        ReleaseSystemInfo();
+        ReleaseIdentity();
         return false;
     }
     BuildControllerInfo(mi, ctx, &profileArray);
+    if (StopRequested()) return false;
     InitPlexorThreads(ctx);
     BuildDeviceInfoAsync(mi, ctx);
     return true;
+}
+
+/// After the end of the life the mark is the cleanup's, or a later life's.
+void MarkFailed() {
+    const LifeGuard life;
+    if (life.Stands()) SetInitialized(0);
 }
 
 /// Initialises on a context attached for this thread. Where the broker has none to give, the
@@ -102,47 +88,46 @@ void InitializeAttached(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
     const CMPIBroker* broker = CurrentBroker();
     CMPIContext* ctxLocal = broker->bft->prepareAttachThread(broker, ctx);
     if (ctxLocal == nullptr) {
-        if (!BuildInventory(mi, ctx)) SetInitialized(0);
+        if (!BuildInventory(mi, ctx)) MarkFailed();
         return;
     }
     broker->bft->attachThread(broker, ctxLocal);
-    if (!BuildInventory(mi, ctxLocal)) SetInitialized(0);
-    FlushContext(ctxLocal);
+    if (!BuildInventory(mi, ctxLocal)) MarkFailed();
+    FlushFactoryContext(ctxLocal);
     broker->bft->detachThread(broker, ctxLocal);
 }
 
-void PlexorInit(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
+void PlexorInit(const CMPIInstanceMI* mi, const CMPIContext* ctx, FactoryCall& call) {
     syslog(LOG_DEBUG, "%s: ENTER...\n", __func__);
     WaitDebug();
-    const InitTurn turn;
-    if (!turn.Taken() || __atomic_load_n(&_ProviderInitialized, __ATOMIC_RELAXED)) return;
+    if (!call.TakeTurn()) return;
+    const LifeMember member;
     SetInitialized(1);
-    __atomic_store_n(&__Initializing, 1, __ATOMIC_RELEASE);
     InitializeAttached(mi, ctx);
-    __atomic_store_n(&__Initializing, 0, __ATOMIC_RELEASE);
+    call.EndTurn();
     syslog(LOG_DEBUG, "%s: EXIT\n", __func__);
 }
 
-void PlexorProviderInit(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
+void PlexorProviderInit(const CMPIInstanceMI* mi, const CMPIContext* ctx, FactoryCall& call) {
     syslog(LOG_DEBUG, "%s\n", __func__);
     syslog(LOG_DEBUG, "PlexorProvider: built on %s\n", __DATE__ " " __TIME__);
-    PlexorInit(mi, ctx);
+    PlexorInit(mi, ctx, call);
 }
 
 constexpr CMPIStatus kNotSupported = {CMPI_RC_ERR_NOT_SUPPORTED, nullptr};
 
 }  // namespace
 
-const List_Entry_t* FirstController() {
-    if (__atomic_load_n(&__Initializing, __ATOMIC_ACQUIRE)) return nullptr;
-    return RaidControllerList->Head;
+bool IsInitialized() {
+    return __atomic_load_n(&_ProviderInitialized, __ATOMIC_RELAXED) != 0;
 }
 
 CMPIInstanceMI* PlexorProvider_Create_InstanceMI(const CMPIBroker* brkr, const CMPIContext* ctx,
                                                  CMPIStatus*) {
     static CMPIInstanceMI mi = {nullptr, &instMIFT__};
+    FactoryCall call;
     __atomic_store_n(&Broker, brkr, __ATOMIC_RELAXED);
-    PlexorProviderInit(&mi, ctx);
+    PlexorProviderInit(&mi, ctx, call);
     StoreTime(InitCompleteTime, time(nullptr));
     return &mi;
 }

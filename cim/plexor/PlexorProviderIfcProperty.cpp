@@ -1,5 +1,7 @@
 #include "PlexorProviderIfcProperty.h"
 
+#include "PlexorProviderUtilManager.h"
+
 namespace {
 
 template <typename Number>
@@ -7,14 +9,13 @@ void SetNumber(CMPIInstance* inst, const char* name, Number value, CMPIType type
     inst->ft->setProperty(inst, name, reinterpret_cast<const CMPIValue*>(&value), type);
 }
 
-/// Sets an array of one element. The element's type may differ from the array's: an array made for
-/// strings takes characters.
-void SetArray(CMPIInstance* inst, const char* name, CMPIType madeFor, const void* element,
-              CMPIType elementType, CMPIType arrayType) {
+/// A new array of one element; null when the broker gives none.
+CMPIArray* NewArray(CMPIType madeFor) {
     const CMPIBroker* broker = CurrentBroker();
-    CMPIArray* array = broker->eft->newArray(broker, 1, madeFor, nullptr);
-    if (array == nullptr) return;
-    array->ft->setElementAt(array, 0, static_cast<const CMPIValue*>(element), elementType);
+    return broker->eft->newArray(broker, 1, madeFor, nullptr);
+}
+
+void SetArray(CMPIInstance* inst, const char* name, CMPIArray* array, CMPIType arrayType) {
     CMPIValue value;
     memset(&value, 0, sizeof value);
     value.array = array;
@@ -45,11 +46,17 @@ void SetBoolean(CMPIInstance* inst, const char* name, bool value) {
 }
 
 void SetUint16Array(CMPIInstance* inst, const char* name, CMPIUint16 value) {
-    SetArray(inst, name, CMPI_uint16, &value, CMPI_uint16, CMPI_uint16A);
+    CMPIArray* array = NewArray(CMPI_uint16);
+    if (array == nullptr) return;
+    array->ft->setElementAt(array, 0, reinterpret_cast<const CMPIValue*>(&value), CMPI_uint16);
+    SetArray(inst, name, array, CMPI_uint16A);
 }
 
 void SetCharsArray(CMPIInstance* inst, const char* name, const char* value) {
-    SetArray(inst, name, CMPI_string, value, CMPI_chars, CMPI_charsA);
+    CMPIArray* array = NewArray(CMPI_string);
+    if (array == nullptr) return;
+    SetFirstString(array, value);
+    SetArray(inst, name, array, CMPI_charsA);
 }
 
 void SetNameAndCaption(CMPIInstance* inst, const char* text) {

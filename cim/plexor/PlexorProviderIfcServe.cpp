@@ -3,7 +3,9 @@
 #include <stdlib.h>
 
 #include "PlexorProviderIfc.h"
+#include "PlexorProviderIfcTurns.h"
 #include "PlexorProviderLock.h"
+#include "PlexorProviderUtilManager.h"
 
 namespace {
 
@@ -58,6 +60,8 @@ constexpr ServedClass kServedClasses[] = {
      &RaidController_t::BatteryList, DeviceIdOf<Battery_t>,
      RenderDevice<Battery_t, FillBatteryInstance>, ACTION_BATTERY},
 };
+
+KeyCopying __KeyCopying[sizeof kServedClasses / sizeof kServedClasses[0]];
 
 /// A client's request while it is served.
 struct Request {
@@ -133,6 +137,7 @@ void ReturnRecord(const Request& request, RaidController_t* ctrl, void* record) 
     const CMPIBroker* broker = CurrentBroker();
     CMPIInstance* inst = broker->eft->newInstance(broker, path, nullptr);
     if (inst == nullptr) return;
+    CompleteKeys(inst, path, __KeyCopying[request.served - kServedClasses]);
     if (request.properties != nullptr) {
         inst->ft->setPropertyFilter(inst, request.properties, nullptr);
     }
@@ -163,7 +168,7 @@ int ReturnDevices(const Request& request, RaidController_t* ctrl, const Wanted& 
 /// were.
 int ReturnWanted(const Request& request, const Wanted& wanted) {
     int found = 0;
-    const List_Entry_t* entry = FirstController();
+    const List_Entry_t* entry = RequestInFlight::FirstController();
     for (; entry != nullptr; entry = entry->Next) {
         auto* ctrl = static_cast<RaidController_t*>(entry->Data);
         if (!SameId(wanted.controllerId, ctrl->DeviceID)) continue;
@@ -188,6 +193,7 @@ int ParseKey(const Request& request, Wanted& wanted) {
 }
 
 CMPIStatus Enumerate(Request& request) {
+    const RequestInFlight inFlight;
     Open(request);
     if (request.served != nullptr) ReturnWanted(request, Wanted());
     syslog(LOG_DEBUG, "%s: exiting\n", request.caller);
@@ -196,6 +202,7 @@ CMPIStatus Enumerate(Request& request) {
 }
 
 CMPIStatus Get(Request& request) {
+    const RequestInFlight inFlight;
     Open(request);
     if (request.served == nullptr) return {CMPI_RC_ERR_INVALID_CLASS, nullptr};
     Wanted wanted;

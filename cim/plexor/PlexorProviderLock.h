@@ -5,25 +5,27 @@
 //   2. a class's *CfgMutex          one refresh or build of a device class at a time
 //   3. a controller's CtrlMutex     its device lists and changing fields
 //   4. Fifo_t::Mutex                the work queue
-// The factory's own initialisation mutex is taken before all of them. Work functions run with
-// PlexorThreadMutex released. No broker query is made while CtrlMutex is held.
+//   5. the life's mutex             LifeGuard
+// Those of ClassLock (who holds which *CfgMutex) and of the turns (factory, cleanup) guard their
+// own books; no other lock is taken under them, nor are they taken under others but
+// PlexorThreadMutex. Work functions run with PlexorThreadMutex released. No broker query is made
+// while CtrlMutex is held.
 #pragma once
 
 #include <pthread.h>
 #include <time.h>
 
-/// Holds a mutex for a scope, or until Unlock.
+/// Holds a mutex for a scope, or until Unlock. A thread that is cancelled gives it back, too.
 class MutexGuard {
 public:
-    explicit MutexGuard(pthread_mutex_t& mutex) : mutex_(&mutex) {
-        locked_ = pthread_mutex_lock(mutex_) == 0;
-    }
+    explicit MutexGuard(pthread_mutex_t& mutex) : mutex_(&mutex) { Lock(); }
     ~MutexGuard() { Unlock(); }
     MutexGuard(const MutexGuard&) = delete;
     MutexGuard& operator=(const MutexGuard&) = delete;
 
     /// False when the mutex could not be taken.
     bool Locked() const { return locked_; }
+    void Lock() { locked_ = pthread_mutex_lock(mutex_) == 0; }
     void Unlock() {
         if (locked_) pthread_mutex_unlock(mutex_);
         locked_ = false;

@@ -53,11 +53,8 @@ void ReleaseInstance(CMPIInstance*& inst);
 
 /// Whether the enumeration has a further element; false for a null enumeration.
 bool HasNext(const CMPIEnumeration* enumeration);
-/// Next instance (path); elements of another type are passed over. Null at the end, for a null
-/// enumeration, and when the enumeration cannot give its next element, which `failed`, when given,
-/// then tells.
+/// Next instance (path); elements of another type are passed over, up to a thousand in a row. Null
+/// at the end, for a null enumeration, and when the enumeration cannot give its next element or
+/// gives no end of others, which `failed`, when given, then tells.
 CMPIInstance* NextInstance(const CMPIEnumeration* enumeration, bool* failed = nullptr);
 CMPIObjectPath* NextPath(const CMPIEnumeration* enumeration);
-
-/// Gives back what the calling thread obtained from the broker and did not clone.
-void FlushContext(CMPIContext* ctx);

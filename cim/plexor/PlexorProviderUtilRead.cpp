@@ -69,6 +69,10 @@ CMPIUint64 ScalarNumber(const CMPIData& data) {
     }
 }
 
+// Elements of another type than the wanted one that are passed over in a row: an enumeration may
+// give such elements for ever.
+constexpr int kMostOddElements = 1000;
+
 /// Takes the next element. False at the end, and when the enumeration cannot give it: asking such a
 /// one again might never end.
 bool NextElement(const CMPIEnumeration* enumeration, CMPIData& data, bool* failed = nullptr) {
@@ -169,15 +173,18 @@ bool HasNext(const CMPIEnumeration* enumeration) {
 
 CMPIInstance* NextInstance(const CMPIEnumeration* enumeration, bool* failed) {
     CMPIData data = NullData();
-    while (NextElement(enumeration, data, failed)) {
+    for (int i = 0; i < kMostOddElements; i++) {
+        if (!NextElement(enumeration, data, failed)) return nullptr;
         if (data.type == CMPI_instance && data.value.inst != nullptr) return data.value.inst;
     }
+    if (failed != nullptr) *failed = true;
     return nullptr;
 }
 
 CMPIObjectPath* NextPath(const CMPIEnumeration* enumeration) {
     CMPIData data = NullData();
-    while (NextElement(enumeration, data)) {
+    for (int i = 0; i < kMostOddElements; i++) {
+        if (!NextElement(enumeration, data)) return nullptr;
         if (data.type == CMPI_ref && data.value.ref != nullptr) return data.value.ref;
     }
     return nullptr;

@@ -2,6 +2,7 @@
 #include <stdlib.h>
 
 #include "PlexorProviderUtil.h"
+#include "PlexorProviderUtilLife.h"
 
 char* __SystemName = nullptr;
 char* __HostName = nullptr;
@@ -41,6 +42,18 @@ void ReleaseName(char*& field) {
     field = nullptr;
 }
 
+/// False after a stop: the names are not this thread's any more.
+bool StoreNames(const CMPIInstance* host) {
+    const LifeGuard life;
+    if (!life.Stands()) return false;
+    // A name that an earlier, incomplete reading left is replaced, not leaked.
+    ReleaseSystemInfo();
+    StoreName(__SystemName, host, "Name");
+    StoreName(__HostName, host, "ElementName");
+    StoreName(__SystemClassName, host, "CreationClassName");
+    return true;
+}
+
 }  // namespace
 
 int InitSystemInfo(const CMPIInstanceMI*, const CMPIContext* ctx) {
@@ -57,13 +70,7 @@ int InitSystemInfo(const CMPIInstanceMI*, const CMPIContext* ctx) {
     }
     syslog(LOG_DEBUG, "%s, CIM Query - EnumInstances: %s", __func__, PathText(LOG_DEBUG, path));
     const CMPIInstance* host = FindHostInstance(ctx, path);
-    if (host == nullptr) return RESULT_NOTHING;
-
-    // A name that an earlier, incomplete reading left is replaced, not leaked.
-    ReleaseSystemInfo();
-    StoreName(__SystemName, host, "Name");
-    StoreName(__HostName, host, "ElementName");
-    StoreName(__SystemClassName, host, "CreationClassName");
+    if (host == nullptr || !StoreNames(host)) return RESULT_NOTHING;
     syslog(LOG_DEBUG, "SYSTEM INFO: HostName %s, SystemName %s, SystemClassName %s\n", __HostName,
            __SystemName, __SystemClassName);
     return RESULT_OK;

@@ -165,7 +165,7 @@ protected:
 };
 
 TEST_F(EntryNestedTest, OnTheSameThreadItDoesNotWait) {
-    const plexortest::HurriedWaits hurry(plexortest::HurriedWaits::Locks);
+    const plexortest::HurriedWaits hurry(plexortest::HurriedWaits::Conditions);
     std::size_t seen = 99;
     CMPIInstanceMI* nested = nullptr;
     whileTheVendorAnswers([&] {
@@ -179,7 +179,7 @@ TEST_F(EntryNestedTest, OnTheSameThreadItDoesNotWait) {
 }
 
 TEST_F(EntryNestedTest, OnAnotherThreadItDoesNotWaitForEver) {
-    const plexortest::HurriedWaits hurry(plexortest::HurriedWaits::Locks);
+    const plexortest::HurriedWaits hurry(plexortest::HurriedWaits::Conditions);
     std::size_t seen = 99;
     CMPIInstanceMI* nested = nullptr;
     whileTheVendorAnswers([&] {
@@ -192,7 +192,7 @@ TEST_F(EntryNestedTest, OnAnotherThreadItDoesNotWaitForEver) {
     EXPECT_EQ(seen, 0u);
     EXPECT_EQ(controllersFor(nested), 2u);
     EXPECT_EQ(CapturedSyslog::count("InitSystemInfo: entering...\n"), 1u);
-    EXPECT_EQ(plexortest::HurriedWaits::locks().back(), std::chrono::seconds(30));
+    EXPECT_EQ(plexortest::HurriedWaits::otherWaits().front(), std::chrono::seconds(30));
 }
 
 // For the thread sanitizer, too: nothing but the provider itself orders these threads.

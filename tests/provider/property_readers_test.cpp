@@ -1,5 +1,6 @@
 // Reading scalar properties and keys without trusting their types.
 #include "PlexorProviderUtil.h"
+#include "PlexorProviderUtilManager.h"
 #include "fake_instance.h"
 #include "provider_fixture.h"
 
@@ -255,7 +256,10 @@ TEST_F(BrokerObjects, CurrentBrokerIsTheFactorysLatest) {
 }
 
 TEST_F(BrokerObjects, NothingIsFlushedWithoutAContext) {
-    FlushContext(nullptr);
+    FlushFactoryContext(nullptr);
+    ItemSpan span(nullptr);
+    EXPECT_EQ(span.Context(), nullptr);
+    span.End();
     EXPECT_EQ(books().count(Entry::ContextFlush), 0u);
 }
 

@@ -14,7 +14,7 @@ public:
     explicit StopAtLine(const std::string& beginning, int number = 1) {
         CapturedSyslog::onLine([this, beginning, number](const LogLine& line) {
             if (line.text.starts_with(beginning) && ++seen_ == number) {
-                EXPECT_TRUE(QuiesceWorkers());
+                EXPECT_TRUE(quiesceWorkers());
             }
         });
     }
@@ -32,13 +32,13 @@ private:
 class StopChecks : public ReconcileTest {
 protected:
     void TearDown() override {
-        AdmitWork();
+        BeginWork();
         ReconcileTest::TearDown();
     }
     /// A rule that asks for the stop while a walk is answered.
     FaultRule stopDuring(const std::string& resultClass) {
         FaultRule rule = walkOver(resultClass);
-        rule.hook = [] { EXPECT_TRUE(QuiesceWorkers()); };
+        rule.hook = [] { EXPECT_TRUE(quiesceWorkers()); };
         return rule;
     }
     static std::size_t linesWith(const char* part) { return CapturedSyslog::countContaining(part); }
@@ -95,11 +95,46 @@ TEST_F(StopChecks, AWalkThatIsAnsweredDuringTheStopChangesNothing) {
     process(102);
     EXPECT_TRUE(StopRequested());
     EXPECT_EQ(ports(), (Ids{"P0", "P1"}));
-    EXPECT_TRUE(loggedOnce(LOG_DEBUG, "ProcessDeviceConfigChange, removecount 2, addcount 2\n"))
-        << "the answer was looked at";
+    EXPECT_TRUE(
+        loggedOnce(LOG_DEBUG, "CrossoutDuplicatedEntries EXITED, rc -100, remove 0, add 0\n"));
+    EXPECT_EQ(linesWith(", removecount "), 0u);
     for (const char* step : {"Updating devices[", "Deleting devices[", "Adding device ops["}) {
         EXPECT_EQ(linesWith(step), 0u) << step;
     }
+}
+
+TEST_F(StopChecks, TheMatchingEndsAtTheRunningRecord) {
+    for (int i = 0; i < 50; i++) addPort("P" + std::to_string(i));
+    process(102);
+    setAllUpdateTimes(0);
+    clearLog();
+    {
+        const StopAtLine stop("dataArr[", 3);
+        process(102);
+    }
+    EXPECT_EQ(linesWith("dataArr["), 50u + 3) << "added, and compared";
+    EXPECT_EQ(ports().size(), 50u);
+    EXPECT_TRUE(
+        loggedOnce(LOG_DEBUG, "CrossoutDuplicatedEntries EXITED, rc -100, remove 0, add 0\n"));
+}
+
+TEST_F(StopChecks, TheWalkOverTheResultsEndsAtTheRunningOne) {
+    for (int i = 0; i < 50; i++) addPort("P" + std::to_string(i));
+    {
+        const StopAtLine stop("OP ", 3);
+        process(102);
+    }
+    EXPECT_EQ(linesWith("added to opArr["), 3u);
+    EXPECT_EQ(ports(), Ids{});
+}
+
+TEST_F(StopChecks, ThePoolWalkEndsAtTheRunningPool) {
+    for (const char* id : {"L0", "L1", "L2"}) addPool(id);
+    {
+        const StopAtLine stop("BuildSinglePoolInfo: pool ");
+        EXPECT_EQ(BuildPoolInfo(&mi, ctx(), ctrl_), 0);
+    }
+    EXPECT_EQ(ctrl_->PoolList->Size, 1u);
 }
 
 TEST_F(StopChecks, TheChainEndsAtTheRunningClass) {
@@ -132,7 +167,7 @@ TEST_F(StopChecks, TheWaitForTheQueueToDrainEnds) {
     int sleeps = 0;
     VirtualClock::onSleep([&sleeps](unsigned int) {
         sleeps++;
-        EXPECT_TRUE(sleeps != 3 || QuiesceWorkers());
+        EXPECT_TRUE(sleeps != 3 || quiesceWorkers());
         if (sleeps == 50) ReleaseDeviceItem(static_cast<Thread_Args_t*>(GetItem(&__FIFO)));
     });
     EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
@@ -145,7 +180,7 @@ TEST_F(StopChecks, TheWaitForRoomInTheQueueEndsAndTheDeviceIsDropped) {
     int sleeps = 0;
     VirtualClock::onSleep([&sleeps](unsigned int) {
         sleeps++;
-        EXPECT_TRUE(sleeps != 3 || QuiesceWorkers());
+        EXPECT_TRUE(sleeps != 3 || quiesceWorkers());
         if (sleeps >= 50) ReleaseDeviceItem(static_cast<Thread_Args_t*>(GetItem(&__FIFO)));
     });
     EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);

@@ -1,6 +1,7 @@
 // Volumes that are turned away, and what a failed query or allocation of a build leaves behind.
 #include "odd_values.h"
 #include "volume_fixture.h"
+#include "worker_harness.h"
 
 namespace plexortest {
 namespace {
@@ -63,7 +64,7 @@ TEST_F(VolumeBuildFailures, PoolQueryFailingTurnsTheVolumeAway) {
 // The pool was not asked for: nothing can be said of the volume, and nothing stays behind.
 TEST_F(VolumeBuildFailures, AStopBeforeThePoolQueryLeavesNothing) {
     testbed::FaultRule rule = queryRule(Entry::Associators, "CIM_ElementSettingData");
-    rule.hook = [] { QuiesceWorkers(); };
+    rule.hook = [] { quiesceWorkers(); };
     faults().add(rule);
     EXPECT_EQ(buildVolume(), -1);
     expectNothingCached();

@@ -12,7 +12,7 @@
 #include <mutex>
 #include <thread>
 
-#include "PlexorProvider.h"
+#include "PlexorProviderCfg.h"
 
 namespace plexortest {
 
@@ -25,6 +25,11 @@ bool comesTrue(Condition condition) {
         std::this_thread::sleep_for(std::chrono::milliseconds(1));
     }
     return true;
+}
+
+/// The quiet stop with the limit of a cleanup that does not terminate.
+inline bool quiesceWorkers() {
+    return QuiesceWorkers(Deadline::In(30));
 }
 
 /// Holds whoever passes until it is opened.

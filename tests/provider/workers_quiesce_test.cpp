@@ -24,12 +24,6 @@ protected:
     void occupyWorker(Gate& gate) {
         ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
     }
-    /// Lets the workers go on with what is queued, at once.
-    static void admitWork() {
-        AdmitWork();
-        pthread_cond_broadcast(&PlexorThreadCond);
-    }
-
     VendorObjects vendor_{repository};
     VendorController array_;
     RaidController_t* ctrl_ = nullptr;
@@ -38,7 +32,7 @@ protected:
 TEST_F(WorkersQuiesce, IdleWorkersNeedNoWaiting) {
     const HurriedWaits hurry;
     EXPECT_FALSE(StopRequested());
-    EXPECT_TRUE(QuiesceWorkers());
+    EXPECT_TRUE(quiesceWorkers());
     EXPECT_TRUE(StopRequested());
     EXPECT_TRUE(HurriedWaits::otherWaits().empty());
     EXPECT_EQ(exitLines(), 0u) << "they stay, to be stopped later";
@@ -52,7 +46,7 @@ TEST_F(WorkersQuiesce, ItWaitsForEveryRunningItem) {
     occupyWorker(second);
     ASSERT_TRUE(second.awaitArrivals(1));
 
-    auto quiet = std::async(std::launch::async, QuiesceWorkers);
+    auto quiet = std::async(std::launch::async, quiesceWorkers);
     ASSERT_TRUE(comesTrue(StopRequested));
     EXPECT_EQ(quiet.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     first.open();
@@ -74,16 +68,16 @@ TEST_F(WorkersQuiesce, AnItemRunsUntilItsThreadIsFlushed) {
     tasks_.queue([](CMPIContext*, void*) {});
     ASSERT_TRUE(gate.awaitArrivals(1));
 
-    auto quiet = std::async(std::launch::async, QuiesceWorkers);
+    auto quiet = std::async(std::launch::async, quiesceWorkers);
     ASSERT_TRUE(comesTrue(StopRequested));
     EXPECT_EQ(quiet.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     gate.open();
     EXPECT_TRUE(quiet.get());
 }
 
-TEST_F(WorkersQuiesce, NoItemBeginsUntilWorkIsAdmittedAgain) {
+TEST_F(WorkersQuiesce, NoItemBeginsInThisLifeNorByItsWorkersInTheNext) {
     const HurriedWaits hurry(HurriedWaits::Conditions);
-    ASSERT_TRUE(QuiesceWorkers());
+    ASSERT_TRUE(quiesceWorkers());
     tasks_.queue([](CMPIContext*, void*) {});
     pthread_cond_broadcast(&PlexorThreadCond);
     const std::size_t looks = HurriedWaits::workWaits().size();
@@ -94,9 +88,12 @@ TEST_F(WorkersQuiesce, NoItemBeginsUntilWorkIsAdmittedAgain) {
     EXPECT_EQ(tasks_.ended(), 0);
     EXPECT_EQ(queuedItems(), 1u);
 
-    AdmitWork();
+    BeginWork();
     EXPECT_FALSE(StopRequested());
-    EXPECT_TRUE(comesTrue([this] { return tasks_.ended() == 1; }));
+    EXPECT_TRUE(comesTrue([this] { return exitLines() == 2; })) << "their life is over";
+    EXPECT_EQ(queuedItems(), 1u);
+    running_ = false;
+    CleanupPlexorThreads();
 }
 
 TEST_F(WorkersQuiesce, WhatIsQueuedBehindARunningItemDoesNotBegin) {
@@ -107,13 +104,14 @@ TEST_F(WorkersQuiesce, WhatIsQueuedBehindARunningItemDoesNotBegin) {
     ASSERT_TRUE(gate.awaitArrivals(2));
     for (int i = 0; i < 5; i++) tasks_.queue([](CMPIContext*, void*) {});
 
-    auto quiet = std::async(std::launch::async, QuiesceWorkers);
+    auto quiet = std::async(std::launch::async, quiesceWorkers);
     ASSERT_TRUE(comesTrue(StopRequested));
     gate.open();
     ASSERT_TRUE(quiet.get());
     EXPECT_EQ(tasks_.ended(), 2);
     EXPECT_EQ(queuedItems(), 5u);
-    admitWork();
+    running_ = false;
+    CleanupPlexorThreads();
 }
 
 TEST_F(WorkersQuiesce, AStuckItemIsWaitedForThirtySecondsInAll) {
@@ -123,7 +121,7 @@ TEST_F(WorkersQuiesce, AStuckItemIsWaitedForThirtySecondsInAll) {
     ASSERT_TRUE(gate.awaitArrivals(1));
     const HurriedWaits hurry;
 
-    EXPECT_FALSE(QuiesceWorkers());
+    EXPECT_FALSE(quiesceWorkers());
 
     const auto waits = HurriedWaits::otherWaits();
     ASSERT_FALSE(waits.empty());
@@ -131,7 +129,7 @@ TEST_F(WorkersQuiesce, AStuckItemIsWaitedForThirtySecondsInAll) {
     EXPECT_GE(waits[0], std::chrono::seconds(29));
     gate.open();
     EXPECT_TRUE(comesTrue([this] { return tasks_.ended() == 1; }));
-    EXPECT_TRUE(QuiesceWorkers()) << "asked again when it has ended";
+    EXPECT_TRUE(quiesceWorkers()) << "asked again when it has ended";
 }
 
 TEST_F(WorkersQuiesce, ARefreshUnderWayAsksNothingMoreAndTouchesNoRecord) {
@@ -142,7 +140,7 @@ TEST_F(WorkersQuiesce, ARefreshUnderWayAsksNothingMoreAndTouchesNoRecord) {
     repository.clearInstances();
     vendor_.controller("C0");
     books().clearCalls();
-    ASSERT_TRUE(QuiesceWorkers());
+    ASSERT_TRUE(quiesceWorkers());
 
     ctrl_->PortUpdateTime = 0;
     EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
@@ -170,13 +168,14 @@ TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
     ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
     ASSERT_TRUE(gate.awaitArrivals(1));
 
-    auto quiet = std::async(std::launch::async, QuiesceWorkers);
+    auto quiet = std::async(std::launch::async, quiesceWorkers);
     ASSERT_TRUE(comesTrue(StopRequested));
     gate.open();
     ASSERT_TRUE(quiet.get());
 
     EXPECT_EQ(associatorQueries(), std::vector<std::string>{"CIM_SystemDevice>CIM_SASSATAPort"});
-    EXPECT_TRUE(loggedOnce(LOG_DEBUG, "ProcessDeviceConfigChange, removecount 1, addcount 2\n"));
+    EXPECT_TRUE(
+        loggedOnce(LOG_DEBUG, "CrossoutDuplicatedEntries EXITED, rc -100, remove 0, add 0\n"));
     ASSERT_EQ(ctrl_->PortList->Size, 1u);
     EXPECT_STREQ(static_cast<SASSATAPort_t*>(ctrl_->PortList->Head->Data)->DeviceID, "P0");
 }
@@ -193,7 +192,7 @@ TEST_F(WorkersQuiesce, AnInventoryUnderWayIsGivenUp) {
         return timesLogged(LOG_ERR, "BuildLogicalDeviceInfo: FIFO full, waiting...\n") > 2;
     }));
 
-    auto quiet = std::async(std::launch::async, QuiesceWorkers);
+    auto quiet = std::async(std::launch::async, quiesceWorkers);
     ASSERT_TRUE(comesTrue(StopRequested));
     gate.open();
     ASSERT_TRUE(quiet.get());

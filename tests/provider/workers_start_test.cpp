@@ -88,7 +88,8 @@ TEST_F(WorkersStart, WithoutMemoryThereIsNoWorker) {
     tasks_.queue([](CMPIContext*, void*) {});
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(tasks_.ended(), 1);
-    EXPECT_EQ(books().count(Entry::AttachThread), 1u);
+    EXPECT_EQ(books().count(Entry::PrepareAttachThread), 2u);
+    EXPECT_EQ(books().count(Entry::DetachThread), 1u) << "the context that nobody uses is ended";
 }
 
 TEST_F(WorkersStart, StoppingNoWorkerIsHarmless) {

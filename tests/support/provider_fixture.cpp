@@ -54,7 +54,7 @@ void ProviderTest::SetUp() {
     scope_.emplace(broker);
     setBroker(broker.handle());
     resetGlobals();
-    AdmitWork();
+    BeginWork();
     CapturedSyslog::reset();
 }
 
@@ -101,7 +101,7 @@ void ProviderTest::startWorkers() {
 
 void ProviderTest::stopWorkers() {
     if (PlexorThreads[0] == 0 && PlexorThreads[1] == 0) return;
-    EXPECT_TRUE(QuiesceWorkers()) << "a work function does not end";
+    EXPECT_TRUE(QuiesceWorkers(Deadline::In(30))) << "a work function does not end";
     // A worker that had not begun to wait misses the first call; the second takes it too.
     CleanupPlexorThreads();
     CleanupPlexorThreads();
