@@ -12,11 +12,11 @@
 namespace plexortest {
 
 /// While one lives, a wait with a deadline lasts a thousandth of what was asked for:
-/// pthread_cond_clockwait, pthread_clockjoin_np and pthread_mutex_timedlock. Its end waits for the
-/// hurried waits on conditions to end. Not to be nested.
+/// pthread_cond_clockwait and pthread_clockjoin_np. Its end waits for the hurried waits on
+/// conditions to end. Not to be nested.
 class HurriedWaits {
 public:
-    enum Which { Conditions = 1, Joins = 2, Locks = 4, All = 7 };
+    enum Which { Conditions = 1, Joins = 2, All = 3 };
 
     explicit HurriedWaits(Which which = All);
     ~HurriedWaits();
@@ -24,12 +24,10 @@ public:
     HurriedWaits& operator=(const HurriedWaits&) = delete;
 
     using Duration = std::chrono::milliseconds;
-    /// What the waits for work, all other waits on a condition, the joins, and the waits for a
-    /// mutex asked for, rounded.
+    /// What the waits for work, all other waits on a condition, and the joins asked for, rounded.
     static std::vector<Duration> workWaits();
     static std::vector<Duration> otherWaits();
     static std::vector<Duration> joins();
-    static std::vector<Duration> locks();
 };
 
 /// While one lives, counts how the workers' condition is woken. Not to be nested.

@@ -24,8 +24,7 @@ constexpr long long kNanoseconds = 1000000000;
 std::atomic<int> hurried = 0;  // bits of HurriedWaits::Which
 std::atomic<int> waiting = 0;  // threads in a hurried wait on a condition
 std::mutex noteMutex;
-std::vector<Duration> notedWorkWaits, notedOtherWaits, notedJoins,
-    notedLocks;  // guarded by noteMutex
+std::vector<Duration> notedWorkWaits, notedOtherWaits, notedJoins;  // guarded by noteMutex
 
 std::atomic<bool> counting = false;
 std::atomic<int> signalCount = 0, broadcastCount = 0, underMutexCount = 0;
@@ -118,16 +117,6 @@ int pthread_clockjoin_np(pthread_t thread, void** value, clockid_t clock,
     return real(thread, value, &realTime);
 }
 
-int pthread_mutex_timedlock(pthread_mutex_t* mutex, const timespec* deadline) noexcept {
-    static const auto real =
-        next<int(pthread_mutex_t*, const timespec*)>("pthread_mutex_timedlock");
-    if ((hurried & HurriedWaits::Locks) == 0) return real(mutex, deadline);
-    const long long left = timeLeft(CLOCK_REALTIME, *deadline);
-    note(notedLocks, left);
-    const timespec sooner = timeIn(CLOCK_REALTIME, left / kHurry);
-    return real(mutex, &sooner);
-}
-
 int pthread_cond_signal(pthread_cond_t* cond) noexcept {
     static const auto real = next<int(pthread_cond_t*)>("pthread_cond_signal");
     countWakeUp(cond, signalCount);
@@ -149,7 +138,6 @@ HurriedWaits::HurriedWaits(Which which) {
     notedWorkWaits.clear();
     notedOtherWaits.clear();
     notedJoins.clear();
-    notedLocks.clear();
     hurried = which;
 }
 
@@ -166,10 +154,6 @@ std::vector<Duration> HurriedWaits::otherWaits() {
 }
 std::vector<Duration> HurriedWaits::joins() {
     return noted(notedJoins);
-}
-
-std::vector<Duration> HurriedWaits::locks() {
-    return noted(notedLocks);
 }
 
 WakeUpCounter::WakeUpCounter() {
