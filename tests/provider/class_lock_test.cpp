@@ -1,0 +1,153 @@
+// One device class whose refresh hangs in the vendor's provider, and all the others.
+#include <dlfcn.h>
+#include <time.h>
+
+#include <atomic>
+#include <future>
+
+#include "PlexorProviderCfgClassLock.h"
+#include "reconcile_fixture.h"
+#include "worker_harness.h"
+
+namespace {
+
+// The monotonic clock of the provider's deadlines, ahead of the real one by that many seconds.
+std::atomic<time_t> ahead = 0;
+
+}  // namespace
+
+// In front of the C library's. The waits themselves stay real: a deadline that is past is past.
+extern "C" int clock_gettime(clockid_t clock, struct timespec* now) noexcept {
+    static const auto real =
+        reinterpret_cast<int (*)(clockid_t, struct timespec*)>(dlsym(RTLD_NEXT, "clock_gettime"));
+    const int rc = real(clock, now);
+    if (clock == CLOCK_MONOTONIC) now->tv_sec += ahead;
+    return rc;
+}
+
+namespace plexortest {
+namespace {
+
+using testbed::FaultRule;
+
+constexpr const char kPassedOver[] =
+    "ClassLock: controller C0, CIM_Battery: a refresh has been under way for 30 secs, passed over "
+    "until it ends\n";
+
+class ClassLockTest : public ReconcileTest {
+protected:
+    void SetUp() override {
+        ReconcileTest::SetUp();
+        addBattery("B0");
+        addPort("P0");
+        process(103);
+        process(102);
+        setAllUpdateTimes(0);
+        clearLog();
+    }
+    void TearDown() override {
+        gate_.open();
+        ahead = 0;
+        ReconcileTest::TearDown();
+    }
+    /// A refresh of the batteries on a thread of its own, that hangs in its vendor call.
+    std::future<void> hangingRefresh() {
+        FaultRule rule = walkOver("CIM_Battery");
+        rule.times = 1;
+        rule.hook = [this] { gate_.pass(); };
+        faults().add(rule);
+        auto hanging = std::async(std::launch::async, [this] {
+            const testbed::Broker::CallScope scope(broker);
+            ProcessDeviceConfigChange(&mi, scope.context(), ctrl_, 103);
+        });
+        EXPECT_TRUE(gate_.awaitArrivals(1));
+        return hanging;
+    }
+    static std::size_t linesWith(const char* part) { return CapturedSyslog::countContaining(part); }
+
+    Gate gate_;
+};
+
+TEST_F(ClassLockTest, AHungClassIsPassedOverAndTheOthersAreServed) {
+    const auto hanging = hangingRefresh();
+    const GateOpener opener(gate_);
+    ahead = 30;
+    addPort("P1");
+    process(103);
+    process(102);
+    EXPECT_EQ(linesWith("Action 103"), 1u) << "the hung one's own";
+    EXPECT_EQ(ctrl_->BatteryUpdateTime, 0) << "it stays due";
+    EXPECT_EQ(ports(), (Ids{"P0", "P1"}));
+    EXPECT_EQ(timesLogged(LOG_ERR, kPassedOver), 1u);
+}
+
+TEST_F(ClassLockTest, ItIsToldOnceWhenItBeginsAndOnceWhenItEnds) {
+    auto hanging = hangingRefresh();
+    const GateOpener opener(gate_);
+    ahead = 30;
+    for (int i = 0; i < 5; i++) process(103);
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR), std::vector<std::string>{kPassedOver});
+    ahead = 3600;
+    gate_.open();
+    hanging.get();
+    const auto lines = CapturedSyslog::linesAt(LOG_ERR);
+    ASSERT_EQ(lines.size(), 2u);
+    EXPECT_TRUE(
+        lines[1].starts_with("ClassLock: controller C0, CIM_Battery: a refresh has ended after 36"))
+        << lines[1];
+    EXPECT_TRUE(lines[1].ends_with(" secs, served again\n")) << lines[1];
+    addBattery("B1");
+    setAllUpdateTimes(0);
+    process(103);
+    EXPECT_EQ(ctrl_->BatteryList->Size, 2u);
+}
+
+TEST_F(ClassLockTest, UntilThenTheSecondWaits) {
+    auto hanging = hangingRefresh();
+    const GateOpener opener(gate_);
+    ahead = 28;
+    auto waiting = std::async(std::launch::async, [this] {
+        const testbed::Broker::CallScope scope(broker);
+        ProcessDeviceConfigChange(&mi, scope.context(), ctrl_, 103);
+    });
+    EXPECT_EQ(waiting.wait_for(std::chrono::milliseconds(100)), std::future_status::timeout);
+    gate_.open();
+    hanging.get();
+    waiting.get();
+    EXPECT_EQ(linesWith("Action 103"), 2u);
+    EXPECT_EQ(linesWith(", skip"), 1u) << "the second finds it not due";
+    EXPECT_EQ(linesWith("ClassLock"), 0u);
+}
+
+TEST_F(ClassLockTest, AWaitEndsAtAStop) {
+    const auto hanging = hangingRefresh();
+    const GateOpener opener(gate_);
+    auto waiting = std::async(std::launch::async, [this] {
+        const testbed::Broker::CallScope scope(broker);
+        ProcessDeviceConfigChange(&mi, scope.context(), ctrl_, 103);
+    });
+    EXPECT_EQ(waiting.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
+    RequestStop();
+    waiting.get();
+    EXPECT_EQ(linesWith("Action 103"), 1u);
+}
+
+TEST_F(ClassLockTest, AnHourOfAHungClassKeepsNobodyElseFromFollowingTheHardware) {
+    const auto hanging = hangingRefresh();
+    const GateOpener opener(gate_);
+    for (int minute = 1; minute <= 60; minute++) {
+        ahead = 60 * minute;
+        VirtualClock::advance(60);
+        addPort("Q" + std::to_string(minute));
+        const std::size_t queries = associatorQueries().size();
+        process(103);
+        process(102);
+        process(101);
+        EXPECT_EQ(ctrl_->PortList->Size, static_cast<unsigned int>(minute) + 1);
+        EXPECT_EQ(associatorQueries().size(), queries + 4) << "ports, pools, drives, volumes";
+    }
+    EXPECT_EQ(timesLogged(LOG_ERR, kPassedOver), 1u);
+}
+
+}  // namespace
+}  // namespace plexortest

@@ -1,0 +1,125 @@
+// A second initialisation in the same mapping, also beside a worker that the first left behind.
+#include <thread>
+
+#include "PlexorProviderCfg.h"
+#include "entry_fixture.h"
+#include "real_waits.h"
+#include "worker_harness.h"
+
+namespace {
+
+using plexortest::CapturedSyslog;
+using plexortest::Gate;
+using plexortest::GateOpener;
+using plexortest::VirtualClock;
+using testbed::Entry;
+
+class LivesTest : public plexortest::EntryTest {
+protected:
+    void SetUp() override {
+        EntryTest::SetUp();
+        presentVendor();
+    }
+    void TearDown() override {
+        // What the stuck worker of a first life keeps is its own.
+        gate_.open();
+        EXPECT_TRUE(plexortest::WorkersMeet::untilIdle());
+        EntryTest::TearDown();
+    }
+    testbed::Response drives() {
+        return testbed::InstanceClient(broker, &mi)
+            .enumerateInstances("Tovexa_PlexorStorageExtent");
+    }
+    CMPIrc cleanUp() { return PlexorProviderCleanup(&mi, ctx(), 1).rc; }
+    /// Lets the next walk over the batteries wait at the gate.
+    void holdBatteryWalk() {
+        testbed::FaultRule rule;
+        rule.entry = Entry::Associators;
+        rule.resultClass = "CIM_Battery";
+        rule.times = 1;
+        rule.hook = [this] { gate_.pass(); };
+        faults().add(rule);
+    }
+    /// Makes a worker of this life hang in a refresh of the batteries, then ends the life.
+    void endLifeWithAStuckWorker() {
+        holdBatteryWalk();
+        VirtualClock::advance(100);
+        testbed::InstanceClient(broker, &mi).enumerateInstances("Tovexa_PlexorBattery");
+        ASSERT_TRUE(gate_.awaitArrivals(1));
+        const plexortest::HurriedWaits hurry;
+        EXPECT_EQ(cleanUp(), CMPI_RC_OK);
+    }
+    static std::size_t times(const std::string& line) { return CapturedSyslog::count(line); }
+
+    Gate gate_;
+};
+
+TEST_F(LivesTest, TheSecondServesAndRefreshesCompletely) {
+    callFactory();
+    ASSERT_TRUE(inventoryTaken());
+    settleWorkers();
+    ASSERT_EQ(cleanUp(), CMPI_RC_OK);
+    EXPECT_EQ(TerminateThread, 1u);
+    EXPECT_EQ(plexortest::threadActivityDone(), 1u) << "kept for whoever looks at it";
+
+    callFactory();
+    EXPECT_TRUE(plexortest::soon([this] { return drives().instances.size() == 1; }));
+    EXPECT_TRUE(plexortest::soon([] { return times("DoBuildDeviceInfoAsync done.") == 2; }));
+    vendor.battery(vendor.controller("C0"), "b2");
+    VirtualClock::advance(100);
+    testbed::InstanceClient client(broker, &mi);
+    EXPECT_TRUE(plexortest::soon(
+        [&] { return client.enumerateInstances("Tovexa_PlexorBattery").instances.size() == 2; }));
+    EXPECT_EQ(TerminateThread, 1u);
+}
+
+TEST_F(LivesTest, ARefreshWaitsForTheSecondsOwnInventory) {
+    callFactory();
+    ASSERT_TRUE(inventoryTaken());
+    settleWorkers();
+    ASSERT_EQ(cleanUp(), CMPI_RC_OK);
+    {
+        const plexortest::WorkersHeld held;
+        callFactory();
+    }
+    RaidController_t* const ctrl = firstController();
+    ctrl->BatteryUpdateTime = 0;
+    testbed::FaultRule rule;
+    rule.entry = Entry::Associators;
+    rule.assocClass = "CIM_HostedStoragePool";
+    rule.times = 1;
+    rule.hook = [this] { gate_.pass(); };
+    faults().add(rule);
+    if (!gate_.awaitArrivals(1)) GTEST_SKIP() << "the inventory was quicker";
+    EXPECT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, 103), 0);
+    EXPECT_EQ(times("HandleDeviceConfigChange: BuildDeviceInfoAsync is still running, skip action "
+                    "103\n"),
+              1u);
+}
+
+TEST_F(LivesTest, TheSecondIsCompleteBesideAStuckWorkerOfTheFirst) {
+    callFactory();
+    ASSERT_TRUE(inventoryTaken());
+    settleWorkers();
+    endLifeWithAStuckWorker();
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR).back(),
+              "PlexorProviderCleanup: a worker is still busy, the inventory stays in memory\n");
+    const std::size_t given = books().liveClones();
+    EXPECT_GT(given, 0u);
+
+    callFactory();
+    ASSERT_TRUE(plexortest::soon([] { return times("DoBuildDeviceInfoAsync done.") == 2; }))
+        << "the stuck worker is not waited for";
+    EXPECT_EQ(drives().instances.size(), 1u);
+    EXPECT_GT(books().liveClones(), given);
+
+    // It comes back when the second life has long begun: it leaves, touching nothing.
+    const std::size_t exits = CapturedSyslog::countContaining(" exiting...\n");
+    gate_.open();
+    EXPECT_TRUE(plexortest::soon(
+        [&] { return CapturedSyslog::countContaining(" exiting...\n") == exits + 1; }));
+    EXPECT_EQ(drives().instances.size(), 1u);
+    expectLeftClones(given);
+}
+
+}  // namespace

@@ -1,0 +1,266 @@
+// Requests, factory calls and cleanups that meet on several threads.
+#include <atomic>
+#include <future>
+#include <thread>
+#include <vector>
+
+#include "PlexorProviderCfg.h"
+#include "entry_fixture.h"
+#include "real_waits.h"
+#include "worker_harness.h"
+
+namespace {
+
+using plexortest::CapturedSyslog;
+using plexortest::Gate;
+using plexortest::GateOpener;
+using plexortest::HurriedWaits;
+using testbed::Entry;
+
+class MeetingCallsTest : public plexortest::EntryTest {
+protected:
+    void SetUp() override {
+        EntryTest::SetUp();
+        presentVendor();
+    }
+    void load() {
+        callFactory();
+        ASSERT_TRUE(inventoryTaken());
+        settleWorkers();
+        CapturedSyslog::clear();
+    }
+    testbed::FaultRule waitingAt(Entry entry, Gate& gate) {
+        testbed::FaultRule rule;
+        rule.entry = entry;
+        rule.times = 1;
+        rule.hook = [&gate] { gate.pass(); };
+        return rule;
+    }
+    std::future<std::size_t> requestDrives() {
+        return std::async(std::launch::async, [this] {
+            return testbed::InstanceClient(broker, &mi)
+                .enumerateInstances("Tovexa_PlexorStorageExtent")
+                .instances.size();
+        });
+    }
+    std::future<CMPIrc> cleanUpElsewhere(bool terminating = false) {
+        return std::async(std::launch::async, [this, terminating] {
+            return testbed::InstanceClient(broker, &mi).cleanup(terminating);
+        });
+    }
+    std::future<CMPIInstanceMI*> callFactoryElsewhere() {
+        return std::async(std::launch::async, [this] {
+            const testbed::Broker::CallScope scope(broker);
+            return PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr);
+        });
+    }
+    static bool cleanupsInside(std::size_t count) {
+        return plexortest::soon([count] {
+            return CapturedSyslog::count("PlexorProviderCleanup: ENTER...\n") == count;
+        });
+    }
+    template <class Future>
+    static bool stillWaits(const Future& future) {
+        return future.wait_for(std::chrono::milliseconds(30)) == std::future_status::timeout;
+    }
+};
+
+TEST_F(MeetingCallsTest, TheReleaseWaitsForARequest) {
+    load();
+    Gate gate;
+    const GateOpener opener(gate);
+    faults().add(waitingAt(Entry::NewInstance, gate));
+    auto request = requestDrives();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto cleanup = cleanUpElsewhere(true);
+    ASSERT_TRUE(cleanupsInside(1));
+    EXPECT_TRUE(stillWaits(cleanup));
+    EXPECT_EQ(CapturedSyslog::countContaining(" deleted\n"), 0u);
+    gate.open();
+    EXPECT_EQ(request.get(), 1u) << "complete";
+    EXPECT_EQ(cleanup.get(), CMPI_RC_OK);
+    EXPECT_EQ(controllers(), 0u);
+}
+
+TEST_F(MeetingCallsTest, ARequestThatBeginsDuringACleanupFindsNothing) {
+    load();
+    std::size_t seen = 99;
+    CapturedSyslog::onLine([&](const plexortest::LogLine& line) {
+        if (line.text.starts_with("Controller Model C0")) seen = requestDrives().get();
+    });
+    testbed::InstanceClient(broker, &mi).cleanup(true);
+    EXPECT_EQ(seen, 0u);
+}
+
+TEST_F(MeetingCallsTest, AHangingRequestKeepsWhatItUses) {
+    load();
+    Gate gate;
+    faults().add(waitingAt(Entry::NewInstance, gate));
+    auto request = requestDrives();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    const RaidController_t* const used = firstController();
+    plexortest::VirtualClock::advance(1000);
+    {
+        const HurriedWaits hurry;
+        EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(false), CMPI_RC_OK);
+        EXPECT_LE(HurriedWaits::otherWaits().front(), std::chrono::seconds(30));
+    }
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR).back(),
+              "PlexorProviderCleanup: a request is still busy, the inventory stays in memory\n");
+    EXPECT_EQ(controllers(), 0u);
+    EXPECT_EQ(GetSystemName(), nullptr);
+    EXPECT_STREQ(used->DeviceID, "C0");
+    const std::size_t kept = books().liveClones();
+    gate.open();
+    EXPECT_EQ(request.get(), 1u);
+    expectLeftClones(kept);
+}
+
+TEST_F(MeetingCallsTest, TerminatingItWaitsThreeSeconds) {
+    load();
+    Gate gate;
+    faults().add(waitingAt(Entry::NewInstance, gate));
+    auto request = requestDrives();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    {
+        const HurriedWaits hurry;
+        EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+        const auto waits = HurriedWaits::otherWaits();
+        ASSERT_FALSE(waits.empty());
+        EXPECT_LE(waits.front(), std::chrono::seconds(3));
+        EXPECT_GE(waits.front(), std::chrono::seconds(2));
+    }
+    expectLeftClones(books().liveClones());
+    gate.open();
+    request.get();
+}
+
+TEST_F(MeetingCallsTest, ACleanupEndsTheInitialisationAfterItsVendorCall) {
+    Gate gate;
+    const GateOpener opener(gate);
+    testbed::FaultRule slow = waitingAt(Entry::EnumerateInstances, gate);
+    slow.className = "CIM_RegisteredProfile";
+    faults().add(slow);
+    auto factory = callFactoryElsewhere();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto cleanup = cleanUpElsewhere(true);
+    ASSERT_TRUE(cleanupsInside(1));
+    EXPECT_TRUE(stillWaits(cleanup));
+    gate.open();
+    EXPECT_NE(factory.get(), nullptr);
+    EXPECT_EQ(cleanup.get(), CMPI_RC_OK);
+    EXPECT_EQ(books().count(Entry::Associators), 0u) << "nothing more is asked";
+    EXPECT_EQ(CapturedSyslog::countContaining("thread 0 created"), 0u);
+    EXPECT_EQ(CapturedSyslog::countContaining("No instance of Host Hard RAID Controller"), 0u);
+    EXPECT_EQ(initialized(), 0);
+    EXPECT_EQ(controllers(), 0u);
+    EXPECT_EQ(GetSystemName(), nullptr);
+}
+
+TEST_F(MeetingCallsTest, AFactoryCallThatWaitsForItsTurnLeavesWithTheCleanup) {
+    Gate gate;
+    const GateOpener opener(gate);
+    testbed::FaultRule slow = waitingAt(Entry::EnumerateInstances, gate);
+    slow.className = "CIM_RegisteredProfile";
+    faults().add(slow);
+    auto first = callFactoryElsewhere();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto second = callFactoryElsewhere();
+    ASSERT_TRUE(
+        plexortest::soon([] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 2; }));
+    EXPECT_TRUE(stillWaits(second));
+    auto cleanup = cleanUpElsewhere(true);
+    EXPECT_NE(second.get(), nullptr) << "before the first has its answer";
+    gate.open();
+    first.get();
+    EXPECT_EQ(cleanup.get(), CMPI_RC_OK);
+    EXPECT_EQ(initialized(), 0);
+    EXPECT_EQ(CapturedSyslog::count("InitSystemInfo: entering...\n"), 1u);
+}
+
+TEST_F(MeetingCallsTest, AFactoryCallDuringACleanupBuildsAnewAfterIt) {
+    load();
+    std::future<CMPIInstanceMI*> factory;
+    CapturedSyslog::onLine([&](const plexortest::LogLine& line) {
+        if (line.text.starts_with("Controller Model C0")) factory = callFactoryElsewhere();
+    });
+    testbed::InstanceClient(broker, &mi).cleanup(true);
+    factory.get();
+    EXPECT_EQ(initialized(), 1);
+    EXPECT_EQ(controllers(), 1u);
+    CapturedSyslog::onLine(nullptr);
+    EXPECT_TRUE(plexortest::soon([this] { return requestDrives().get() == 1; }));
+}
+
+TEST_F(MeetingCallsTest, AnInitialisationThatHangsIsGivenUp) {
+    Gate gate;
+    testbed::FaultRule slow = waitingAt(Entry::Associators, gate);
+    slow.assocClass = "CIM_Realizes";
+    faults().add(slow);
+    auto factory = callFactoryElsewhere();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    {
+        const HurriedWaits hurry;
+        EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+    }
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR).back(),
+              "PlexorProviderCleanup: a factory call is still busy, the inventory stays in "
+              "memory\n");
+    // Its answer comes when the next life has begun, and changes nothing there.
+    callFactory();
+    EXPECT_EQ(controllers(), 1u);
+    gate.open();
+    factory.get();
+    EXPECT_EQ(controllers(), 1u);
+    EXPECT_EQ(initialized(), 1);
+    EXPECT_EQ(CapturedSyslog::countContaining("thread 0 created"), 1u);
+    EXPECT_TRUE(plexortest::soon([this] { return requestDrives().get() == 1; }));
+}
+
+TEST_F(MeetingCallsTest, NineCleanupsAtOnceAreOne) {
+    load();
+    Gate gate;
+    plexortest::VirtualClock::onSleep([&gate](unsigned int) { gate.pass(); });
+    std::vector<std::future<CMPIrc>> cleanups;
+    for (int i = 0; i < 9; i++) cleanups.push_back(cleanUpElsewhere(true));
+    ASSERT_TRUE(cleanupsInside(9));
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    for (const auto& cleanup : cleanups) EXPECT_TRUE(stillWaits(cleanup));
+    gate.open();
+    for (auto& cleanup : cleanups) EXPECT_EQ(cleanup.get(), CMPI_RC_OK);
+    EXPECT_EQ(CapturedSyslog::countContaining("Controller Model C0"), 1u);
+    EXPECT_EQ(CapturedSyslog::count("PlexorProviderCleanup: EXIT\n"), 9u);
+    int exitWaits = 0;
+    for (const plexortest::Sleep& sleep : plexortest::VirtualClock::sleeps()) {
+        if (sleep.seconds == 3) exitWaits++;
+    }
+    EXPECT_EQ(exitWaits, 1);
+}
+
+// For the sanitizers: everything at once, at any moment.
+TEST_F(MeetingCallsTest, EverythingAtOnce) {
+    CapturedSyslog::discard(true);
+    std::atomic<bool> over = false;
+    std::vector<std::thread> threads;
+    for (int i = 0; i < 4; i++) {
+        threads.emplace_back([&] {
+            while (!over) EXPECT_LE(requestDrives().get(), 1u);
+        });
+    }
+    for (int i = 0; i < 2; i++) {
+        threads.emplace_back([&] {
+            while (!over) EXPECT_NE(callFactoryElsewhere().get(), nullptr);
+        });
+    }
+    for (int round = 0; round < 30; round++) {
+        auto second = cleanUpElsewhere(true);
+        EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+        EXPECT_EQ(second.get(), CMPI_RC_OK);
+    }
+    over = true;
+    for (std::thread& thread : threads) thread.join();
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+    EXPECT_EQ(controllers(), 0u);
+}
+
+}  // namespace
