@@ -2,11 +2,20 @@
 
 #include <algorithm>
 #include <atomic>
+#include <stdexcept>
 #include <utility>
 
 #include "object.h"
 
 namespace testbed {
+
+namespace {
+
+bool isManagers(const Object& object) {
+    return object.kind() == ObjectKind::Context || object.kind() == ObjectKind::Result;
+}
+
+}  // namespace
 
 std::uint64_t threadNumber() {
     static std::atomic<std::uint64_t> last = 0;
@@ -28,6 +37,17 @@ std::vector<std::shared_ptr<Object>> ObjectList::take() {
     return std::exchange(objects_, {});
 }
 
+std::size_t ObjectList::count() const {
+    return static_cast<std::size_t>(std::count_if(
+        objects_.begin(), objects_.end(),
+        [](const auto& object) { return object->isAlive() && !isManagers(*object); }));
+}
+
+std::size_t Arena::count() {
+    const std::lock_guard lock(mutex_);
+    return objects_.count();
+}
+
 void Arena::add(std::shared_ptr<Object> object) {
     const std::lock_guard lock(mutex_);
     objects_.add(std::move(object));
@@ -47,9 +67,7 @@ void Arena::flush() {
     auto objects = take();
     std::reverse(objects.begin(), objects.end());
     for (std::shared_ptr<Object>& object : objects) {
-        const bool isManagers =
-            object->kind() == ObjectKind::Context || object->kind() == ObjectKind::Result;
-        if (isManagers) {
+        if (isManagers(*object)) {
             add(std::move(object));
         } else {
             object->end();
@@ -57,10 +75,37 @@ void Arena::flush() {
     }
 }
 
-std::shared_ptr<Arena> ThreadArenas::open(const ContextObject* context) {
-    auto arena = std::make_shared<Arena>(context);
+ThreadArenas::ThreadArenas(bool perThread, ThreadEnd atThreadEnd)
+    : perThread_(perThread), atThreadEnd_(std::move(atThreadEnd)) {
+    // Not a thread_local object: that would keep a module with this code mapped until the thread's
+    // end.
+    if (atThreadEnd_ && pthread_key_create(&threadEnd_, threadEnds) != 0)
+        throw std::runtime_error("no more keys for thread ends");
+}
+
+ThreadArenas::~ThreadArenas() {
+    if (atThreadEnd_) pthread_key_delete(threadEnd_);
+}
+
+void ThreadArenas::threadEnds(void* arenas) {
+    auto& self = *static_cast<ThreadArenas*>(arenas);
+    const Stack left = self.ofThread();
+    std::size_t objects = 0;
+    for (const std::shared_ptr<Arena>& arena : left) objects += arena->count();
+    self.atThreadEnd_(objects);
+    for (const std::shared_ptr<Arena>& arena : left) {
+        self.close(arena);
+        arena->endAll();
+    }
+}
+
+std::shared_ptr<Arena> ThreadArenas::open(Span span, const ContextObject* context) {
+    auto arena = std::make_shared<Arena>(span, context);
+    if (atThreadEnd_) pthread_setspecific(threadEnd_, this);
     const std::lock_guard lock(mutex_);
-    byThread_[arena->thread()].push_back(arena);
+    Stack& stack = byThread_[arena->thread()];
+    // What belongs to the thread is older than every call and attachment on it.
+    stack.insert(span == Span::Thread ? stack.begin() : stack.end(), arena);
     return arena;
 }
 
@@ -72,29 +117,64 @@ void ThreadArenas::close(const std::shared_ptr<Arena>& arena) {
     if (found->second.empty()) byThread_.erase(found);
 }
 
-std::shared_ptr<Arena> ThreadArenas::current() {
+ThreadArenas::Stack ThreadArenas::ofThread() {
     const std::lock_guard lock(mutex_);
     const auto found = byThread_.find(threadNumber());
-    return found == byThread_.end() ? nullptr : found->second.back();
+    return found == byThread_.end() ? Stack{} : found->second;
+}
+
+std::shared_ptr<Arena> ThreadArenas::current() {
+    if (!perThread_) {
+        const std::lock_guard lock(mutex_);
+        const auto found = byThread_.find(threadNumber());
+        return found == byThread_.end() ? nullptr : found->second.back();
+    }
+    const Stack stack = ofThread();
+    const auto owner = std::find_if(stack.rbegin(), stack.rend(), [](const auto& arena) {
+        return arena->span() != Span::Attachment;
+    });
+    return owner != stack.rend() ? *owner : open(Span::Thread);
+}
+
+bool ThreadArenas::isEntered() {
+    const Stack stack = ofThread();
+    return std::any_of(stack.begin(), stack.end(),
+                       [](const auto& arena) { return arena->span() != Span::Thread; });
+}
+
+bool ThreadArenas::flush() {
+    const Stack stack = ofThread();
+    if (stack.empty()) return false;
+    if (!perThread_) {
+        stack.back()->flush();
+        return true;
+    }
+    std::for_each(stack.rbegin(), stack.rend(), [](const auto& arena) { arena->flush(); });
+    return true;
+}
+
+ThreadArenas::Stack ThreadArenas::all() {
+    const std::lock_guard lock(mutex_);
+    Stack arenas;
+    for (const auto& [thread, stack] : byThread_)
+        arenas.insert(arenas.end(), stack.begin(), stack.end());
+    return arenas;
 }
 
 std::shared_ptr<Arena> ThreadArenas::attachedWith(const ContextObject* context) {
-    const std::lock_guard lock(mutex_);
-    const auto found = byThread_.find(threadNumber());
-    if (found == byThread_.end()) return nullptr;
-    for (const std::shared_ptr<Arena>& arena : found->second) {
+    for (const std::shared_ptr<Arena>& arena : ofThread()) {
         if (arena->context() == context) return arena;
     }
     return nullptr;
 }
 
 void ThreadArenas::endAll() {
-    std::unordered_map<std::uint64_t, std::vector<std::shared_ptr<Arena>>> all;
+    std::unordered_map<std::uint64_t, Stack> byThread;
     {
         const std::lock_guard lock(mutex_);
-        all.swap(byThread_);
+        byThread.swap(byThread_);
     }
-    for (auto& [thread, arenas] : all) {
+    for (auto& [thread, arenas] : byThread) {
         for (const std::shared_ptr<Arena>& arena : arenas) arena->endAll();
     }
     outside_.endAll();

@@ -1,5 +1,6 @@
 #include "broker.h"
 
+#include <utility>
 #include <vector>
 
 #include "broker_calls.h"
@@ -16,17 +17,6 @@ namespace testbed {
 
 namespace {
 
-/// The brokers that exist. Never destroyed, so that no order of destruction matters.
-struct Registry {
-    std::mutex mutex;
-    std::vector<Broker*> brokers;  // guarded by mutex
-};
-
-Registry& registry() {
-    static auto* const instance = new Registry;
-    return *instance;
-}
-
 std::vector<NamedValue> callEntries() {
     return {{"CMPIInitNameSpace", CimValue::string("root/cimv2")},
             {"CMPIInvocationFlags", CimValue::uint32(0)}};
@@ -38,9 +28,20 @@ struct Broker::Tables {
     BrokerCore core;
     CMPIBrokerFT entries;
     CMPIBroker handle;
+    Tables* next = nullptr;  ///< in the list of brokers
+
+    // The brokers that exist, in words that need no destruction: a module with them leaves nothing.
+    static constinit inline std::mutex listMutex;
+    static constinit inline Tables* first = nullptr;  // guarded by listMutex, like next
 
     explicit Tables(Broker& broker)
-        : core{broker.repository_, broker.options_, broker.books_, broker.faults_, {}, {}, {}},
+        : core{broker.repository_,
+               broker.options_,
+               broker.books_,
+               broker.faults_,
+               {broker.options_.keepsPerThread(), broker.threadEnd()},
+               {},
+               {}},
           entries(),
           handle{&core, &entries, &factoryTable, &systemTable} {
         entries.brokerCapabilities = CMPI_MB_BasicRead | CMPI_MB_AssociationTraversal;
@@ -56,14 +57,16 @@ Broker::Broker(Repository& repository, BrokerOptions options)
     : repository_(repository),
       options_(std::move(options)),
       tables_(std::make_unique<Tables>(*this)) {
-    const std::lock_guard lock(registry().mutex);
-    registry().brokers.push_back(this);
+    const std::lock_guard lock(Tables::listMutex);
+    tables_->next = std::exchange(Tables::first, tables_.get());
 }
 
 Broker::~Broker() {
     {
-        const std::lock_guard lock(registry().mutex);
-        std::erase(registry().brokers, this);
+        const std::lock_guard lock(Tables::listMutex);
+        Tables** link = &Tables::first;
+        while (*link != tables_.get()) link = &(*link)->next;
+        *link = tables_->next;
     }
     // Clones stay: a provider that did not release them has leaked them.
     tables_->core.arenas.endAll();
@@ -74,7 +77,7 @@ const CMPIBroker* Broker::handle() const {
 }
 
 Broker::CallScope::CallScope(Broker& broker)
-    : broker_(broker), arena_(broker.tables_->core.arenas.open(nullptr)) {
+    : broker_(broker), arena_(broker.tables_->core.arenas.open(Span::Call)) {
     context_ = &makeInArena<ContextObject>(broker.tables_->core, callEntries());
 }
 
@@ -116,17 +119,49 @@ CMPIResult* Broker::makeResult(Collected& collected) {
 }
 
 void Broker::flushThread() {
-    const std::shared_ptr<Arena> arena = tables_->core.arenas.current();
-    if (arena) arena->flush();
+    tables_->core.arenas.flush();
 }
 
 void Broker::flushThreadEverywhere() {
-    const std::lock_guard lock(registry().mutex);
-    for (Broker* broker : registry().brokers) {
-        if (!broker->tables_->core.arenas.current()) continue;
-        broker->books_.record(describeCall(Entry::ContextFlush));
-        broker->flushThread();
+    const std::lock_guard lock(Tables::listMutex);
+    for (Tables* tables = Tables::first; tables != nullptr; tables = tables->next) {
+        if (!tables->core.options.exportsFlush()) continue;
+        if (!tables->core.arenas.flush()) continue;
+        tables->core.books.record(describeCall(Entry::ContextFlush));
     }
+}
+
+ThreadArenas::ThreadEnd Broker::threadEnd() {
+    if (!options_.keepsPerThread() && !options_.unflushedEndIsMisuse) return {};
+    return [this](std::size_t objects) {
+        if (objects == 0 || !options_.unflushedEndIsMisuse) return;
+        books_.misuse("a thread ends with " + std::to_string(objects) +
+                      " objects that were not flushed");
+    };
+}
+
+void Broker::beginStop() {
+    tables_->core.stopGate.close();
+}
+
+void Broker::endStop() {
+    tables_->core.stopGate.open();
+}
+
+bool Broker::waitUntilUnused(std::chrono::milliseconds limit) {
+    const auto deadline = std::chrono::steady_clock::now() + limit;
+    while (tables_->core.preparedContexts != 0) {
+        if (std::chrono::steady_clock::now() >= deadline) return false;
+        std::this_thread::sleep_for(std::chrono::milliseconds(1));
+    }
+    return true;
+}
+
+std::vector<Broker::Kept> Broker::kept() {
+    std::vector<Kept> list;
+    for (const std::shared_ptr<Arena>& arena : tables_->core.arenas.all())
+        list.push_back({arena->threadId(), arena->context(), arena->count()});
+    return list;
 }
 
 ObjectPath Broker::toPath(const CMPIObjectPath* path) {

@@ -4,31 +4,20 @@
 #include <cmpidt.h>
 #include <cmpift.h>
 
+#include <chrono>
+#include <functional>
 #include <memory>
 #include <mutex>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "books.h"
+#include "broker_options.h"
 #include "faults.h"
 #include "repository.h"
 
 namespace testbed {
-
-/// Behaviours in which real object managers differ.
-struct BrokerOptions {
-    std::string name = "plexor-testbed";
-    /// Instances show every property of their class, absent ones as null with status OK (a live
-    /// provider); otherwise absent properties answer status 6 (a static repository).
-    bool allProperties = false;
-    /// One mutex around all up-calls of the process.
-    bool serialQueries = false;
-    /// For classes that are known: setProperty is refused for a property that the class lacks (12)
-    /// and for another type than the declared one (13); a result does not take a path, or an
-    /// instance with a path, that lacks a key or has one of another type (4).
-    bool strictProperties = false;
-    /// attachThread fails, prepareAttachThread gives NULL, and the like are made with Faults.
-};
 
 class Arena;
 
@@ -82,14 +71,32 @@ public:
 
     /// Ends everything that the calling thread obtained and did not clone (what flush does).
     void flushThread();
-    /// The same for every broker of the process on which the thread is in a call or attached; noted
-    /// as Entry::ContextFlush.
+    /// The same for every broker of the process that exports its flush and has objects of the
+    /// thread; noted as Entry::ContextFlush.
     static void flushThreadEverywhere();
+
+    /// From now on the manager stops (see WhileStopping), until endStop.
+    void beginStop();
+    void endStop();
+
+    /// Waits until no prepared context is left, thus no thread of a provider's. False when some are
+    /// left after `limit`.
+    bool waitUntilUnused(std::chrono::milliseconds limit);
+
+    /// What a manager call, an attachment or a thread of the provider's keeps at this moment.
+    struct Kept {
+        std::thread::id thread;
+        const void* context;  ///< that the thread attached with; NULL for a call or a whole thread
+        std::size_t objects;  ///< without contexts and results
+    };
+    std::vector<Kept> kept();
 
     static ObjectPath toPath(const CMPIObjectPath* path);
     static Instance toInstance(const CMPIInstance* instance);
 
 private:
+    std::function<void(std::size_t)> threadEnd();
+
     Repository& repository_;
     BrokerOptions options_;
     Books books_;

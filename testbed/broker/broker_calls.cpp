@@ -16,7 +16,7 @@ void noteMisuse(BrokerCore& core, const char* what, Entry entry) {
 }  // namespace
 
 void admitUpCall(BrokerCore& core, Entry entry) {
-    if (core.arenas.current()) return;
+    if (core.options.attachDoesNothing || core.arenas.isEntered()) return;
     noteMisuse(core, "up-call on a thread that is not attached and not in a manager call", entry);
 }
 
@@ -28,6 +28,7 @@ bool admitUpCall(BrokerCore& core, const CMPIContext* ctx, Entry entry) {
     }
     const ContextObject* context = usable(ctx, entry);
     if (context == nullptr) return false;
+    if (core.options.attachDoesNothing) return true;
     if (context->user() == 0) {
         noteMisuse(core, "up-call with a context that no thread has attached with", entry);
     } else if (context->user() != threadNumber()) {

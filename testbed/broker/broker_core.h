@@ -4,6 +4,7 @@
 #include <cmpidt.h>
 #include <cmpift.h>
 
+#include <atomic>
 #include <mutex>
 
 #include "arena.h"
@@ -11,6 +12,8 @@
 #include "broker.h"
 #include "faults.h"
 #include "repository.h"
+#include "result_order.h"
+#include "stop_gate.h"
 
 namespace testbed {
 
@@ -24,6 +27,9 @@ struct BrokerCore {
     ThreadArenas arenas;
     Quarantine quarantine;
     std::mutex queryMutex;  ///< held by each query when options.serialQueries
+    ResultOrder order{options.orderSeed};
+    StopGate stopGate{};
+    std::atomic<int> preparedContexts = 0;  ///< alive
 
     /// Whether entries of objects have to be described to books and faults.
     bool watchesObjectCalls() const {

@@ -12,11 +12,13 @@ namespace testbed {
 
 namespace {
 
-/// A new instance: of a known class with the class's properties, their defaults, and the keys.
+/// A new instance: of a known class with the class's properties, their defaults, and the
+/// keys unless the manager leaves those out.
 Instance startOf(const BrokerCore& core, const ObjectPath& path) {
     Instance instance{path, {}};
     for (const auto& property : core.repository.allProperties(path.nameSpace, path.className)) {
-        const CimValue* key = path.findKey(property.name);
+        const CimValue* key =
+            core.options.instancesWithoutKeys ? nullptr : path.findKey(property.name);
         const CimValue& value = key != nullptr ? *key : property.defaultValue;
         instance.set(property.name, value.isNull ? CimValue::null(property.type) : value);
     }

@@ -40,8 +40,15 @@ Instance shown(const BrokerCore& core, Instance instance, const Names& wanted) {
     return instance;
 }
 
+/// Whether the manager's own repository would have to answer for that path, and finds nothing.
+bool isLostOn(const BrokerCore& core, const ObjectPath& path) {
+    return !path.host.empty() && contains(core.options.staticNamespaces, path.nameSpace);
+}
+
 CMPIEnumeration* enumerationOf(BrokerCore& core, std::vector<Instance> found, bool onlyNames,
                                const Names& wanted) {
+    if (core.options.randomOrder) core.order.shuffle(found);
+    for (Instance& instance : found) instance.path.host = core.options.hostInPaths;
     auto& result = makeInArena<EnumerationObject>(core, onlyNames ? CMPI_ref : CMPI_instance);
     if (onlyNames) {
         std::vector<ObjectPath> paths;
@@ -104,14 +111,32 @@ CMPIInstance* getInstance(const CMPIBroker* broker, const CMPIContext* ctx,
                 outcome.rc = CMPI_RC_ERR_INVALID_NAMESPACE;
                 return nullptr;
             }
-            auto found = core.repository.get(*path);
+            auto found = isLostOn(core, *path) ? std::nullopt : core.repository.get(*path);
             if (!found) {
                 outcome = {CMPI_RC_ERR_NOT_FOUND, &makeInArena<StringObject>(core, "")};
                 return nullptr;
             }
+            found->path.host = core.options.hostInPaths;
             return &makeInArena<InstanceObject>(
                 core, shown(core, std::move(*found), readNames(properties)));
         });
+}
+
+/// Why a walk fails, or OK.
+CMPIrc refusalOf(const BrokerCore& core, const std::optional<ObjectPath>& source,
+                 const AssociationFilter& filter, bool toReferences) {
+    if (!source) return CMPI_RC_ERR_INVALID_PARAMETER;
+    const Repository& repository = core.repository;
+    if (!repository.hasNamespace(source->nameSpace)) return CMPI_RC_ERR_FAILED;
+    if (core.options.unknownClassFails) {
+        for (const auto& name :
+             {std::optional(source->className), filter.assocClass, filter.resultClass})
+            if (name && !repository.hasClass(source->nameSpace, *name))
+                return CMPI_RC_ERR_INVALID_CLASS;
+    }
+    if (core.options.danglingFails && !toReferences && repository.hasDangling(*source, filter))
+        return CMPI_RC_ERR_NOT_FOUND;
+    return CMPI_RC_OK;
 }
 
 /// All four ways along associations; they differ in what they walk to and whether names suffice.
@@ -131,14 +156,14 @@ CMPIEnumeration* walk(const CMPIBroker* broker, const CMPIContext* ctx,
     return answerUpCall<CMPIEnumeration*>(
         broker, ctx, std::move(record), status,
         [&](BrokerCore& core, CMPIStatus& outcome) -> CMPIEnumeration* {
-            if (!path || !core.repository.hasNamespace(path->nameSpace)) {
-                outcome.rc = path ? CMPI_RC_ERR_FAILED : CMPI_RC_ERR_INVALID_PARAMETER;
-                return nullptr;
-            }
-            auto found = toReferences
-                             ? core.repository.references(*path, filter.resultClass.value_or(""),
-                                                          filter.role.value_or(""))
-                             : core.repository.associators(*path, filter);
+            outcome.rc = refusalOf(core, path, filter, toReferences);
+            if (outcome.rc != CMPI_RC_OK) return nullptr;
+            std::vector<Instance> found;
+            if (!isLostOn(core, *path))
+                found = toReferences
+                            ? core.repository.references(*path, filter.resultClass.value_or(""),
+                                                         filter.role.value_or(""))
+                            : core.repository.associators(*path, filter);
             return enumerationOf(core, std::move(found), onlyNames, readNames(properties));
         });
 }

@@ -30,18 +30,23 @@ CMPIrc attach(BrokerCore& core, const CMPIContext* ctx) {
         core.books.misuse("attachThread with a context that was not prepared");
         return CMPI_RC_ERR_FAILED;
     }
+    if (core.options.attachDoesNothing) return CMPI_RC_OK;
     if (context->user() != 0) {
         core.books.misuse("attachThread with a context that is attached already");
         return CMPI_RC_ERR_FAILED;
     }
     context->setUser(threadNumber());
-    core.arenas.open(context);
+    core.arenas.open(Span::Attachment, context);
     return CMPI_RC_OK;
 }
 
 CMPIrc detach(BrokerCore& core, const CMPIContext* ctx) {
     ContextObject* context = usable(ctx, Entry::DetachThread);
     if (context == nullptr) return CMPI_RC_ERR_INVALID_HANDLE;
+    if (core.options.attachDoesNothing) {
+        context->end();
+        return CMPI_RC_OK;
+    }
     const std::shared_ptr<Arena> arena = core.arenas.attachedWith(context);
     if (!arena) {
         core.books.misuse("detachThread with a context that this thread is not attached with");

@@ -26,7 +26,11 @@ Call::Call(BrokerCore& core, CallRecord record) : core_(core), entry_(record.ent
     Faults::runHook(effect_);
     if (core.options.serialQueries && isQuery(entry_)) turn_ = std::unique_lock(core.queryMutex);
     Faults::wait(effect_);
-    if (!effect_ && isQuery(entry_)) std::this_thread::sleep_for(core.faults.drawLatency());
+    if (!isQuery(entry_)) return;
+    if (!effect_) std::this_thread::sleep_for(core.faults.drawLatency());
+    if (core.stopGate.admits(core.options.whileStopping)) return;
+    effect_.emplace();
+    effect_->rc = CMPI_RC_ERR_FAILED;
 }
 
 bool Call::answersNull() const {

@@ -24,8 +24,8 @@ CMPIData refusal<CMPIData>();
 /// A data item without value in that state.
 CMPIData dataWithout(CMPIValueState state);
 
-/// Notes the call, finds its fault rule, runs the rule's hook and waits. While it lives it holds
-/// the query mutex, when queries are serial.
+/// Notes the call, finds its fault rule, runs the rule's hook and waits, also while the manager
+/// stops. While it lives it holds the query mutex, when queries are serial.
 class Call {
 public:
     Call(BrokerCore& core, CallRecord record);

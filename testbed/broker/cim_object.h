@@ -23,6 +23,7 @@ struct ObjectPath {
     std::string nameSpace;
     std::string className;
     std::vector<NamedValue> keys;
+    std::string host = {};  ///< no part of the identity
 
     /// Adds or replaces a key.
     ObjectPath& key(std::string_view name, CimValue value);

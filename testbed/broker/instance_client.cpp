@@ -1,5 +1,7 @@
 #include "instance_client.h"
 
+#include <charconv>
+
 #include "object_string.h"
 
 namespace testbed {
@@ -26,6 +28,18 @@ std::optional<std::string> messageOf(const CMPIStatus& status) {
     const StringObject* message = usable(status.msg, Entry::StringGetCharPtr);
     if (message == nullptr) return std::nullopt;
     return message->text() ? message->text() : "";
+}
+
+/// The path with a number for each text that reads as one.
+ObjectPath withNumericKeys(ObjectPath path) {
+    for (auto& [name, value] : path.keys) {
+        const std::string& text = value.asString();
+        std::uint64_t number = 0;
+        const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
+        if (text.empty() || error != std::errc() || end != text.data() + text.size()) continue;
+        value = CimValue::uint64(number);
+    }
+    return path;
 }
 
 /// Runs call(context, result, path) as a request of its own.
@@ -67,7 +81,8 @@ Response InstanceClient::enumerateInstances(const std::string& className,
 Response InstanceClient::getInstance(const ObjectPath& instancePath,
                                      const PropertyList& properties) {
     PropertyNames names(properties);
-    return request(broker_, instancePath,
+    const bool asNumbers = broker_.options().numericKeys;
+    return request(broker_, asNumbers ? withNumericKeys(instancePath) : instancePath,
                    [&](CMPIContext* context, CMPIResult* result, CMPIObjectPath* path) {
                        return mi_->ft->getInstance(mi_, context, result, path, names.get());
                    });

@@ -74,6 +74,10 @@ CMPIData ArrayObject::elementAt(std::size_t index) const {
 
 CMPIrc ArrayObject::setElementAt(std::size_t index, const CMPIValue* value, CMPIType type) {
     if (index >= values_.size()) return CMPI_RC_ERR_NO_SUCH_PROPERTY;
+    if (type == CMPI_chars && core().options.refusesCharsInArrays) {
+        values_[index] = CimValue::string("");
+        return CMPI_RC_ERR_TYPE_MISMATCH;
+    }
     CimValue element;
     const CMPIrc rc = readValue(value, type, element);
     if (rc != CMPI_RC_OK) return rc;

@@ -60,31 +60,35 @@ CMPIStatus flush(const CMPIContext* ctx) {
         if (!admitUpCall(object.core(), ctx, Entry::ContextFlush)) {
             return CMPI_RC_ERR_INVALID_HANDLE;
         }
-        const std::shared_ptr<Arena> arena = object.core().arenas.current();
-        if (arena) arena->flush();
+        object.core().arenas.flush();
         return CMPI_RC_OK;
     });
 }
 #endif
 
-const CMPIContextFT contextTable = {
-    .ftVersion = CMPI_VERSION,
-    .release = releaseEntry<CMPIContext>,
-    .clone = cloneEntry<CMPIContext>,
-    .getEntry = getEntry,
-    .getEntryAt = getEntryAt,
-    .getEntryCount = getEntryCount,
-    .addEntry = addEntry,
+constexpr CMPIContextFT makeTable([[maybe_unused]] bool withFlush) {
+    return {
+        .ftVersion = CMPI_VERSION, .release = releaseEntry<CMPIContext>,
+        .clone = cloneEntry<CMPIContext>, .getEntry = getEntry, .getEntryAt = getEntryAt,
+        .getEntryCount = getEntryCount, .addEntry = addEntry,
 #if defined(PLEXOR_CONTEXT_FLUSH) && PLEXOR_CONTEXT_FLUSH
-    .flush = flush,
+        .flush = withFlush ? flush : nullptr,
 #endif
-};
+    };
+}
+
+constexpr CMPIContextFT tableWithFlush = makeTable(true);
+constexpr CMPIContextFT tableWithoutFlush = makeTable(false);
+
+const CMPIContextFT* tableFor(const BrokerCore& core) {
+    return core.options.hasContextFlush() ? &tableWithFlush : &tableWithoutFlush;
+}
 
 }  // namespace
 
 ContextObject::ContextObject(BrokerCore& brokerCore, std::vector<NamedValue> entries)
     : Object(brokerCore, ObjectKind::Context),
-      CMPIContext{nullptr, &contextTable},
+      CMPIContext{nullptr, tableFor(brokerCore)},
       user_(threadNumber()),
       entries_(std::move(entries)) {
     hdl = this;
@@ -110,7 +114,13 @@ void ContextObject::setEntry(const char* name, CimValue value) {
     }
 }
 
+void ContextObject::setPrepared() {
+    isPrepared_ = true;
+    ++core().preparedContexts;
+}
+
 void ContextObject::drop() {
+    if (isPrepared_) --core().preparedContexts;
     const std::lock_guard lock(mutex_);
     entries_.clear();
 }

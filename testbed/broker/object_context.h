@@ -29,7 +29,7 @@ public:
     void setUser(std::uint64_t thread) { user_ = thread; }
     /// Made by prepareAttachThread, thus to be ended by detachThread.
     bool isPrepared() const { return isPrepared_; }
-    void setPrepared() { isPrepared_ = true; }
+    void setPrepared();
 
 private:
     void drop() override;

@@ -118,12 +118,14 @@ void InstanceObject::setFilter(const char** properties, const char** keys) {
     if (!filter_) return;
     const std::vector<std::string> keyNames = readNames(keys).value_or(std::vector<std::string>());
     filter_->insert(filter_->end(), keyNames.begin(), keyNames.end());
+    if (core().options.filteredKeys == FilteredKeys::Stay && keys == nullptr)
+        for (const auto& [name, value] : content_.path.keys) filter_->push_back(name);
     std::erase_if(content_.properties,
                   [&](const NamedValue& property) { return isHidden(property.first); });
 }
 
 CMPIrc InstanceObject::checkType(const std::string& name, const CimValue& value) const {
-    const auto& [nameSpace, className, keys] = content_.path;
+    const auto& [nameSpace, className, keys, host] = content_.path;
     const bool strict = core().options.strictProperties;
     if (!core().repository.hasClass(nameSpace, className)) return CMPI_RC_OK;
     const auto definition = core().repository.findProperty(nameSpace, className, name);
@@ -142,6 +144,14 @@ CMPIrc InstanceObject::set(const char* name, const CMPIValue* value, CMPIType ty
     rc = checkType(name, property);
     if (rc == CMPI_RC_OK) content_.set(name, std::move(property));
     return rc;
+}
+
+Instance InstanceObject::returned() const {
+    Instance instance = content_;
+    if (core().options.filteredKeys == FilteredKeys::NamesGoToo)
+        std::erase_if(instance.path.keys,
+                      [&](const NamedValue& key) { return isHidden(key.first); });
+    return instance;
 }
 
 void InstanceObject::drop() {

@@ -21,6 +21,8 @@ public:
     std::shared_ptr<InstanceObject> copy() const;
 
     const Instance& content() const { return content_; }
+    /// What a client receives of it.
+    Instance returned() const;
     /// A property that the filter hides is dropped without an error.
     CMPIrc set(const char* name, const CMPIValue* value, CMPIType type);
     /// From now on only the named properties exist; NULL-terminated lists, NULL: no filter.

@@ -26,15 +26,16 @@ CMPIString* getText(const CMPIObjectPath* path, CMPIStatus* status) {
 
 CMPIStatus setHostname(const CMPIObjectPath* path, const char* host) {
     return statusOn(path, Entry::OtherObjectCall, nullptr, [&](PathObject& object) {
-        object.host() = host ? host : "";
+        object.content().host = host ? host : "";
         return CMPI_RC_OK;
     });
 }
 
 CMPIString* getHostname(const CMPIObjectPath* path, CMPIStatus* status) {
-    return answerOn<CMPIString*>(
-        path, Entry::OtherObjectCall, nullptr, status,
-        [](PathObject& object, CMPIStatus&) { return derivedString(object, object.host()); });
+    return answerOn<CMPIString*>(path, Entry::OtherObjectCall, nullptr, status,
+                                 [](PathObject& object, CMPIStatus&) {
+                                     return derivedString(object, object.content().host);
+                                 });
 }
 
 CMPIStatus addKey(const CMPIObjectPath* path, const char* key, const CMPIValue* value,
@@ -86,7 +87,7 @@ CMPIStatus copyPlace(const CMPIObjectPath* path, const CMPIObjectPath* source, b
         PathObject* from = usable(source, Entry::OtherObjectCall);
         if (from == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
         object.content().nameSpace = from->content().nameSpace;
-        if (withHost) object.host() = from->host();
+        if (withHost) object.content().host = from->content().host;
         return CMPI_RC_OK;
     });
 }
@@ -157,9 +158,7 @@ void PathObject::describe(CallRecord& record) const {
 }
 
 std::shared_ptr<PathObject> PathObject::copy() const {
-    auto path = std::make_shared<PathObject>(core(), content_);
-    path->host_ = host_;
-    return path;
+    return std::make_shared<PathObject>(core(), content_);
 }
 
 CMPIrc PathObject::addKey(const char* name, const CMPIValue* value, CMPIType type) {
@@ -172,7 +171,6 @@ CMPIrc PathObject::addKey(const char* name, const CMPIValue* value, CMPIType typ
 
 void PathObject::drop() {
     content_ = {};
-    host_.clear();
 }
 
 }  // namespace testbed

@@ -20,13 +20,11 @@ public:
 
     const ObjectPath& content() const { return content_; }
     ObjectPath& content() { return content_; }
-    std::string& host() { return host_; }
     CMPIrc addKey(const char* name, const CMPIValue* value, CMPIType type);
 
 private:
     void drop() override;
     ObjectPath content_;
-    std::string host_;
 };
 
 template <>

@@ -31,7 +31,7 @@ CMPIStatus returnInstance(const CMPIResult* result, const CMPIInstance* instance
         const InstanceObject* returned = usable(instance, Entry::ResultReturnInstance);
         if (returned == nullptr) return CMPI_RC_ERR_INVALID_PARAMETER;
         if (!hasKeys(object.core(), returned->content().path)) return CMPI_RC_ERR_INVALID_PARAMETER;
-        object.collected().instances.push_back(returned->content());
+        object.collected().instances.push_back(returned->returned());
         return CMPI_RC_OK;
     });
 }

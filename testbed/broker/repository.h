@@ -96,6 +96,8 @@ public:
                            const ObjectPath& right);
     std::vector<Instance> associators(const ObjectPath& source,
                                       const AssociationFilter& filter) const;
+    /// Whether such a walk meets an object that does not exist.
+    bool hasDangling(const ObjectPath& source, const AssociationFilter& filter) const;
     /// Association instances that the source takes part in; references as CMPI_ref properties.
     std::vector<Instance> references(const ObjectPath& source, std::string_view resultClass,
                                      std::string_view role) const;
@@ -129,7 +131,8 @@ private:
                    std::string_view ancestor) const;
     const Instance* instanceLocked(const std::string& identity) const;
     bool associationIsA(const Association& association, const std::string& ancestor) const;
-    /// Calls visit(association, identity of the far object, far instance) for each hit.
+    /// Calls visit(association, identity of the far object, far instance) for each hit; the
+    /// instance is NULL for a dangling reference.
     template <class Visit>
     void walkLocked(const ObjectPath& source, const AssociationFilter& filter, Visit visit) const;
     bool matchesEnd(const Association& association, const AssociationEnd& near,

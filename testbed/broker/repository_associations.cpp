@@ -59,8 +59,7 @@ void Repository::walkLocked(const ObjectPath& source, const AssociationFilter& f
     const auto tryEnd = [&](const Association& association, const AssociationEnd& near,
                             const AssociationEnd& far, const std::string& farIdentity) {
         if (!matchesEnd(association, near, far, filter)) return;
-        const Instance* instance = instanceLocked(farIdentity);
-        if (instance != nullptr) visit(association, farIdentity, *instance);
+        visit(association, farIdentity, instanceLocked(farIdentity));
     };
     for (const Association& association : associations_) {
         if (association.leftIdentity == origin) {
@@ -79,12 +78,22 @@ std::vector<Instance> Repository::associators(const ObjectPath& source,
     {
         const std::shared_lock lock(mutex_);
         walkLocked(source, filter,
-                   [&](const Association&, const std::string& identity, const Instance& instance) {
-                       if (seen.insert(identity).second) found.push_back(instance);
+                   [&](const Association&, const std::string& identity, const Instance* instance) {
+                       if (instance == nullptr) return;
+                       if (seen.insert(identity).second) found.push_back(*instance);
                    });
     }
     shuffle(found);
     return found;
+}
+
+bool Repository::hasDangling(const ObjectPath& source, const AssociationFilter& filter) const {
+    const std::shared_lock lock(mutex_);
+    bool dangling = false;
+    walkLocked(source, filter, [&](const Association&, const std::string&, const Instance* far) {
+        if (far == nullptr) dangling = true;
+    });
+    return dangling;
 }
 
 std::vector<Instance> Repository::references(const ObjectPath& source, std::string_view resultClass,
@@ -98,7 +107,8 @@ std::vector<Instance> Repository::references(const ObjectPath& source, std::stri
     {
         const std::shared_lock lock(mutex_);
         walkLocked(source, filter,
-                   [&](const Association& association, const std::string&, const Instance&) {
+                   [&](const Association& association, const std::string&, const Instance* far) {
+                       if (far == nullptr) return;
                        if (!seen.insert(&association).second) return;
                        Instance instance;
                        instance.path = {source.nameSpace, association.assocClass, {}};

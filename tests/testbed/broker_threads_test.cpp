@@ -115,9 +115,19 @@ TEST_F(BrokerThreads, FlushEndsWhatTheThreadObtained) {
 }
 #endif
 
-TEST_F(BrokerThreads, ExportedFlushWorksOnEveryBrokerOfTheThread) {
+class FlushFunction : public BrokerThreads {
+protected:
+    static BrokerOptions exporting() {
+        BrokerOptions options;
+        options.flush = FlushOffer::OwnFunction;
+        return options;
+    }
+    FlushFunction() : BrokerThreads(exporting()) {}
+};
+
+TEST_F(FlushFunction, WorksOnEveryBrokerOfTheThread) {
     Repository secondRepository;
-    Broker second(secondRepository);
+    Broker second(secondRepository, exporting());
     const Broker::CallScope secondCall(second);
     second.makeString("s");
     CMPIString* clone = nullptr;
