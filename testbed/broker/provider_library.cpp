@@ -2,11 +2,14 @@
 
 #include <dlfcn.h>
 
+#include <thread>
+#include <vector>
+
 namespace testbed {
 
 ProviderLibrary::ProviderLibrary(Broker& broker, const std::string& file,
                                  const std::string& providerName)
-    : broker_(broker), factoryName_(providerName + "_Create_InstanceMI") {
+    : broker_(broker), flush_(broker.options()), factoryName_(providerName + "_Create_InstanceMI") {
     library_ = dlopen(file.c_str(), RTLD_NOW | RTLD_LOCAL);
     if (library_ == nullptr) throw LoadError("cannot load " + file + ": " + dlerror());
 
@@ -15,7 +18,7 @@ ProviderLibrary::ProviderLibrary(Broker& broker, const std::string& file,
         dlclose(library_);
         throw LoadError(file + " has no factory " + factoryName_);
     }
-    mi_ = callFactory();
+    mi_ = callFactories();
     if (mi_ == nullptr) {
         dlclose(library_);
         throw LoadError(factoryName_ + " returned no instance interface");
@@ -23,11 +26,21 @@ ProviderLibrary::ProviderLibrary(Broker& broker, const std::string& file,
 }
 
 ProviderLibrary::~ProviderLibrary() {
-    if (library_ != nullptr) dlclose(library_);
+    close();
 }
 
 InstanceClient ProviderLibrary::client() {
     return InstanceClient(broker_, mi_);
+}
+
+CMPIInstanceMI* ProviderLibrary::callFactories() {
+    const auto calls = static_cast<std::size_t>(broker_.options().factoryCalls);
+    if (calls == 1) return callFactory();
+    std::vector<CMPIInstanceMI*> given(calls);
+    std::vector<std::thread> threads;
+    for (CMPIInstanceMI*& mi : given) threads.emplace_back([&] { mi = callFactory(); });
+    for (std::thread& thread : threads) thread.join();
+    return given.front();
 }
 
 CMPIInstanceMI* ProviderLibrary::callFactory() {
@@ -39,11 +52,15 @@ CMPIInstanceMI* ProviderLibrary::callFactory() {
 CMPIrc ProviderLibrary::unload(bool terminating) {
     const CMPIrc rc = client().cleanup(terminating);
     if (rc != CMPI_RC_OK) return rc;
-    dlclose(library_);
+    close();
+    return rc;
+}
+
+void ProviderLibrary::close() {
+    if (library_ != nullptr) dlclose(library_);
     library_ = nullptr;
     factory_ = nullptr;
     mi_ = nullptr;
-    return rc;
 }
 
 void* ProviderLibrary::symbol(const char* name) const {

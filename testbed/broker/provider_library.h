@@ -5,6 +5,7 @@
 #include <string>
 
 #include "broker.h"
+#include "exported_flush.h"
 #include "instance_client.h"
 
 namespace testbed {
@@ -17,7 +18,8 @@ struct LoadError : std::runtime_error {
 
 class ProviderLibrary {
 public:
-    /// Opens `file` and calls `<providerName>_Create_InstanceMI`. Throws LoadError.
+    /// Opens `file` and calls `<providerName>_Create_InstanceMI` as often as the broker's options
+    /// say. Throws LoadError.
     ProviderLibrary(Broker& broker, const std::string& file, const std::string& providerName);
     /// Closes the library without calling cleanup when that has not happened.
     ~ProviderLibrary();
@@ -26,16 +28,21 @@ public:
 
     InstanceClient client();
     CMPIInstanceMI* mi() const { return mi_; }
-    /// Calls the factory once more, as a manager does for each further class.
+    /// Calls the factory once more, as a manager does for each further class. Thread-safe.
     CMPIInstanceMI* callFactory();
     /// cleanup and, when it answers OK, dlclose. The status of cleanup.
     CMPIrc unload(bool terminating);
+    /// dlclose, without a cleanup.
+    void close();
     /// An exported symbol of the library, NULL when it has none or is closed.
     void* symbol(const char* name) const;
     bool isOpen() const { return library_ != nullptr; }
 
 private:
+    CMPIInstanceMI* callFactories();
+
     Broker& broker_;
+    ExportedFlush flush_;
     std::string factoryName_;
     void* library_ = nullptr;
     CMPIInstanceMI* (*factory_)(const CMPIBroker*, const CMPIContext*, CMPIStatus*) = nullptr;

@@ -18,6 +18,7 @@ expected_files() {
     echo "755 usr/bin/plexor-testbed"
     echo "755 usr/sbin/plexor-register"
     echo "644 usr/$libdir/cmpi/libPlexorProvider.so"
+    echo "644 usr/$libdir/plexor-testbed/libplexor-manager-flush.so"
     for file in copyright messages.md operating.md; do
         echo "644 usr/share/doc/$package/$file"
     done
@@ -47,11 +48,14 @@ expect_same_files() {
 # ROOT LIBDIR: the binaries of an installation are what a manager and a user need.
 expect_sound_binaries() {
     local library=$1/usr/$2/cmpi/libPlexorProvider.so tool=$1/usr/bin/plexor-testbed file needed
+    local flush=$1/usr/$2/plexor-testbed/libplexor-manager-flush.so
     grep -q ' T PlexorProvider_Create_InstanceMI$' <<<"$(nm -D --defined-only "$library")" ||
         fail "the library has no factory"
-    grep -q ' [TW] tool_mm_flush$' <<<"$(nm -D --defined-only "$tool")" ||
-        fail "the tool does not export the flush"
-    for file in "$library" "$tool"; do
+    ! grep -q ' tool_mm_flush$' <<<"$(nm -D --defined-only "$tool")" ||
+        fail "the tool exports the flush for every manager"
+    grep -q ' T tool_mm_flush$' <<<"$(nm -D --defined-only "$flush")" ||
+        fail "the module does not export the flush"
+    for file in "$library" "$tool" "$flush"; do
         ! grep -qE 'RPATH|RUNPATH' <<<"$(readelf -d "$file")" || fail "$file has a search path"
         grep -q 'GNU_STACK.* RW ' <<<"$(readelf -lW "$file")" ||
             fail "$file wants an executable stack"

@@ -36,7 +36,7 @@ TEST_F(ProviderLibraryTest, ErrorsAreOneClearLine) {
 
 TEST_F(ProviderLibraryTest, FactoryIsCalledOnceMoreOnRequest) {
     ProviderLibrary library(broker, SAMPLE_PROVIDER, "Sample");
-    const auto* factoryCalls = static_cast<const int*>(library.mi()->hdl);
+    const auto* factoryCalls = static_cast<const std::atomic<int>*>(library.mi()->hdl);
     EXPECT_EQ(*factoryCalls, 1);
     EXPECT_EQ(library.callFactory(), library.mi());
     EXPECT_EQ(*factoryCalls, 2);

@@ -2,16 +2,19 @@
 #include <cmpidt.h>
 #include <cmpift.h>
 
+#include <atomic>
+
 namespace {
 
 const CMPIBroker* broker = nullptr;
-int factoryCalls = 0;
+std::atomic<int> factoryCalls = 0;
 
 CMPIStatus ok() {
     return {CMPI_RC_OK, nullptr};
 }
 
 CMPIStatus cleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean terminating) {
+    broker->eft->newString(broker, "cleanup", nullptr);
     return {terminating ? CMPI_RC_OK : CMPI_RC_DO_NOT_UNLOAD, nullptr};
 }
 
