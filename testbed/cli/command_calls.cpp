@@ -9,6 +9,7 @@
 #include <memory>
 
 #include "library_locator.h"
+#include "manager_option.h"
 #include "provider_log.h"
 #include "provider_session.h"
 #include "scenario_parser.h"
@@ -22,6 +23,7 @@ struct CallsOptions {
     std::string scenario;
     std::string library;
     std::string schema;
+    std::string manager;
     std::string provider = "PlexorProvider";
     unsigned timeoutSeconds = 60;
 };
@@ -59,7 +61,8 @@ std::map<std::string, std::map<std::string, int>> countCalls(ProviderSession& se
 }
 
 int printCalls(const CallsOptions& options) {
-    const Scenario scenario = readScenario(options.scenario);
+    Scenario scenario = readScenario(options.scenario);
+    scenario.manager = chosenManager(scenario, options.manager);
     directProviderLog(LOG_ERR, nullptr);
     ProviderSession session(scenario, locateLibrary(options.library), options.provider,
                             options.schema);
@@ -89,6 +92,7 @@ void addCallsCommand(CLI::App& app, int& status) {
     command->add_option("--provider", options->provider, "name that the factory begins with")
         ->capture_default_str();
     command->add_option("--schema", options->schema, "directory of the provider's classes (MOF)");
+    addManagerOption(*command, options->manager);
     command->add_option("--timeout", options->timeoutSeconds, "seconds to wait for the inventory")
         ->capture_default_str();
     command->callback([options, &status] { status = printCalls(*options); });

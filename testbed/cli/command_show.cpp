@@ -11,6 +11,7 @@
 #include "inventory.h"
 #include "json_view.h"
 #include "library_locator.h"
+#include "manager_option.h"
 #include "provider_log.h"
 #include "provider_session.h"
 #include "scenario_parser.h"
@@ -25,6 +26,7 @@ struct ShowOptions {
     std::string scenario;
     std::string library;
     std::string schema;
+    std::string manager;
     std::string provider = "PlexorProvider";
     std::string className;
     std::string nameSpace = "root/cimv2";
@@ -67,7 +69,8 @@ struct Answers {
 };
 
 Answers ask(const ShowOptions& options) {
-    const Scenario scenario = readScenario(options.scenario);
+    Scenario scenario = readScenario(options.scenario);
+    scenario.manager = chosenManager(scenario, options.manager);
     directLog(options.log);
     ProviderSession session(scenario, locateLibrary(options.library), options.provider,
                             options.schema, options.nameSpace);
@@ -114,6 +117,7 @@ void addShowCommand(CLI::App& app, int& status) {
     command->add_option("--provider", options->provider, "name that the factory begins with")
         ->capture_default_str();
     command->add_option("--schema", options->schema, "directory of the provider's classes (MOF)");
+    addManagerOption(*command, options->manager);
     command->add_option("--class", options->className, "show this class only")
         ->check(CLI::IsMember(knownClasses()));
     command->add_option("--namespace", options->nameSpace, "namespace of the requests")

@@ -8,6 +8,7 @@
 #include <iostream>
 
 #include "library_locator.h"
+#include "manager_option.h"
 #include "provider_log.h"
 #include "scenario_parser.h"
 #include "schema_locator.h"
@@ -22,6 +23,7 @@ void addLiveOptions(CLI::App& command, LiveOptions& options) {
     command.add_option("--provider", options.provider, "name that the factory begins with")
         ->capture_default_str();
     command.add_option("--schema", options.schema, "directory of the provider's classes (MOF)");
+    addManagerOption(command, options.manager);
 }
 
 void Printer::line(const std::string& text) {
@@ -43,7 +45,7 @@ std::pair<long, long> FileWatch::stamp() const {
 LiveSession::LiveSession(const LiveOptions& options)
     : file_(options.scenario),
       session_(
-          readScenario(options.scenario).manager,
+          chosenManager(readScenario(options.scenario), options.manager),
           [&](Broker& broker) {
               if (options.intervalSeconds) polling_.emplace(*options.intervalSeconds);
               array_ = std::make_unique<LiveArray>(broker, options.scenario);

@@ -26,6 +26,7 @@ struct LiveOptions {
     std::string scenario;
     std::string library;
     std::string schema;
+    std::string manager;  ///< in place of the scenario's; "": that one
     std::string provider = "PlexorProvider";
     std::optional<unsigned> intervalSeconds;  ///< of the provider's polling; its own without
 };

@@ -4,6 +4,7 @@
 
 #include <thread>
 
+#include "manager_stop.h"
 #include "schema_locator.h"
 #include "served_classes.h"
 #include "vendor.h"
@@ -55,7 +56,11 @@ ProviderSession::ProviderSession(const BrokerOptions& options,
     : broker_(repository_, options), library_(prepared(broker_, prepare), library, providerName) {}
 
 ProviderSession::~ProviderSession() {
-    library_.unload(true);
+    InstanceClient requests = client();
+    stopAndUnload(broker_, library_, [&] {
+        collectInventory(requests, allClasses(), "root/cimv2");
+        std::this_thread::sleep_for(kFlagInterval);
+    });
 }
 
 bool ProviderSession::waitForDiscovery(Clock::time_point deadline, const std::string& nameSpace) {

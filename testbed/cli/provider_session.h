@@ -24,7 +24,7 @@ public:
     /// the provider is loaded.
     ProviderSession(const BrokerOptions& options, const std::function<void(Broker&)>& prepare,
                     const std::string& library, const std::string& providerName);
-    /// Tells the provider that the manager stops, and unloads it.
+    /// Stops the provider as that manager does, and unloads it.
     ~ProviderSession();
     ProviderSession(const ProviderSession&) = delete;
     ProviderSession& operator=(const ProviderSession&) = delete;

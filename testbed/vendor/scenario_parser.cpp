@@ -5,6 +5,7 @@
 #include <fstream>
 #include <sstream>
 
+#include "manager_kinds.h"
 #include "scenario_reading.h"
 
 namespace testbed {
@@ -126,17 +127,36 @@ LatencyRange readLatency(JsonReader& scenario) {
     return {std::chrono::milliseconds(minimum), std::chrono::milliseconds(maximum)};
 }
 
+void readManagerMembers(JsonReader reader, BrokerOptions& options) {
+    if (const auto kind = reader.optionalText("kind")) setManagerKind(options, *kind);
+    for (const ManagerBehaviour& behaviour : managerBehaviours()) {
+        const std::string member = behaviour.memberName();
+        if (reader.has(member)) behaviour.set(options, reader.flag(member));
+    }
+    options.name = reader.text("name", options.name);
+    options.allProperties = reader.flag("allProperties");
+    options.strictProperties = reader.flag("strictProperties", true);
+    if (const auto seed = reader.number("orderSeed", UINT32_MAX))
+        options.orderSeed = static_cast<std::uint32_t>(*seed);
+    if (reader.has("staticNamespaces")) options.staticNamespaces = reader.texts("staticNamespaces");
+    reader.finish();
+}
+
+/// A manager's name, also with single behaviours, or an object with "kind" and behaviours.
 BrokerOptions readManager(JsonReader& scenario) {
     BrokerOptions options;
     options.strictProperties = true;
     const auto place = scenario.take("manager");
     if (!place) return options;
-    JsonReader reader(*place);
-    options.name = reader.text("name", options.name);
-    options.allProperties = reader.flag("allProperties");
-    options.serialQueries = reader.flag("serialQueries");
-    options.strictProperties = reader.flag("strictProperties", true);
-    reader.finish();
+    try {
+        if (place->value->is_string()) {
+            chooseManager(options, readText(*place));
+        } else {
+            readManagerMembers(JsonReader(*place), options);
+        }
+    } catch (const UnknownManager& error) {
+        place->fail(error.what());
+    }
     return options;
 }
 

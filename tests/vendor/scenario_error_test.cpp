@@ -115,6 +115,16 @@ TEST(ScenarioError, FaultsAndLatencyAreChecked) {
               "x.json: latencyMs: the second number must not be below the first");
 }
 
+TEST(ScenarioError, ManagersAreChecked) {
+    EXPECT_EQ(errorOf(R"({"manager": {"kind": "huge"}})"),
+              "x.json: manager: unknown manager \"huge\"; managers are host, small, large, worst");
+    EXPECT_EQ(errorOf(R"({"manager": "huge"})")
+                  .find("x.json: manager: unknown manager or behaviour \"huge\""),
+              0u);
+    EXPECT_EQ(errorOf(R"({"manager": {"noKey": true}})"),
+              "x.json: manager: unknown member \"noKey\"");
+}
+
 TEST(ScenarioError, MissingFile) {
     try {
         readScenario("/nowhere/at-all.json");

@@ -99,5 +99,24 @@ TEST(ScenarioParser, FaultsLatencyShuffleAndManager) {
     EXPECT_FALSE(scenario.manager.allProperties);
 }
 
+TEST(ScenarioParser, ManagerByNameOrPieceByPiece) {
+    EXPECT_EQ(parseScenario("{}", "x").manager.flush, FlushOffer::ContextEntry);
+    const BrokerOptions named = parseScenario(R"({"manager": "large"})", "x").manager;
+    EXPECT_EQ(named.flush, FlushOffer::None);
+    EXPECT_TRUE(named.strictProperties);
+    const BrokerOptions pieces =
+        parseScenario(R"({"manager": {"kind": "large", "noKeys": false, "serialQueries": true,
+                         "orderSeed": 9, "staticNamespaces": ["root/interop"],
+                         "strictProperties": false}})",
+                      "x")
+            .manager;
+    EXPECT_TRUE(pieces.randomOrder);
+    EXPECT_FALSE(pieces.instancesWithoutKeys);
+    EXPECT_TRUE(pieces.serialQueries);
+    EXPECT_EQ(pieces.orderSeed, 9u);
+    EXPECT_EQ(pieces.staticNamespaces, std::vector<std::string>{"root/interop"});
+    EXPECT_FALSE(pieces.strictProperties);
+}
+
 }  // namespace
 }  // namespace testbed

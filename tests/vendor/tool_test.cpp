@@ -70,6 +70,24 @@ void expectOneLine(const Outcome& outcome, const std::string& text) {
     EXPECT_NE(outcome.errors.find(text), std::string::npos) << outcome.errors;
 }
 
+TEST_F(Tool, ManagersAreThoseOfTheManual) {
+    const Outcome table = run("managers");
+    EXPECT_EQ(table.status, 0);
+    EXPECT_EQ(std::count(table.output.begin(), table.output.end(), '\n'), 22) << table.output;
+    EXPECT_NE(contentOf(MANAGERS_MANUAL).find("\n\n" + table.output + "\n"), std::string::npos);
+}
+
+TEST_F(Tool, ManagerIsChosenOnTheCommandLine) {
+    const Outcome calls = run("calls --scenario " SCENARIO_DIR "/no-such.json --manager huge");
+    EXPECT_EQ(calls.status, 2);
+    EXPECT_NE(calls.errors.find("unknown manager or behaviour \"huge\""), std::string::npos);
+    const Outcome usual = show("degraded-array", "");
+    const Outcome shuffled = show("degraded-array", "--manager random-order");
+    EXPECT_EQ(shuffled.status, 0) << shuffled.errors;
+    EXPECT_EQ(shuffled.output.size(), usual.output.size());
+    EXPECT_NE(shuffled.output, usual.output);
+}
+
 TEST_F(Tool, UsageErrorsExitWithTwo) {
     EXPECT_EQ(run("").status, 2);
     EXPECT_EQ(run("show").status, 2);
