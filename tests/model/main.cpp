@@ -1,7 +1,7 @@
 // The model test: random changes of the vendor's array and random requests of clients, and after
 // each request the cache and the log must be what a simple model says.
 //
-//   model-test [--seed N] [--steps N]
+//   model-test [--seed N] [--steps N] [--manager KIND]
 #include <unistd.h>
 
 #include <CLI/CLI.hpp>
@@ -14,6 +14,7 @@
 #include "cache_model.h"
 #include "fake_host.h"
 #include "instance_client.h"
+#include "manager_kinds.h"
 #include "vendor.h"
 
 #if defined(__SANITIZE_ADDRESS__)
@@ -31,10 +32,10 @@ constexpr std::time_t kInterval = 20;
 /// The provider, its broker and the model, as one host.
 class ModelTest {
 public:
-    explicit ModelTest(unsigned seed)
+    ModelTest(unsigned seed, const testbed::BrokerOptions& manager)
         : scenario_(ArrayChanger::startingScenario()),
           naming_(scenario_.vendor, scenario_.host),
-          broker_(repository_),
+          broker_(repository_, manager),
           model_(repository_, naming_, scenario_, kInterval),
           changer_(broker_, scenario_, naming_, model_, seed) {
         testbed::buildVendor(repository_, scenario_);
@@ -142,12 +143,19 @@ int main(int argc, char** argv) {
     CLI::App app("Compares the provider's cache with a model under random changes");
     unsigned seed = std::random_device()();
     int steps = 10000;
+    std::string manager = "host";
     app.add_option("--seed", seed, "Seed of the changes; drawn when not given");
     app.add_option("--steps", steps, "Number of requests");
+    app.add_option("--manager", manager,
+                   "Kind of manager, but for random-order and dangling-fails");
     CLI11_PARSE(app, argc, argv);
 
     std::cout << "seed " << seed << ", " << steps << " steps" << std::endl;
-    modeltest::ModelTest test(seed);
+    testbed::BrokerOptions options;
+    // The model says in which order things are logged, so it has to know the order of results; and
+    // the changes leave references to pools that have gone.
+    testbed::chooseManager(options, manager + ",random-order=off,dangling-fails=off");
+    modeltest::ModelTest test(seed, options);
     if (!test.start()) return EXIT_FAILURE;
     for (int i = 1; i <= steps; i++) {
         if (test.step()) continue;

@@ -1,7 +1,7 @@
 // Many clients, an array that never stands still and a slow vendor, with the provider's own
 // workers.
 //
-//   concurrency-test [--seconds N] [--seed N] [--threads N]
+//   concurrency-test [--seconds N] [--seed N] [--threads N] [--manager KIND]
 #include <CLI/CLI.hpp>
 #include <atomic>
 #include <cstdlib>
@@ -14,6 +14,8 @@
 #include "clients.h"
 #include "fast_clock.h"
 #include "formatted_log.h"
+#include "manager_kinds.h"
+#include "manager_stop.h"
 #include "polling_interval.h"
 #include "process_view.h"
 #include "settlement.h"
@@ -51,6 +53,7 @@ struct Settings {
     int threads = 16;
     int speed = 4;
     int latency = 50;
+    testbed::BrokerOptions manager;
 };
 
 /// Nobody keeps account of the faults: they only have to do no lasting harm.
@@ -76,7 +79,7 @@ public:
         : settings_(settings),
           scenario_(arrayWithSteadyController()),
           naming_(scenario_.vendor, scenario_.host),
-          broker_(repository_),
+          broker_(repository_, settings.manager),
           changer_(broker_, scenario_, naming_, listener_, settings.seed),
           check_(failures_, scenario_) {
         testbed::buildVendor(repository_, scenario_);
@@ -88,11 +91,11 @@ public:
     std::size_t run() {
         const std::size_t threadsBefore = threadCountAtRest();
         startChanging();
-        testbed::InstanceClient client(broker_, callFactory());
+        testbed::InstanceClient client(broker_, callFactories());
         torment(client);
         if (settle(client)) {
             compareAnswers(client, scenario_, failures_);
-            compareCache(scenario_, failures_);
+            compareCache(scenario_, settings_.manager.randomOrder, failures_);
         } else {
             failures_.add("the refreshes do not come to an end");
         }
@@ -106,6 +109,18 @@ private:
         const testbed::Broker::CallScope scope(broker_);
         CMPIStatus status = {CMPI_RC_OK, nullptr};
         return PlexorProvider_Create_InstanceMI(broker_.handle(), scope.context(), &status);
+    }
+
+    /// As often as the manager does; all calls give the same.
+    CMPIInstanceMI* callFactories() {
+        std::vector<std::thread> further;
+        CMPIInstanceMI* const mi = callFactory();
+        for (int i = 1; i < settings_.manager.factoryCalls; i++)
+            further.emplace_back([&] {
+                if (callFactory() != mi) failures_.add("another interface for another class");
+            });
+        for (std::thread& thread : further) thread.join();
+        return mi;
     }
 
     void startChanging() {
@@ -143,7 +158,10 @@ private:
     }
 
     void unload(testbed::InstanceClient& client, std::size_t threadsBefore) {
-        const CMPIrc rc = client.cleanup(true);
+        const CMPIrc rc = testbed::stopProvider(broker_, client, [&] {
+            for (const auto& served : testbed::servedClasses())
+                client.enumerateInstances(served.name);
+        });
         if (rc != CMPI_RC_OK) failures_.add("cleanup answers " + std::to_string(rc));
         if (!waitForThreadCount(threadsBefore, seconds(2)))
             failures_.add("workers are left: " + std::to_string(threadCount()) + " threads, " +
@@ -179,7 +197,7 @@ private:
 int main(int argc, char** argv) {
     torture::Settings settings;
     settings.seed = std::random_device()();
-    if (getenv("PLEXOR_LONG") != nullptr) settings.runSeconds = 600;
+    std::string manager = "host";
     CLI::App app("Puts the provider under load while its array changes");
     app.add_option("--seconds", settings.runSeconds, "How long, real time");
     app.add_option("--seed", settings.seed, "Seed of requests and changes; drawn when not given");
@@ -188,7 +206,16 @@ int main(int argc, char** argv) {
         ->check(CLI::Range(1, 1000));
     app.add_option("--latency", settings.latency, "Longest answer time of the vendor, ms")
         ->check(CLI::Range(0, 10000));
+    app.add_option("--manager", manager, "Kind of manager and behaviours");
     CLI11_PARSE(app, argc, argv);
+    if (app.count("--seconds") == 0) {
+        const bool isLong = getenv("PLEXOR_LONG") != nullptr;
+        settings.runSeconds = isLong ? 600 : manager == "host" ? 10 : 3;
+    }
+    // The answers are known by their keys, and the changes leave references to pools that have
+    // gone.
+    testbed::chooseManager(settings.manager,
+                           manager + ",filter-drops-names=off,dangling-fails=off");
 
     std::cout << "seed " << settings.seed << ", " << settings.runSeconds << " s, "
               << settings.threads << " clients" << std::endl;

@@ -8,6 +8,7 @@
 #include <thread>
 
 #include "fast_clock.h"
+#include "manager_stop.h"
 #include "process_view.h"
 #include "vendor.h"
 
@@ -121,16 +122,21 @@ void LoadCycles::waitForInventory(ProviderLibrary& library) {
     FastClock::skip(kGrace);
 }
 
+int LoadCycles::ask(ProviderLibrary& library) {
+    InstanceClient client = library.client();
+    int refused = 0;
+    for (const auto& served : testbed::servedClasses())
+        if (client.enumerateInstances(served.name).rc != CMPI_RC_OK) refused++;
+    return refused;
+}
+
 void LoadCycles::askFromManyThreads(ProviderLibrary& library) {
     std::atomic<bool> stop = false;
     std::atomic<int> refused = 0;
     std::vector<std::thread> clients;
     for (int i = 0; i < kClients; i++)
         clients.emplace_back([&] {
-            InstanceClient client = library.client();
-            while (!stop)
-                for (const auto& served : testbed::servedClasses())
-                    if (client.enumerateInstances(served.name).rc != CMPI_RC_OK) refused++;
+            while (!stop) refused += ask(library);
         });
     std::this_thread::sleep_for(kUseTime);
     stop = true;
@@ -163,8 +169,10 @@ void LoadCycles::unload(ProviderLibrary& library, Moment moment) {
         checkInventory(library.client());
         FastClock::skip(kIdleTime);
     }
-    const bool terminating = moment != Moment::IdleTimeOver;
-    require(library.unload(terminating) == CMPI_RC_OK, "the unload was refused");
+    const CMPIrc rc = moment == Moment::IdleTimeOver
+                          ? library.unload(false)
+                          : testbed::stopAndUnload(broker_, library, [&] { ask(library); });
+    require(rc == CMPI_RC_OK, "the unload was refused");
 }
 
 void LoadCycles::checkGone(std::size_t threadsBefore) {

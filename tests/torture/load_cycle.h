@@ -43,6 +43,8 @@ private:
     std::unique_ptr<testbed::ProviderLibrary> load();
     void delayAttach();
     void waitForInventory(testbed::ProviderLibrary& library);
+    /// Asks for every class once. How many requests were refused.
+    static int ask(testbed::ProviderLibrary& library);
     void askFromManyThreads(testbed::ProviderLibrary& library);
     void checkInventory(testbed::InstanceClient client);
     void unload(testbed::ProviderLibrary& library, Moment moment);

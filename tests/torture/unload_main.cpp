@@ -1,6 +1,6 @@
 // Loads the provider's library, uses it, unloads it, and looks whether it has gone; many times.
 //
-//   unload-test [--cycles N] [--library FILE] [--stuck]
+//   unload-test [--cycles N] [--library FILE] [--manager KIND] [--stuck]
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
@@ -9,6 +9,7 @@
 
 #include "fast_clock.h"
 #include "load_cycle.h"
+#include "manager_option.h"
 #include "polling_interval.h"
 #include "process_view.h"
 #include "scenario_parser.h"
@@ -54,12 +55,13 @@ int main(int argc, char** argv) {
     const bool longForm = getenv("PLEXOR_LONG") != nullptr;
     int count = longForm ? 1000 : 5;
     bool stuck = false;
-    std::string library = PROVIDER, scenarioFile = SCENARIO;
+    std::string library = PROVIDER, scenarioFile = SCENARIO, manager;
     CLI::App app("Loads and unloads the provider's library");
     app.add_option("--cycles", count, "Number of cycles");
     app.add_option("--library", library, "The provider's library");
     app.add_option("--scenario", scenarioFile, "The vendor's array");
     app.add_flag("--stuck", stuck, "Unload while a worker is stuck in the vendor's provider");
+    testbed::addManagerOption(app, manager);
     CLI11_PARSE(app, argc, argv);
 
     if (stuck && !longForm) {
@@ -70,7 +72,8 @@ int main(int argc, char** argv) {
     const testbed::PollingInterval interval(1);
     torture::FastClock::setSpeed(torture::kSpeed);
     try {
-        const testbed::Scenario scenario = testbed::readScenario(scenarioFile);
+        testbed::Scenario scenario = testbed::readScenario(scenarioFile);
+        scenario.manager = testbed::chosenManager(scenario, manager);
         torture::LoadCycles cycles(scenario, library);
         if (stuck)
             cycles.runStuck();

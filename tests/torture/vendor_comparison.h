@@ -15,6 +15,7 @@ void compareAnswers(testbed::InstanceClient& client, const testbed::Scenario& sc
 
 /// The cache's pools are the array's, drives and pools agree on who belongs to whom, and drives
 /// stand in the pool that the array says. No thread may be at work.
-void compareCache(const testbed::Scenario& scenario, Failures& failures);
+/// `anyOrder`: the manager gives associated objects in any order.
+void compareCache(const testbed::Scenario& scenario, bool anyOrder, Failures& failures);
 
 }  // namespace torture
