@@ -1,9 +1,8 @@
 // What the workers keep of the objects that they obtain from the object manager, after the first
 // inventory and after each refresh of the drives. Nothing may pile up where the manager can be
-// asked to flush a thread. object-growth-bare is a manager without a flush of its own: under a
-// build that does not use the context's, everything stays.
+// asked to flush a thread.
 //
-//   object-growth [--drives N] [--refreshes N] [--flat] [--library FILE]
+//   object-growth [--drives N] [--refreshes N] [--flat] [--library FILE] [--manager KIND]
 //
 // With --flat the exit status is 1 when anything piles up.
 #include <syslog.h>
@@ -17,6 +16,7 @@
 
 #include "bench_clients.h"
 #include "drive_shelf.h"
+#include "manager_option.h"
 #include "polling_interval.h"
 #include "provider_session.h"
 
@@ -72,10 +72,12 @@ void refresh(testbed::ProviderSession& session) {
 }
 
 /// How many objects more are kept after the last refresh than after the inventory.
-std::size_t measure(int drives, int refreshes, const std::string& library) {
+std::size_t measure(int drives, int refreshes, const std::string& library,
+                    const std::string& manager) {
     const testbed::PollingInterval interval(1);
-    testbed::ProviderSession session(driveShelf(drives, std::chrono::milliseconds(0)), library,
-                                     "PlexorProvider");
+    testbed::Scenario shelf = driveShelf(drives, std::chrono::milliseconds(0));
+    shelf.manager = testbed::chosenManager(shelf, manager);
+    testbed::ProviderSession session(shelf, library, "PlexorProvider");
     testbed::Books& books = session.broker().books();
     books.keepCalls(false);
     if (!session.waitForInventory(kInventoryLimit, "root/cimv2"))
@@ -98,18 +100,19 @@ int main(int argc, char** argv) {
     int drives = 1000;
     int refreshes = 5;
     bool flat = false;
-    std::string library = PROVIDER;
+    std::string library = PROVIDER, manager;
     CLI::App app("Measures what the provider's workers keep of the object manager's objects");
     app.add_option("--drives", drives, "Number of drives")->check(CLI::Range(1, 100000));
     app.add_option("--refreshes", refreshes, "Number of refreshes")->check(CLI::Range(0, 1000));
     app.add_flag("--flat", flat, "Fail when objects pile up");
     app.add_option("--library", library, "The provider's library");
+    testbed::addManagerOption(app, manager);
     CLI11_PARSE(app, argc, argv);
 
     setlogmask(LOG_UPTO(LOG_EMERG));
     std::printf("%-10s %4s %12s %12s\n", "after", "", "clones", "others");
     try {
-        const std::size_t growth = bench::measure(drives, refreshes, library);
+        const std::size_t growth = bench::measure(drives, refreshes, library, manager);
         if (!flat || growth == 0) return EXIT_SUCCESS;
         std::cerr << growth << " objects have piled up" << std::endl;
     } catch (const std::exception& error) {
