@@ -83,7 +83,7 @@ private:
     }
 
     const StopSignals& signals_;
-    InputLines input_;
+    InputLines input_{InputLines::Pipe::Reopens};
     ObjectManager manager_;
     CimServer cim_;
     HttpServer http_;
