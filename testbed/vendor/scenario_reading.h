@@ -19,8 +19,8 @@ struct PartName {
 void readTweaks(JsonReader& reader, Described& described, const char* cimClass,
                 std::initializer_list<PartName> parts = {});
 
-/// Reads "status" (a word) or "operationalStatus" (a number) of an object without finer states.
-std::uint16_t readStatus(JsonReader& reader);
+/// Reads "status" or "operationalStatus", which mean the same: a word or a number.
+std::uint16_t readStatus(JsonReader& reader, std::uint16_t absent = 2);
 
 /// Reads the list `name` of a controller with one of the functions below; ids must differ.
 template <typename Description>
