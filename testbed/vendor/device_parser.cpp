@@ -81,6 +81,7 @@ PoolDescription readPool(const JsonPlace& place, const ControllerDescription&) {
     PoolDescription pool;
     pool.id = reader.text("id");
     pool.primordial = reader.flag("primordial");
+    pool.members = reader.texts("members");
     pool.total = readBytes(reader, "total");
     pool.remaining = readBytes(reader, "remaining");
     pool.operationalStatus = readStatus(reader);
@@ -117,6 +118,9 @@ DriveDescription readDrive(const JsonPlace& place, const ControllerDescription& 
     drive.firmware = reader.optionalText("firmware");
     drive.blocks = readBlocks(reader, "capacity", 0);
     drive.consumableBlocks = readBlocks(reader, "consumable", drive.blocks);
+    drive.spareFor = reader.text("spareFor", "");
+    if (const StateWord* before = reader.state("before", driveStates()))
+        drive.before = before->word;
     readTweaks(reader, drive, "CIM_DiskDrive",
                {{"extent", "CIM_StorageExtent"},
                 {"package", "CIM_PhysicalPackage"},

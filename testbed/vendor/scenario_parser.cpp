@@ -156,6 +156,8 @@ Scenario readDocument(const JsonPlace& place) {
     if (const auto seed = reader.number("shuffle", UINT32_MAX))
         scenario.shuffle = static_cast<std::uint32_t>(*seed);
     scenario.manager = readManager(reader);
+    scenario.consequences = readConsequences(reader);
+    scenario.timeline = readTimeline(reader);
     reader.finish();
     if (!reader.has("controllers")) reader.fail("\"controllers\" is missing");
     return scenario;

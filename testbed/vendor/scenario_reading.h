@@ -52,4 +52,9 @@ std::vector<SoftwareDescription> readSoftware(JsonReader& reader);
 
 FaultRule readFault(const JsonPlace& place);
 
+/// "consequences": true, false, or an object with the times.
+Consequences readConsequences(JsonReader& scenario);
+/// "timeline": commands with their times, in the order of time.
+std::vector<TimedCommand> readTimeline(JsonReader& scenario);
+
 }  // namespace testbed
