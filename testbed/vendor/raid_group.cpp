@@ -7,7 +7,7 @@ namespace {
 
 using enum DriveCondition;
 
-constexpr std::uint16_t kOk = 2, kPredictiveFailure = 5, kDormant = 15;
+constexpr std::uint16_t kOk = 2, kDormant = 15;
 constexpr std::uint16_t kRebuild = 11, kSpare = 13;
 
 /// How a level spreads over its places: `spans` equal parts, each of which bears `losses`.
@@ -31,13 +31,16 @@ bool holds(const std::vector<std::string>& list, const std::string& text) {
 
 }  // namespace
 
+bool isLostStatus(std::uint16_t operationalStatus) {
+    constexpr std::uint16_t kLost[] = {6, 7, 12, 13};  // error, broken, no contact, lost
+    return std::find(std::begin(kLost), std::end(kLost), operationalStatus) != std::end(kLost);
+}
+
 DriveCondition conditionOf(const DriveDescription& drive) {
-    if (drive.operationalStatus == kPredictiveFailure) return drive.primordial ? Elsewhere : Sound;
-    if (drive.operationalStatus == kDormant) return Elsewhere;
-    if (drive.operationalStatus != kOk) return Lost;
-    if (drive.extentStatus == kRebuild) return Filling;
-    if (drive.extentStatus == kSpare) return Spare;
-    return drive.primordial ? Elsewhere : Sound;
+    if (isLostStatus(drive.operationalStatus)) return Lost;
+    if (drive.operationalStatus == kOk && drive.extentStatus == kRebuild) return Filling;
+    if (drive.operationalStatus == kOk && drive.extentStatus == kSpare) return Spare;
+    return drive.primordial || drive.operationalStatus == kDormant ? Elsewhere : Sound;
 }
 
 std::vector<std::string> groupPlaces(const ControllerDescription& controller,

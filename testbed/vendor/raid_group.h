@@ -11,6 +11,9 @@ namespace testbed {
 /// How a drive stands to its group.
 enum class DriveCondition { Sound, Filling, Lost, Spare, Elsewhere };
 
+/// Whether an OperationalStatus is that of a thing that cannot be used.
+bool isLostStatus(std::uint16_t operationalStatus);
+
 /// From the numbers that the vendor publishes for it.
 DriveCondition conditionOf(const DriveDescription& drive);
 
