@@ -13,6 +13,7 @@
 #include "library_locator.h"
 #include "provider_log.h"
 #include "provider_session.h"
+#include "scenario_locator.h"
 #include "scenario_parser.h"
 #include "tree_view.h"
 
@@ -108,7 +109,7 @@ std::vector<std::string> knownClasses() {
 void addShowCommand(CLI::App& app, int& status) {
     const auto options = std::make_shared<ShowOptions>();
     CLI::App* command = app.add_subcommand("show", "Shows what a client sees of a scenario");
-    command->add_option("--scenario", options->scenario, "scenario file")->required();
+    addScenarioOption(*command, options->scenario);
     command->add_option("--library", options->library, "the provider's shared library")
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")

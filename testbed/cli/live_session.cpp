@@ -9,6 +9,7 @@
 
 #include "library_locator.h"
 #include "provider_log.h"
+#include "scenario_locator.h"
 #include "scenario_parser.h"
 #include "schema_locator.h"
 #include "served_classes.h"
@@ -16,7 +17,7 @@
 namespace testbed {
 
 void addLiveOptions(CLI::App& command, LiveOptions& options) {
-    command.add_option("--scenario", options.scenario, "scenario file")->required();
+    addScenarioOption(command, options.scenario);
     command.add_option("--library", options.library, "the provider's shared library")
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command.add_option("--provider", options.provider, "name that the factory begins with")

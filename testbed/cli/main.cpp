@@ -6,6 +6,7 @@
 #include "check_command.h"
 #include "command_ask.h"
 #include "command_calls.h"
+#include "command_scenarios.h"
 #include "command_serve.h"
 #include "command_show.h"
 #include "command_watch.h"
@@ -25,6 +26,7 @@ int main(int argc, char** argv) {
     testbed::addCallsCommand(app, status);
     testbed::addAskCommand(app, status);
     testbed::addServeCommand(app, status);
+    testbed::addScenariosCommand(app, status);
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& error) {
