@@ -9,6 +9,7 @@
 #include "command_scenarios.h"
 #include "command_serve.h"
 #include "command_show.h"
+#include "command_tell.h"
 #include "command_watch.h"
 
 namespace {
@@ -26,6 +27,7 @@ int main(int argc, char** argv) {
     testbed::addCallsCommand(app, status);
     testbed::addAskCommand(app, status);
     testbed::addServeCommand(app, status);
+    testbed::addTellCommand(app, status);
     testbed::addScenariosCommand(app, status);
     try {
         app.parse(argc, argv);

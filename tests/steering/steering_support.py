@@ -38,7 +38,8 @@ class Session:
                                         stderr=subprocess.STDOUT, **options)
         self.lines = []
         self.arrived = queue.Queue()
-        threading.Thread(target=self._receive, daemon=True).start()
+        self.reader = threading.Thread(target=self._receive, daemon=True)
+        self.reader.start()
 
     def _receive(self):
         for line in self.process.stdout:
@@ -73,6 +74,10 @@ class Session:
     def __exit__(self, *_):
         self.process.kill()
         self.process.wait()
+        self.reader.join()
+        for stream in (self.process.stdin, self.process.stdout):
+            if stream:
+                stream.close()
 
 
 def serve(*arguments, scenario="healthy-array", **options):
