@@ -145,6 +145,7 @@ Scenario readDocument(const JsonPlace& place) {
     limitRepetitions(place);
     JsonReader reader(place);
     Scenario scenario;
+    reader.take("$schema");  // for editors
     scenario.description = reader.text("description", "");
     scenario.host = readHost(reader);
     scenario.vendor = readVendor(reader);
