@@ -22,6 +22,7 @@ expected_files() {
         echo "644 usr/share/doc/$package/$file"
     done
     echo "644 usr/share/man/man1/plexor-testbed.1"
+    echo "644 usr/share/man/man5/plexor-scenario.5"
     echo "644 usr/share/man/man7/plexor-provider.7"
     echo "644 usr/share/man/man8/plexor-register.8"
     for file in "$source"/cim/schema/*.mof; do
