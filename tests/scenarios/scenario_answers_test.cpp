@@ -85,9 +85,8 @@ TEST_P(ScenarioAnswers, AreThoseWorkedOutByHand) {
 INSTANTIATE_TEST_SUITE_P(Ordered, ScenarioAnswers,
                          ::testing::Values("healthy-array", "degraded-array", "two-controllers",
                                            "no-pools", "many-drives", "predictive-failure",
-                                           "raid6-double-fault", "foreign-drives",
-                                           "enclosure-lost", "battery-learning",
-                                           "spare-rebuild", "four-enclosures"));
+                                           "raid6-double-fault", "foreign-drives", "enclosure-lost",
+                                           "battery-learning", "spare-rebuild", "four-enclosures"));
 
 class HostileVendor : public ScenarioAnswers {};
 
