@@ -176,7 +176,8 @@ CommandResult LiveSession::carryOut(const std::string& line) {
 bool LiveSession::execute(const std::string& line) {
     try {
         const auto words = commandWords(line);
-        if (words.size() == 2 && words[0].text == "wait") {
+        if (!words.empty() && words[0].text == "wait") {
+            if (words.size() != 2) refuseCommand("wait takes a number of seconds");
             wait(secondsOf(words[1]));
             return true;
         }

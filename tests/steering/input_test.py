@@ -28,6 +28,7 @@ class Input(unittest.TestCase):
         watched = self.watch("wait abc\nwait\nwait -1\nfail battery C0 0\n")
         self.assertEqual(watched.returncode, 0)
         self.assertEqual(watched.stdout.count("? command: a number of seconds from 0 to"), 2)
+        self.assertIn("? command: wait takes a number of seconds\n", watched.stdout)
         self.assertIn("> fail battery C0 0", watched.stdout)
 
     def test_waiting_keeps_later_commands_back(self):
