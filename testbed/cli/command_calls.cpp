@@ -12,6 +12,7 @@
 #include "manager_option.h"
 #include "provider_log.h"
 #include "provider_session.h"
+#include "scenario_locator.h"
 #include "scenario_parser.h"
 
 namespace testbed {
@@ -86,7 +87,7 @@ void addCallsCommand(CLI::App& app, int& status) {
     const auto options = std::make_shared<CallsOptions>();
     CLI::App* command =
         app.add_subcommand("calls", "Counts the provider's calls while it builds its inventory");
-    command->add_option("--scenario", options->scenario, "scenario file")->required();
+    addScenarioOption(*command, options->scenario);
     command->add_option("--library", options->library, "the provider's shared library")
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")

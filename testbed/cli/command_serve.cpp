@@ -1,5 +1,6 @@
 #include "command_serve.h"
 
+#include <poll.h>
 #include <signal.h>
 #include <syslog.h>
 #include <unistd.h>
@@ -9,6 +10,7 @@
 #include <memory>
 
 #include "cim_server.h"
+#include "control_socket.h"
 #include "http_server.h"
 #include "input_lines.h"
 #include "live_session.h"
@@ -24,6 +26,7 @@ struct ServeOptions {
     HttpServerOptions http;
     std::string user;
     std::string passwordFile;
+    std::string control;
     bool log = false;
 };
 
@@ -54,18 +57,17 @@ public:
           manager_(session().repository(), registrationOf(session())),
           cim_(manager_, hostName(), std::move(credentials)),
           http_(options.http, [this](const HttpRequest& request) { return cim_.answer(request); }),
+          control_(options.control),
           url_(urlOf(options)) {
         // Nobody asks for the calls, and there is no end to them.
         session().broker().books().keepCalls(false);
     }
 
-    void run() {
+    /// False when a refused command has ended it.
+    bool run() {
         printer().line("serving " + url_);
-        while (!signals_.arrived()) {
-            const auto line = input_.next(std::chrono::seconds(1), signals_.descriptor());
-            if (line && !execute(*line)) return;
-            takeNewFile();
-        }
+        while (!signals_.arrived() && passTime() && takeCommands()) takeNewFile();
+        return !hasFailed();
     }
 
 private:
@@ -76,21 +78,44 @@ private:
                std::to_string(http_.port()) + "/cimom";
     }
 
-    void show() override { printer().line(treeView(ask())); }
+    /// Waits a second at most for commands and carries them out. False when one ends the server.
+    bool takeCommands() {
+        const bool listens = std::chrono::steady_clock::now() >= inputResumes_;
+        std::vector<pollfd> sources = {{listens ? input_.descriptor() : -1, POLLIN, 0},
+                                       {signals_.descriptor(), POLLIN, 0}};
+        control_.watch(sources);
+        const auto limit = pause(std::chrono::seconds(1));
+        poll(sources.data(), sources.size(), static_cast<int>(limit.count()));
+        if (sources[0].revents != 0) input_.receive();
+        return takeInput() && control_.attend([this](const auto& line) { return carryOut(line); });
+    }
+
+    bool takeInput() {
+        while (std::chrono::steady_clock::now() >= inputResumes_) {
+            const auto line = input_.take();
+            if (!line) return true;
+            if (!execute(*line)) return false;
+        }
+        return true;
+    }
+
+    std::string tree() override { return treeView(ask()); }
 
     void wait(int seconds) override {
-        for (int i = 0; i < seconds && !signals_.arrived(); i++) sleep(1);
+        inputResumes_ = std::chrono::steady_clock::now() + std::chrono::seconds(seconds);
     }
 
     const StopSignals& signals_;
-    InputLines input_;
+    InputLines input_{InputLines::Pipe::Reopens};
     ObjectManager manager_;
     CimServer cim_;
     HttpServer http_;
+    ControlSocket control_;
     std::string url_;
+    std::chrono::steady_clock::time_point inputResumes_{};
 };
 
-void serve(const ServeOptions& options) {
+bool serve(const ServeOptions& options) {
     StopSignals signals;
     // Whoever reads the lines may go away; the clients stay.
     signal(SIGPIPE, SIG_IGN);
@@ -99,9 +124,10 @@ void serve(const ServeOptions& options) {
                           if (show) std::cerr << line << "\n";
                       });
     Serve server(options, credentialsOf(options), signals);
-    server.run();
+    const bool succeeded = server.run();
     // A provider that does not return keeps the server from ending.
     signals.letNextOneEnd();
+    return succeeded;
 }
 
 }  // namespace
@@ -125,11 +151,10 @@ void addServeCommand(CLI::App& app, int& status) {
     file->needs(user);
     command->add_option("--interval", options->live.intervalSeconds,
                         "the provider's polling interval in seconds");
+    command->add_option("--control", options->control,
+                        "socket on which plexor-testbed tell gives commands");
     command->add_flag("--log", options->log, "print the provider's log lines on standard error");
-    command->callback([options, &status] {
-        serve(*options);
-        status = 0;
-    });
+    command->callback([options, &status] { status = serve(*options) ? 0 : 1; });
 }
 
 }  // namespace testbed

@@ -14,6 +14,7 @@
 #include "manager_option.h"
 #include "provider_log.h"
 #include "provider_session.h"
+#include "scenario_locator.h"
 #include "scenario_parser.h"
 #include "tree_view.h"
 
@@ -111,7 +112,7 @@ std::vector<std::string> knownClasses() {
 void addShowCommand(CLI::App& app, int& status) {
     const auto options = std::make_shared<ShowOptions>();
     CLI::App* command = app.add_subcommand("show", "Shows what a client sees of a scenario");
-    command->add_option("--scenario", options->scenario, "scenario file")->required();
+    addScenarioOption(*command, options->scenario);
     command->add_option("--library", options->library, "the provider's shared library")
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")

@@ -16,6 +16,7 @@
 namespace testbed {
 namespace {
 
+constexpr int kRefused = 1;
 constexpr int kProviderFailed = 3;
 
 struct WatchOptions {
@@ -45,13 +46,13 @@ public:
             return kProviderFailed;
         }
         last_ = ask();
-        show();
+        printer().line(tree());
         showLog();
-        while (takeInput()) {
+        while (passTime() && takeInput()) {
             takeNewFile();
             poll();
         }
-        return 0;
+        return hasFailed() ? kRefused : 0;
     }
 
 private:
@@ -82,10 +83,10 @@ private:
         return line ? execute(*line) : !input_.atEnd();
     }
 
-    void show() override { printer().line(treeView(last_)); }
+    std::string tree() override { return treeView(last_); }
 
     void wait(int seconds) override {
-        for (int i = 0; i < seconds; i++) {
+        for (int i = 0; i < seconds && passTime(); i++) {
             sleep(1);
             poll();
         }
@@ -102,9 +103,8 @@ void addWatchCommand(CLI::App& app, int& status) {
     const auto options = std::make_shared<WatchOptions>();
     CLI::App* command = app.add_subcommand(
         "watch",
-        "Polls the provider while the array changes: by commands on standard input (set, add, "
-        "remove, fail, rebuild, latency, fault, clear faults, wait N, show, quit) or by a new "
-        "version of the scenario file");
+        "Polls the provider while the array changes: by commands on standard input (help lists "
+        "them), by the scenario's timeline, or by a new version of the scenario file");
     addLiveOptions(*command, options->live);
     command
         ->add_option("--interval", options->intervalSeconds,

@@ -4,12 +4,19 @@
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
-#include <cstdlib>
+#include <algorithm>
+#include <charconv>
+#include <cmath>
+#include <iomanip>
 #include <iostream>
+#include <sstream>
 
+#include "array_commands.h"
+#include "command_words.h"
 #include "library_locator.h"
 #include "manager_option.h"
 #include "provider_log.h"
+#include "scenario_locator.h"
 #include "scenario_parser.h"
 #include "schema_locator.h"
 #include "served_classes.h"
@@ -17,14 +24,43 @@
 namespace testbed {
 
 void addLiveOptions(CLI::App& command, LiveOptions& options) {
-    command.add_option("--scenario", options.scenario, "scenario file")->required();
+    addScenarioOption(command, options.scenario);
     command.add_option("--library", options.library, "the provider's shared library")
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command.add_option("--provider", options.provider, "name that the factory begins with")
         ->capture_default_str();
     command.add_option("--schema", options.schema, "directory of the provider's classes (MOF)");
     addManagerOption(command, options.manager);
+    command
+        .add_option("--speed", options.speed,
+                    "how much faster than the clock the array's time goes")
+        ->check(CLI::Range(0.001, 1000000.0))
+        ->capture_default_str();
+    command.add_flag("--strict", options.strict, "end with status 1 when a command is refused");
 }
+
+namespace {
+
+constexpr int kLongestWait = 1000000;
+
+/// The seconds of "wait 5".
+int secondsOf(const CommandWord& word) {
+    int seconds = -1;
+    const char* end = word.text.data() + word.text.size();
+    const auto [rest, error] = std::from_chars(word.text.data(), end, seconds);
+    if (error != std::errc() || rest != end || seconds < 0 || seconds > kLongestWait)
+        refuseCommand("a number of seconds from 0 to " + std::to_string(kLongestWait) +
+                      " is needed behind wait");
+    return seconds;
+}
+
+std::string timeText(double seconds) {
+    std::ostringstream text;
+    text << std::fixed << std::setprecision(seconds == std::floor(seconds) ? 0 : 1) << seconds;
+    return text.str() + " s";
+}
+
+}  // namespace
 
 void Printer::line(const std::string& text) {
     const std::lock_guard lock(mutex_);
@@ -44,6 +80,8 @@ std::pair<long, long> FileWatch::stamp() const {
 
 LiveSession::LiveSession(const LiveOptions& options)
     : file_(options.scenario),
+      speed_(options.speed),
+      strict_(options.strict),
       session_(
           chosenManager(readScenario(options.scenario), options.manager),
           [&](Broker& broker) {
@@ -65,31 +103,90 @@ Inventory LiveSession::ask() {
     return collectInventory(client, names, kServedNamespace);
 }
 
-template <typename Change>
-void LiveSession::change(Change makeChange) {
+double LiveSession::arrayTime() const {
+    using Seconds = std::chrono::duration<double>;
+    return begin_ ? Seconds(std::chrono::steady_clock::now() - *begin_).count() * speed_ : 0;
+}
+
+bool LiveSession::passTime() {
+    if (!begin_) begin_ = std::chrono::steady_clock::now();
+    bool goesOn = true;
+    for (const LiveArray::Done& done : array_->advance(arrayTime())) {
+        printer_.line("[" + timeText(done.at) + "] " + done.command);
+        if (!done.refusal.empty()) goesOn = print({true, false, done.refusal}) && goesOn;
+    }
+    return goesOn;
+}
+
+std::chrono::milliseconds LiveSession::pause(std::chrono::milliseconds longest) const {
+    const double due = array_->nextDue();
+    if (due < 0) return longest;
+    const double milliseconds = std::ceil((due - arrayTime()) / speed_ * 1000);
+    return std::chrono::milliseconds(
+        static_cast<int>(std::clamp(milliseconds, 0.0, double(longest.count()))));
+}
+
+/// Prints a result. False when it ends the session.
+bool LiveSession::print(const CommandResult& result) {
+    if (!result.text.empty()) printer_.line(result.refused ? "? " + result.text : result.text);
+    failed_ = failed_ || (result.refused && strict_);
+    return !result.quits && !failed_;
+}
+
+void LiveSession::takeNewFile() {
+    if (!file_.changed()) return;
     try {
-        makeChange();
+        array_->reload();
     } catch (const ScenarioError& error) {
         printer_.line(std::string("? ") + error.what());
     }
 }
 
-void LiveSession::takeNewFile() {
-    if (file_.changed()) change([this] { array_->reload(); });
+/// The commands that change the array.
+CommandResult LiveSession::change(const std::string& line) {
+    const auto words = commandWords(line);
+    const std::string& verb = words.at(0).text;
+    if (verb == "save") {
+        if (words.size() != 2) refuseCommand("save takes one file");
+        array_->save(words[1].text);
+    } else if (verb == "reset") {
+        array_->reset();
+    } else {
+        array_->apply(line);
+    }
+    return {};
+}
+
+CommandResult LiveSession::carryOut(const std::string& line) {
+    try {
+        const auto words = commandWords(line);
+        if (words.empty() || line[0] == '#') return {};
+        const std::string& verb = words[0].text;
+        if (words.size() == 1) {
+            if (verb == "quit") return {false, true, ""};
+            if (verb == "show") return {false, false, tree()};
+            if (verb == "help") return {false, false, commandHelpText()};
+        }
+        if (verb == "wait") refuseCommand("wait is for commands on standard input");
+        printer_.line("> " + line);
+        return change(line);
+    } catch (const ScenarioError& error) {
+        return {true, false, error.what()};
+    }
 }
 
 bool LiveSession::execute(const std::string& line) {
-    if (line == "quit") return false;
-    if (line.empty() || line[0] == '#') return true;
-    if (line == "show") {
-        show();
-    } else if (line.starts_with("wait ")) {
-        wait(std::atoi(line.c_str() + 5));
-    } else {
-        printer_.line("> " + line);
-        change([&] { array_->apply(line); });
+    try {
+        const auto words = commandWords(line);
+        if (!words.empty() && words[0].text == "wait") {
+            if (words.size() != 2) refuseCommand("wait takes a number of seconds");
+            wait(secondsOf(words[1]));
+            return true;
+        }
+    } catch (const ScenarioError& error) {
+        return print({true, false, error.what()});
     }
-    return true;
+    return print(carryOut(line));
 }
 
 }  // namespace testbed

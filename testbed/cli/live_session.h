@@ -2,12 +2,14 @@
 // its scenario file.
 #pragma once
 
+#include <chrono>
 #include <memory>
 #include <mutex>
 #include <optional>
 #include <string>
 #include <utility>
 
+#include "control_socket.h"
 #include "inventory.h"
 #include "live_array.h"
 #include "polling_interval.h"
@@ -29,6 +31,8 @@ struct LiveOptions {
     std::string manager;  ///< in place of the scenario's; "": that one
     std::string provider = "PlexorProvider";
     std::optional<unsigned> intervalSeconds;  ///< of the provider's polling; its own without
+    double speed = 1;                         ///< seconds of the scenario in a second
+    bool strict = false;                      ///< a refused command ends the session
 };
 
 /// The options that every live command takes. `options` must live until the command runs.
@@ -67,26 +71,42 @@ protected:
 
     /// What the provider answers for all its classes now.
     Inventory ask();
-    /// Carries out a command. False when it ends the session.
+    /// Carries out a command of the input and prints what comes of it. False when it ends the
+    /// session.
     bool execute(const std::string& line);
+    /// Carries out a command of somebody who gets the result.
+    CommandResult carryOut(const std::string& line);
     /// Takes the scenario file when it has been written anew.
     void takeNewFile();
+    /// Carries out what the array's time has come for; the first call begins it. False when that
+    /// ends the session.
+    bool passTime();
+    /// How long nothing is to be done for passTime, `longest` at most.
+    std::chrono::milliseconds pause(std::chrono::milliseconds longest) const;
+    /// Whether a refused command has ended the session.
+    bool hasFailed() const { return failed_; }
 
     ProviderSession& session() { return session_; }
     Printer& printer() { return printer_; }
 
-    /// The commands whose effect is not the array's.
-    virtual void show() = 0;
+    /// The tree as last seen.
+    virtual std::string tree() = 0;
+    /// Takes no command of the input for that long.
     virtual void wait(int seconds) = 0;
 
 private:
-    template <typename Change>
-    void change(Change makeChange);
+    CommandResult change(const std::string& line);
+    bool print(const CommandResult& result);
+    double arrayTime() const;
 
     Printer printer_;
     std::optional<PollingInterval> polling_;
     FileWatch file_;
     std::unique_ptr<LiveArray> array_;
+    double speed_;
+    bool strict_;
+    bool failed_ = false;
+    std::optional<std::chrono::steady_clock::time_point> begin_;  // of the array's time
     ProviderSession session_;
 };
 

@@ -7,8 +7,10 @@
 #include "command_ask.h"
 #include "command_calls.h"
 #include "command_managers.h"
+#include "command_scenarios.h"
 #include "command_serve.h"
 #include "command_show.h"
+#include "command_tell.h"
 #include "command_watch.h"
 
 namespace {
@@ -27,6 +29,8 @@ int main(int argc, char** argv) {
     testbed::addAskCommand(app, status);
     testbed::addServeCommand(app, status);
     testbed::addManagersCommand(app, status);
+    testbed::addTellCommand(app, status);
+    testbed::addScenariosCommand(app, status);
     try {
         app.parse(argc, argv);
     } catch (const CLI::ParseError& error) {

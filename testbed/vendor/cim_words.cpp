@@ -75,32 +75,54 @@ constexpr CodeWord kSoftwareClassification[] = {
     {0, "unknown"}, {1, "other"}, {2, "driver"}, {10, "firmware"}, {11, "bios"}, {13, "package"},
 };
 
+// Beside the vendor's own words stand those that the tree and the check print.
+
 // word, OperationalStatus, ExtentStatus, unassigned
 constexpr StateWord kDriveStates[] = {
-    {"online", 2, 2, false},   {"hot spare", 2, 13, true},        {"failed", 6, 3, false},
-    {"rebuild", 2, 11, false}, {"unconfigured good", 2, 2, true}, {"unconfigured bad", 6, 2, true},
-    {"offline", 12, 2, false}, {"dormant", 15, 2, true},
+    {"online", 2, 2, false},
+    {"hot spare", 2, 13, true},
+    {"failed", 6, 3, false},
+    {"rebuild", 2, 11, false},
+    {"rebuilding", 2, 11, false},
+    {"copy back", 2, 11, false},
+    {"unconfigured good", 2, 2, true},
+    {"unconfigured bad", 6, 2, true},
+    {"offline", 12, 2, false},
+    {"dormant", 15, 2, true},
+    {"predictive failure", 5, 2, false},
+    {"foreign", 1, 2, true},
+    {"undefined", 0, 1, false},
 };
 
 // word, OperationalStatus, ExtentStatus
 constexpr StateWord kVolumeStates[] = {
-    {"optimal", 2, 2, false},
-    {"degraded", 3, 6, false},
-    {"rebuilding", 3, 11, false},
-    {"offline", 6, 3, false},
+    {"optimal", 2, 2, false}, {"degraded", 3, 6, false},  {"rebuilding", 3, 11, false},
+    {"offline", 6, 3, false}, {"undefined", 0, 1, false},
 };
 
 // word, OperationalStatus, BatteryStatus
 constexpr StateWord kBatteryStates[] = {
-    {"optimal", 2, 3, false}, {"charging", 2, 6, false}, {"learning", 2, 12, false},
-    {"weak", 3, 4, false},    {"dead", 6, 5, false},     {"missing", 12, 2, false},
+    {"optimal", 2, 3, false},
+    {"charging", 2, 6, false},
+    {"charging and low", 2, 8, false},
+    {"charging and critical", 3, 9, false},
+    {"partially charged", 2, 11, false},
+    {"learning", 2, 12, false},
+    {"weak", 3, 4, false},
+    {"low", 3, 4, false},
+    {"overcharged", 3, 13, false},
+    {"dead", 6, 5, false},
+    {"critical", 6, 5, false},
+    {"missing", 12, 2, false},
+    {"no contact", 12, 2, false},
+    {"undefined", 0, 2, false},
 };
 
+// word, OperationalStatus
 constexpr StateWord kPortStates[] = {
-    {"up", 2, 0, false},
-    {"down", 12, 0, false},
-    {"failed", 6, 0, false},
-    {"dormant", 15, 0, false},
+    {"up", 2, 0, false},       {"down", 12, 0, false},     {"no contact", 12, 0, false},
+    {"failed", 6, 0, false},   {"error", 6, 0, false},     {"degraded", 3, 0, false},
+    {"dormant", 15, 0, false}, {"undefined", 0, 0, false},
 };
 
 constexpr RaidLevel kRaidLevels[] = {
@@ -183,10 +205,20 @@ std::string listOf(StateWords states) {
     return joinWords(states);
 }
 
+RaidLevels raidLevels() {
+    return kRaidLevels;
+}
+
 const RaidLevel* findRaidLevel(std::string_view name) {
+    std::string letters(name);
+    std::erase_if(letters, [](char c) { return c == ' ' || c == '-'; });
     for (const RaidLevel& row : kRaidLevels)
-        if (sameName(row.name, name)) return &row;
+        if (sameName(row.word, letters)) return &row;
     return nullptr;
+}
+
+std::string listOf(RaidLevels levels) {
+    return joinWords(levels);
 }
 
 }  // namespace testbed

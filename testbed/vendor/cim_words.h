@@ -54,12 +54,17 @@ std::string listOf(StateWords states);
 
 /// The redundancies that belong to a RAID level.
 struct RaidLevel {
-    const char* name;
+    const char* word;
     std::uint16_t dataRedundancy;
     std::uint16_t packageRedundancy;
 };
 
-/// NULL for a level that is not in the table.
+using RaidLevels = std::span<const RaidLevel>;
+
+RaidLevels raidLevels();
+
+/// NULL for a level that is not in the table; letter case, blanks and hyphens do not matter.
 const RaidLevel* findRaidLevel(std::string_view name);
+std::string listOf(RaidLevels levels);
 
 }  // namespace testbed

@@ -39,8 +39,7 @@ void readDriveState(JsonReader& reader, DriveDescription& drive) {
     const StateWord* state = reader.state("state", driveStates());
     if (!state) state = findState(driveStates(), "online");
     drive.primordial = reader.flag("primordial", state->primordial);
-    drive.operationalStatus =
-        reader.code("operationalStatus", operationalStatusWords(), state->operationalStatus);
+    drive.operationalStatus = readStatus(reader, state->operationalStatus);
     drive.extentStatus = reader.code("extentStatus", extentStatusWords(), state->detail);
     drive.enabledState = reader.code("enabledState", enabledStateWords(), 2);
 }
@@ -57,11 +56,24 @@ void readDriveLocation(JsonReader& reader, const ControllerDescription& controll
     drive.noMedia = reader.flag("noMedia");
 }
 
+/// NULL without the member.
+const RaidLevel* readRaidLevel(JsonReader& reader) {
+    const auto word = reader.optionalText("raid");
+    if (!word) return nullptr;
+    const RaidLevel* level = findRaidLevel(*word);
+    if (!level)
+        reader.place().fail(
+            "unknown RAID level \"" + *word + "\" (known: " + listOf(raidLevels()) + ")", "raid");
+    return level;
+}
+
 }  // namespace
 
-std::uint16_t readStatus(JsonReader& reader) {
-    const std::uint16_t status = reader.code("status", operationalStatusWords(), 2);
-    return reader.number16("operationalStatus", status);
+std::uint16_t readStatus(JsonReader& reader, std::uint16_t absent) {
+    if (reader.has("status") && reader.has("operationalStatus"))
+        reader.fail("\"status\" and \"operationalStatus\" are the same");
+    const std::uint16_t status = reader.code("status", operationalStatusWords(), absent);
+    return reader.code("operationalStatus", operationalStatusWords(), status);
 }
 
 PoolDescription readPool(const JsonPlace& place, const ControllerDescription&) {
@@ -69,6 +81,7 @@ PoolDescription readPool(const JsonPlace& place, const ControllerDescription&) {
     PoolDescription pool;
     pool.id = reader.text("id");
     pool.primordial = reader.flag("primordial");
+    pool.members = reader.texts("members");
     pool.total = readBytes(reader, "total");
     pool.remaining = readBytes(reader, "remaining");
     pool.operationalStatus = readStatus(reader);
@@ -105,6 +118,9 @@ DriveDescription readDrive(const JsonPlace& place, const ControllerDescription& 
     drive.firmware = reader.optionalText("firmware");
     drive.blocks = readBlocks(reader, "capacity", 0);
     drive.consumableBlocks = readBlocks(reader, "consumable", drive.blocks);
+    drive.spareFor = reader.text("spareFor", "");
+    if (const StateWord* before = reader.state("before", driveStates()))
+        drive.before = before->word;
     readTweaks(reader, drive, "CIM_DiskDrive",
                {{"extent", "CIM_StorageExtent"},
                 {"package", "CIM_PhysicalPackage"},
@@ -119,15 +135,14 @@ VolumeDescription readVolume(const JsonPlace& place, const ControllerDescription
     VolumeDescription volume;
     volume.id = reader.text("id");
     volume.name = reader.text("name", "");
-    volume.raidLevel = reader.optionalText("raid");
-    const RaidLevel* level = volume.raidLevel ? findRaidLevel(*volume.raidLevel) : nullptr;
+    const RaidLevel* level = readRaidLevel(reader);
+    if (level) volume.raidLevel = level->word;
     volume.dataRedundancy = reader.number16("dataRedundancy", level ? level->dataRedundancy : 1);
     volume.packageRedundancy =
         reader.number16("packageRedundancy", level ? level->packageRedundancy : 0);
     const StateWord* state = reader.state("state", volumeStates());
     if (!state) state = findState(volumeStates(), "optimal");
-    volume.operationalStatus =
-        reader.code("operationalStatus", operationalStatusWords(), state->operationalStatus);
+    volume.operationalStatus = readStatus(reader, state->operationalStatus);
     volume.extentStatus = reader.code("extentStatus", extentStatusWords(), state->detail);
     volume.primordial = reader.flag("primordial");
     volume.pools = readPools(reader, controller, false);
@@ -153,8 +168,7 @@ PortDescription readPort(const JsonPlace& place, const ControllerDescription&) {
     port.portType = reader.code("type", portTypeWords(), 94);
     port.usageRestriction = reader.code("usage", usageRestrictionWords(), 3);
     const StateWord* state = reader.state("state", portStates());
-    port.operationalStatus = reader.code("operationalStatus", operationalStatusWords(),
-                                         state ? state->operationalStatus : 2);
+    port.operationalStatus = readStatus(reader, state ? state->operationalStatus : 2);
     readTweaks(reader, port, "CIM_SASSATAPort");
     reader.finish();
     return port;
@@ -166,8 +180,7 @@ BatteryDescription readBattery(const JsonPlace& place, const ControllerDescripti
     battery.id = reader.text("id");
     const StateWord* state = reader.state("state", batteryStates());
     if (!state) state = findState(batteryStates(), "optimal");
-    battery.operationalStatus =
-        reader.code("operationalStatus", operationalStatusWords(), state->operationalStatus);
+    battery.operationalStatus = readStatus(reader, state->operationalStatus);
     battery.batteryStatus = reader.code("batteryStatus", batteryStatusWords(), state->detail);
     readTweaks(reader, battery, "CIM_Battery");
     reader.finish();

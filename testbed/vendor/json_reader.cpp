@@ -6,16 +6,39 @@ namespace testbed {
 
 using nlohmann::json;
 
-void JsonPlace::fail(const std::string& what) const {
-    throw ScenarioError(file + ": " + (place.empty() ? what : place + ": " + what));
+namespace {
+
+/// Digits, as repetitions and commands produce them where a number is meant.
+bool isNumber(const std::string& text) {
+    return !text.empty() && text.find_first_not_of("0123456789") == std::string::npos;
+}
+
+}  // namespace
+
+std::string idOf(const json& element) {
+    if (!element.is_object()) return "";
+    for (const char* name : {"id", "number", "tag"}) {
+        const auto member = element.find(name);
+        if (member == element.end()) continue;
+        return member->is_string() ? member->get<std::string>() : member->dump();
+    }
+    return "";
+}
+
+void JsonPlace::fail(const std::string& what, const std::string& about) const {
+    const std::string inner = place.empty() || about.empty() ? about : "." + about;
+    throw PlacedError(file + ": " + (place.empty() ? what : place + ": " + what), place + inner);
 }
 
 JsonPlace JsonPlace::member(const std::string& name) const {
-    return {&value->at(name), file, place.empty() ? name : place + "." + name};
+    return {&value->at(name), file, place.empty() ? name : place + "." + name, names, kept};
 }
 
 JsonPlace JsonPlace::element(std::size_t index) const {
-    return {&value->at(index), file, place + "[" + std::to_string(index) + "]"};
+    const json& child = value->at(index);
+    const std::string id = names == ElementNames::Ids ? idOf(child) : "";
+    return {&child, file, place + "[" + (id.empty() ? std::to_string(index) : id) + "]", names,
+            kept};
 }
 
 std::string readText(const JsonPlace& place) {
@@ -107,9 +130,10 @@ std::vector<std::string> JsonReader::texts(const std::string& name) {
 std::uint16_t JsonReader::code(const std::string& name, CodeWords words, std::uint16_t absent) {
     const auto member = take(name);
     if (!member) return absent;
-    if (!member->value->is_string())
+    const bool isWord = member->value->is_string();
+    const std::string word = isWord ? member->value->get<std::string>() : "";
+    if (!isWord || isNumber(word))
         return static_cast<std::uint16_t>(readNumber(*member, UINT16_MAX));
-    const std::string word = member->value->get<std::string>();
     const auto code = codeOf(words, word);
     if (!code) member->fail("unknown word \"" + word + "\" (known: " + listOf(words) + ")");
     return *code;
@@ -120,7 +144,8 @@ const StateWord* JsonReader::state(const std::string& name, StateWords states) {
     if (!member) return nullptr;
     const std::string word = readText(*member);
     const StateWord* state = findState(states, word);
-    if (!state) fail("unknown " + name + " \"" + word + "\" (known: " + listOf(states) + ")");
+    if (!state)
+        place_.fail("unknown " + name + " \"" + word + "\" (known: " + listOf(states) + ")", name);
     return state;
 }
 
@@ -129,13 +154,15 @@ std::vector<JsonPlace> JsonReader::list(const std::string& name) {
     if (!member) return {};
     if (!member->value->is_array()) member->fail("a list is needed here");
     std::vector<JsonPlace> elements;
-    for (std::size_t i = 0; i < member->value->size(); ++i) elements.push_back(member->element(i));
+    for (std::size_t i = 0; i < member->value->size(); ++i)
+        for (JsonPlace& element : repetitionsOf(member->element(i)))
+            elements.push_back(std::move(element));
     return elements;
 }
 
 void JsonReader::finish() const {
     for (const auto& [name, value] : place_.value->items())
-        if (!known_.contains(name)) fail("unknown member \"" + name + "\"");
+        if (!known_.contains(name)) place_.fail("unknown member \"" + name + "\"", name);
 }
 
 }  // namespace testbed

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <memory>
 #include <nlohmann/json.hpp>
 #include <optional>
 #include <set>
@@ -14,14 +15,31 @@
 
 namespace testbed {
 
+/// A ScenarioError that knows the place, for those who can tell its line.
+struct PlacedError : ScenarioError {
+    PlacedError(const std::string& text, std::string where)
+        : ScenarioError(text), place(std::move(where)) {}
+    std::string place;
+};
+
+/// How a place names the elements of lists: by their number, or, in a document that no file has, by
+/// their id.
+enum class ElementNames { Numbers, Ids };
+
+/// The id of a list's element as the scenario has it: text or number; "" without one.
+std::string idOf(const nlohmann::json& element);
+
 /// A JSON value with the place where it stands: "scenarios/x.json: controllers[0].drives[3]".
 struct JsonPlace {
     const nlohmann::json* value;
     std::string file;
     std::string place;
+    ElementNames names = ElementNames::Numbers;
+    std::shared_ptr<const nlohmann::json> kept = nullptr;  ///< keeps a value that no document has
 
-    /// Throws ScenarioError with file and place before the text.
-    [[noreturn]] void fail(const std::string& what) const;
+    /// Throws PlacedError with file and place before the text; `about` is the member that the text
+    /// is about.
+    [[noreturn]] void fail(const std::string& what, const std::string& about = "") const;
     JsonPlace member(const std::string& name) const;
     JsonPlace element(std::size_t index) const;
 };
@@ -53,7 +71,7 @@ public:
     std::uint16_t code(const std::string& name, CodeWords words, std::uint16_t absent);
     /// A state word; NULL when the member is absent.
     const StateWord* state(const std::string& name, StateWords states);
-    /// The elements of a list of objects; none when the member is absent.
+    /// The elements of a list of objects, repetitions written out; none when the member is absent.
     std::vector<JsonPlace> list(const std::string& name);
 
     /// Fails on the first member that nobody has asked for.
@@ -70,9 +88,17 @@ private:
 std::string readText(const JsonPlace& place);
 std::uint64_t readNumber(const JsonPlace& place, std::uint64_t maximum);
 
-/// Writes out the repetitions of a scenario: an element of a list that has the member "count" (and
-/// perhaps "first") stands for that many elements, in whose texts "{n}" is the running number.
-/// `place` is where `document` stands, for errors.
-void expandRepetitions(nlohmann::json& document, const JsonPlace& place);
+// Repetitions: an element of a list that has the member "count" (and perhaps "first") stands for
+// that many elements, in whose texts "{n}" is the running number. An inner repetition has its own
+// number.
+
+/// What an element of a list stands for; they keep its place.
+std::vector<JsonPlace> repetitionsOf(const JsonPlace& element);
+
+/// Fails when the document with all repetitions written out would be too large.
+void limitRepetitions(const JsonPlace& document);
+
+/// Writes out all repetitions of a document that can be read.
+void expandRepetitions(nlohmann::json& document);
 
 }  // namespace testbed

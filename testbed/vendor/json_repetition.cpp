@@ -1,3 +1,5 @@
+#include <algorithm>
+
 #include "json_reader.h"
 
 namespace testbed {
@@ -6,6 +8,11 @@ namespace {
 using nlohmann::json;
 
 constexpr std::uint64_t kMostRepetitions = 100000;
+constexpr std::uint64_t kMostElements = 1000000;
+
+bool isRepeated(const json& element) {
+    return element.is_object() && element.contains("count");
+}
 
 void replaceNumber(std::string& text, const std::string& number) {
     static const std::string mark = "{n}";
@@ -17,45 +24,64 @@ void replaceNumber(json& value, const std::string& number) {
     if (value.is_string()) {
         replaceNumber(value.get_ref<std::string&>(), number);
     } else if (value.is_structured()) {
-        for (json& child : value) replaceNumber(child, number);
+        for (json& child : value)
+            if (!value.is_array() || !isRepeated(child)) replaceNumber(child, number);
     }
 }
 
-void appendRepetitions(json& list, json element, const JsonPlace& place) {
-    const std::uint64_t count = readNumber(place.member("count"), kMostRepetitions);
-    const std::uint64_t first =
-        element.contains("first") ? readNumber(place.member("first"), UINT32_MAX) : 0;
-    element.erase("count");
-    element.erase("first");
-    for (std::uint64_t n = first; n < first + count; ++n) {
-        json copy = element;
-        replaceNumber(copy, std::to_string(n));
-        list.push_back(std::move(copy));
-    }
-}
-
-json expandedList(const json& list, const JsonPlace& place) {
-    json expanded = json::array();
-    for (std::size_t i = 0; i < list.size(); ++i) {
-        if (list[i].is_object() && list[i].contains("count"))
-            appendRepetitions(expanded, list[i], place.element(i));
-        else
-            expanded.push_back(list[i]);
-    }
-    return expanded;
+/// The elements of all lists within, at most one more than allowed.
+std::uint64_t countElements(const JsonPlace& place) {
+    const json& value = *place.value;
+    std::uint64_t sum = 0;
+    if (value.is_object())
+        for (const auto& [name, child] : value.items()) sum += countElements(place.member(name));
+    if (value.is_array())
+        for (std::size_t i = 0; i < value.size(); ++i) {
+            const JsonPlace element = place.element(i);
+            const std::uint64_t times =
+                isRepeated(value[i]) ? readNumber(element.member("count"), kMostRepetitions) : 1;
+            sum += times * (1 + countElements(element));
+        }
+    return std::min(sum, kMostElements + 1);
 }
 
 }  // namespace
 
-void expandRepetitions(json& document, const JsonPlace& place) {
+std::vector<JsonPlace> repetitionsOf(const JsonPlace& element) {
+    if (!isRepeated(*element.value)) return {element};
+    const std::uint64_t count = readNumber(element.member("count"), kMostRepetitions);
+    const std::uint64_t first =
+        element.value->contains("first") ? readNumber(element.member("first"), UINT32_MAX) : 0;
+    json pattern = *element.value;
+    pattern.erase("count");
+    pattern.erase("first");
+    std::vector<JsonPlace> places;
+    for (std::uint64_t n = first; n < first + count; ++n) {
+        json copy = pattern;
+        replaceNumber(copy, std::to_string(n));
+        JsonPlace place = element;
+        place.kept = std::make_shared<const json>(std::move(copy));
+        place.value = place.kept.get();
+        places.push_back(std::move(place));
+    }
+    return places;
+}
+
+void limitRepetitions(const JsonPlace& document) {
+    if (countElements(document) > kMostElements)
+        document.fail("more than " + std::to_string(kMostElements) + " elements with all counts");
+}
+
+void expandRepetitions(json& document) {
     if (!document.is_structured()) return;
-    const auto placeOf = [&](auto& item) {
-        return document.is_array() ? place.element(std::stoul(item.key()))
-                                   : place.member(item.key());
-    };
-    // Inner lists first: an outer repetition then numbers what they have become.
-    for (auto& item : document.items()) expandRepetitions(item.value(), placeOf(item));
-    if (document.is_array()) document = expandedList(document, place);
+    if (document.is_array()) {
+        json expanded = json::array();
+        for (json& element : document)
+            for (JsonPlace& place : repetitionsOf({&element, "", ""}))
+                expanded.push_back(*place.value);
+        document = std::move(expanded);
+    }
+    for (json& child : document) expandRepetitions(child);
 }
 
 }  // namespace testbed

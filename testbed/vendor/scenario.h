@@ -63,6 +63,7 @@ struct SoftwareDescription : Described {
 /// Capacities in bytes.
 struct PoolDescription : Described {
     bool primordial = false;
+    std::vector<std::string> members;  ///< drives in their places; empty: those that name the pool
     std::uint64_t total = 0;
     std::uint64_t remaining = 0;
     std::uint16_t operationalStatus = 0;
@@ -90,6 +91,8 @@ struct DriveDescription : Described {
     bool primordial = false;
     bool noMedia = false;    ///< no extent behind the drive
     bool noPackage = false;  ///< no physical package, hence no slot and no enclosure either
+    std::string spareFor;    ///< a former hot spare: the drive in whose place it is
+    std::string before;      ///< in a lost enclosure: the state to which it returns
 };
 
 /// Capacities in blocks of 512 bytes.
@@ -155,6 +158,21 @@ struct LatencyRange {
     std::chrono::milliseconds maximum{0};
 };
 
+/// How long what follows from a change takes, in seconds of the scenario's time.
+struct Consequences {
+    bool enabled = true;
+    std::uint32_t rebuild = 60;   ///< until a drive has been rebuilt
+    std::uint32_t copyBack = 60;  ///< until a replaced drive has its data back from the spare
+    std::uint32_t learn = 60;     ///< until a learning battery begins to charge
+    std::uint32_t charge = 60;    ///< each of the steps low, charging
+};
+
+/// A command at its time.
+struct TimedCommand {
+    double at = 0;  ///< seconds of the scenario's time
+    std::string command;
+};
+
 struct Scenario {
     std::string description;
     HostDescription host;
@@ -165,6 +183,8 @@ struct Scenario {
     LatencyRange latency;
     std::optional<std::uint32_t> shuffle;  ///< seed of the order of association results
     BrokerOptions manager;
+    Consequences consequences;
+    std::vector<TimedCommand> timeline;
 
     /// NULL when there is no such controller.
     const ControllerDescription* findController(const std::string& id) const;

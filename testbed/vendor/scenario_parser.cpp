@@ -5,6 +5,7 @@
 #include <fstream>
 #include <sstream>
 
+#include "json_document.h"
 #include "manager_kinds.h"
 #include "scenario_reading.h"
 
@@ -161,8 +162,10 @@ BrokerOptions readManager(JsonReader& scenario) {
 }
 
 Scenario readDocument(const JsonPlace& place) {
+    limitRepetitions(place);
     JsonReader reader(place);
     Scenario scenario;
+    reader.take("$schema");  // for editors
     scenario.description = reader.text("description", "");
     scenario.host = readHost(reader);
     scenario.vendor = readVendor(reader);
@@ -174,47 +177,51 @@ Scenario readDocument(const JsonPlace& place) {
     if (const auto seed = reader.number("shuffle", UINT32_MAX))
         scenario.shuffle = static_cast<std::uint32_t>(*seed);
     scenario.manager = readManager(reader);
+    scenario.consequences = readConsequences(reader);
+    scenario.timeline = readTimeline(reader);
     reader.finish();
+    if (!reader.has("controllers")) reader.fail("\"controllers\" is missing");
     return scenario;
 }
 
-/// "line 3, column 7" of a position that counts from one.
-std::string lineAndColumn(const std::string& text, std::size_t byte) {
-    std::size_t line = 1, column = 1;
-    for (std::size_t i = 0; i + 1 < byte && i < text.size(); ++i) {
-        column = text[i] == '\n' ? 1 : column + 1;
-        if (text[i] == '\n') ++line;
-    }
-    return "line " + std::to_string(line) + ", column " + std::to_string(column);
+std::string contentOf(const std::string& file) {
+    std::ifstream stream(file, std::ios::binary);
+    if (!stream) throw ScenarioError(file + ": " + std::strerror(errno));
+    std::stringstream text;
+    errno = 0;
+    if (stream.peek() != EOF) text << stream.rdbuf();
+    if (errno != 0) throw ScenarioError(file + ": " + std::strerror(errno));
+    return text.str();
 }
 
-json parseDocument(const std::string& text, const std::string& name) {
-    json document;
+/// The document of a file, which can be read as a scenario; errors tell the line.
+json readableDocument(const std::string& file) {
+    const std::string text = contentOf(file);
+    const json document = parseJson(text, file);
     try {
-        document = json::parse(text);
-    } catch (const json::parse_error& error) {
-        throw ScenarioError(name + ": " + lineAndColumn(text, error.byte) + ": not valid JSON");
+        readDocument({&document, file, ""});
+    } catch (const PlacedError& error) {
+        throw ScenarioError(error.what() + (" (line " + std::to_string(lineOf(text, error.place))) +
+                            ")");
     }
-    expandRepetitions(document, {&document, name, ""});
     return document;
 }
 
 }  // namespace
 
 Scenario scenarioOf(const json& document, const std::string& name) {
-    return readDocument({&document, name, ""});
+    return readDocument({&document, name, "", ElementNames::Ids});
 }
 
 Scenario parseScenario(const std::string& text, const std::string& name) {
-    return scenarioOf(parseDocument(text, name), name);
+    const json document = parseJson(text, name);
+    return readDocument({&document, name, ""});
 }
 
 json readScenarioDocument(const std::string& file) {
-    std::ifstream stream(file, std::ios::binary);
-    std::stringstream text;
-    if (stream) text << stream.rdbuf();
-    if (!stream || !text) throw ScenarioError(file + ": " + std::strerror(errno));
-    return parseDocument(text.str(), file);
+    json document = readableDocument(file);
+    expandRepetitions(document);
+    return document;
 }
 
 Scenario readScenario(const std::string& file) {

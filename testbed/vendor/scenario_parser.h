@@ -12,10 +12,11 @@ namespace testbed {
 Scenario readScenario(const std::string& file);
 
 /// The scenario file as JSON, repetitions written out, for those who change it while the array
-/// runs. Throws ScenarioError.
+/// runs. It can be read as a scenario. Throws ScenarioError.
 nlohmann::json readScenarioDocument(const std::string& file);
 
-/// A document of readScenarioDocument as a scenario; `name` stands for the file in error messages.
+/// A document of readScenarioDocument, perhaps changed, as a scenario. Errors name its elements by
+/// their ids; `name` stands before them.
 Scenario scenarioOf(const nlohmann::json& document, const std::string& name);
 
 /// The same for a text; `name` stands for the file in error messages.

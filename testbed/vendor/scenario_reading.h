@@ -19,8 +19,8 @@ struct PartName {
 void readTweaks(JsonReader& reader, Described& described, const char* cimClass,
                 std::initializer_list<PartName> parts = {});
 
-/// Reads "status" (a word) or "operationalStatus" (a number) of an object without finer states.
-std::uint16_t readStatus(JsonReader& reader);
+/// Reads "status" or "operationalStatus", which mean the same: a word or a number.
+std::uint16_t readStatus(JsonReader& reader, std::uint16_t absent = 2);
 
 /// Reads the list `name` of a controller with one of the functions below; ids must differ.
 template <typename Description>
@@ -51,5 +51,10 @@ OtherDescription readOther(const JsonPlace& place, const ControllerDescription& 
 std::vector<SoftwareDescription> readSoftware(JsonReader& reader);
 
 FaultRule readFault(const JsonPlace& place);
+
+/// "consequences": true, false, or an object with the times.
+Consequences readConsequences(JsonReader& scenario);
+/// "timeline": commands with their times, in the order of time.
+std::vector<TimedCommand> readTimeline(JsonReader& scenario);
 
 }  // namespace testbed

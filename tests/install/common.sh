@@ -19,10 +19,11 @@ expected_files() {
     echo "755 usr/sbin/plexor-register"
     echo "644 usr/$libdir/cmpi/libPlexorProvider.so"
     echo "644 usr/$libdir/plexor-testbed/libplexor-manager-flush.so"
-    for file in copyright messages.md operating.md; do
+    for file in copyright messages.md operating.md scenarios.md; do
         echo "644 usr/share/doc/$package/$file"
     done
     echo "644 usr/share/man/man1/plexor-testbed.1"
+    echo "644 usr/share/man/man5/plexor-scenario.5"
     echo "644 usr/share/man/man7/plexor-provider.7"
     echo "644 usr/share/man/man8/plexor-register.8"
     for file in "$source"/cim/schema/*.mof; do
@@ -31,6 +32,7 @@ expected_files() {
     for file in PlexorProvider.plain PlexorProvider.section PlexorProviderModule.mof; do
         echo "644 usr/share/plexor-provider/registration/$file"
     done
+    echo "644 usr/share/plexor-testbed/scenario.schema.json"
     for file in "$source"/scenarios/*.json; do
         echo "644 usr/share/plexor-testbed/scenarios/$(basename "$file")"
     done

@@ -7,7 +7,7 @@ source "$(dirname "$0")/common.sh"
 
 manuals=$1/docs/man register=$1/scripts/plexor-register tool=$2
 
-for page in "$manuals"/*.[178]; do
+for page in "$manuals"/*.[1578]; do
     warnings=$(LC_ALL=C.UTF-8 MANWIDTH=80 man -l --warnings=w "$page" 2>&1 >/dev/null) || true
     [ -z "$warnings" ] || fail "$page: $warnings"
     text=$(LC_ALL=C.UTF-8 MANWIDTH=80 man -l "$page" 2>/dev/null)

@@ -129,7 +129,9 @@ TEST_P(ScenarioAnswers, AreThoseWorkedOutByHand) {
 }
 
 const std::vector<Run> kOrdered = {
-    {"healthy-array"}, {"degraded-array"}, {"two-controllers"}, {"no-pools"}, {"many-drives"}};
+    {"healthy-array"},  {"degraded-array"},     {"two-controllers"},    {"no-pools"},
+    {"many-drives"},    {"predictive-failure"}, {"raid6-double-fault"}, {"foreign-drives"},
+    {"enclosure-lost"}, {"battery-learning"},   {"spare-rebuild"},      {"four-enclosures"}};
 
 INSTANTIATE_TEST_SUITE_P(Ordered, ScenarioAnswers, ::testing::ValuesIn(kOrdered));
 

@@ -6,7 +6,7 @@ namespace {
 using ProfileGraph = VendorTest;
 
 TEST_F(ProfileGraph, HostIsOneComputerSystem) {
-    build(R"({"host": {"name": "uuid-1", "elementName": "host-1"}})");
+    build(R"({"host": {"name": "uuid-1", "elementName": "host-1"}, "controllers": []})");
     const auto hosts = repository.enumerate("root/cimv2", "OMC_UnitaryComputerSystem");
     ASSERT_EQ(hosts.size(), 1u);
     EXPECT_EQ(valueOf(hosts[0], "Name"), "uuid-1");
@@ -16,7 +16,7 @@ TEST_F(ProfileGraph, HostIsOneComputerSystem) {
 }
 
 TEST_F(ProfileGraph, HostCanBeAbsent) {
-    build(R"({"host": {"absent": true}})");
+    build(R"({"host": {"absent": true}, "controllers": []})");
     EXPECT_TRUE(repository.hasClass("root/cimv2", "OMC_UnitaryComputerSystem"));
     EXPECT_TRUE(repository.enumerate("root/cimv2", "OMC_UnitaryComputerSystem").empty());
 }

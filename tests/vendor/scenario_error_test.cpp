@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <filesystem>
+#include <fstream>
 #include <string>
 
 #include "scenario_parser.h"
@@ -22,7 +24,57 @@ std::string errorIn(const std::string& controllerMembers) {
 
 TEST(ScenarioError, BrokenJsonNamesLineAndColumn) {
     EXPECT_EQ(errorOf("{\n  \"host\": oops}"), "x.json: line 2, column 11: not valid JSON");
-    EXPECT_EQ(errorOf(""), "x.json: line 1, column 1: not valid JSON");
+    EXPECT_EQ(errorOf("{\"host\": {},\n\n  \"a\": 1"), "x.json: line 3, column 8: not valid JSON");
+    EXPECT_EQ(errorOf(""), "x.json: the file is empty");
+    EXPECT_EQ(errorOf("{}"), "x.json: \"controllers\" is missing");
+    EXPECT_EQ(errorOf("[]"), "x.json: an object is needed here");
+}
+
+TEST(ScenarioError, SecondMembersAreRefused) {
+    EXPECT_EQ(errorOf("{\"controllers\": [],\n \"controllers\": []}"),
+              "x.json: line 2, column 14: second member \"controllers\"");
+    EXPECT_NE(errorIn(R"("drives": [{"id": "a", "id": "b"}])").find("second member \"id\""),
+              std::string::npos);
+}
+
+TEST(ScenarioError, NestingAndNumbersHaveLimits) {
+    const std::string deep(200000, '[');
+    EXPECT_EQ(errorOf(deep), "x.json: line 1, column 65: nested deeper than 64 levels");
+    std::string objects;
+    for (int i = 0; i < 200000; i++) objects += "{\"a\":";
+    EXPECT_NE(errorOf(objects).find("nested deeper than 64 levels"), std::string::npos);
+    EXPECT_NE(errorOf(R"({"shuffle": 1e999})").find("column 18: the number is too large"),
+              std::string::npos)
+        << errorOf(R"({"shuffle": 1e999})");
+}
+
+TEST(ScenarioError, RepetitionsOfRepetitionsHaveALimit) {
+    EXPECT_EQ(errorOf(R"({"controllers": [{"count": 100000, "id": "C{n}",
+                         "drives": [{"count": 100000, "id": "d{n}"}]}]})"),
+              "x.json: more than 1000000 elements with all counts");
+}
+
+TEST(ScenarioError, FilesTellTheLine) {
+    const std::string file = ::testing::TempDir() + "plexor-lines.json";
+    const auto errorOfFile = [&](const std::string& text) {
+        std::ofstream(file) << text;
+        try {
+            readScenario(file);
+        } catch (const ScenarioError& error) {
+            return std::string(error.what()).substr(file.size());
+        }
+        return std::string("no error");
+    };
+    EXPECT_EQ(errorOfFile("{\n\"controllers\": [\n{\"id\": \"C0\",\n\"ports\": [\n"
+                          "{\"count\": 8, \"id\": \"{n}\"},\n"
+                          "{\"id\": \"9\",\n\"usages\": 2}]}]}\n"),
+              ": controllers[0].ports[1]: unknown member \"usages\" (line 7)");
+    EXPECT_EQ(errorOfFile("{\"controllers\": [\n{\"id\": \"C0\",\n\"status\": \"well\"}]}")
+                  .find(": controllers[0].status: unknown word \"well\""),
+              0u);
+    EXPECT_EQ(errorOfFile("{\n\"host\": {}}"), ": \"controllers\" is missing (line 1)");
+    EXPECT_EQ(errorOfFile(""), ": the file is empty");
+    std::filesystem::remove(file);
 }
 
 TEST(ScenarioError, UnknownMembersAreRefusedEverywhere) {
@@ -38,7 +90,9 @@ TEST(ScenarioError, UnknownMembersAreRefusedEverywhere) {
 TEST(ScenarioError, UnknownStatesListTheKnownOnes) {
     EXPECT_EQ(errorIn(R"("drives": [{"id": "a"}, {"id": "b", "state": "foo"}])"),
               "x.json: controllers[0].drives[1]: unknown state \"foo\" (known: online, hot spare, "
-              "failed, rebuild, unconfigured good, unconfigured bad, offline, dormant)");
+              "failed, rebuild, rebuilding, copy back, unconfigured good, unconfigured bad, "
+              "offline, dormant, "
+              "predictive failure, foreign, undefined)");
     EXPECT_NE(errorIn(R"("volumes": [{"id": "a", "state": "well"}])").find("(known: optimal,"),
               std::string::npos);
     EXPECT_NE(errorIn(R"("status": "well")").find("controllers[0].status: unknown word \"well\""),
@@ -62,7 +116,7 @@ TEST(ScenarioError, IdsMustDiffer) {
     EXPECT_EQ(errorIn(R"("drives": [{"id": "d"}, {"id": "d"}])"),
               "x.json: controllers[0].drives[1]: second \"d\"");
     EXPECT_EQ(errorIn(R"("ports": [{"id": "p", "count": 2}])"),
-              "x.json: controllers[0].ports[1]: second \"p\"");
+              "x.json: controllers[0].ports[0]: second \"p\"");
     EXPECT_EQ(errorOf(R"({"controllers": [{"id": "C0"}, {"id": "C0"}]})"),
               "x.json: controllers[1]: second controller \"C0\"");
     EXPECT_EQ(errorIn(R"("drives": [{"name": "x"}])"),
@@ -123,6 +177,27 @@ TEST(ScenarioError, ManagersAreChecked) {
               0u);
     EXPECT_EQ(errorOf(R"({"manager": {"noKey": true}})"),
               "x.json: manager: unknown member \"noKey\"");
+}
+
+TEST(ScenarioError, StatusHasTwoNamesAndNoTwoValues) {
+    EXPECT_EQ(
+        errorIn(R"("drives": [{"id": "d", "status": "ok", "operationalStatus": 3}])"),
+        "x.json: controllers[0].drives[0]: \"status\" and \"operationalStatus\" are the same");
+}
+
+TEST(ScenarioError, RaidLevelsAreKnown) {
+    EXPECT_EQ(errorIn(R"("volumes": [{"id": "0", "raid": "RAID7"}])"),
+              "x.json: controllers[0].volumes[0]: unknown RAID level \"RAID7\" (known: RAID0, "
+              "RAID1, RAID5, RAID6, RAID10, RAID50, RAID60)");
+}
+
+TEST(ScenarioError, DirectoriesAreNoScenarios) {
+    try {
+        readScenario("/");
+        FAIL() << "no error";
+    } catch (const ScenarioError& error) {
+        EXPECT_STREQ(error.what(), "/: Is a directory");
+    }
 }
 
 TEST(ScenarioError, MissingFile) {

@@ -6,7 +6,7 @@ namespace testbed {
 namespace {
 
 TEST(ScenarioParser, EmptyScenarioHasAHostAndTheUsualProfiles) {
-    const Scenario scenario = parseScenario("{}", "x");
+    const Scenario scenario = parseScenario(R"({"controllers": []})", "x");
     EXPECT_EQ(scenario.host.id, "localhost.localdomain");
     EXPECT_EQ(scenario.vendor.nameSpace, "root/sample");
     EXPECT_TRUE(scenario.controllers.empty());
@@ -74,7 +74,7 @@ TEST(ScenarioParser, CapacitiesInGigabytes) {
 
 TEST(ScenarioParser, FaultsLatencyShuffleAndManager) {
     const Scenario scenario = parseScenario(
-        R"({"faults": [{"call": "associators", "assocClass": "CIM_Realizes", "resultClass": "X",
+        R"({"controllers": [], "faults": [{"call": "associators", "assocClass": "CIM_Realizes", "resultClass": "X",
             "rc": 1, "message": "no", "delayMs": 20, "times": 2, "skip": 3, "keepResult": true},
             {"call": "classPathIsA", "pathContains": "C0", "nullResult": true}],
             "latencyMs": [1, 9], "shuffle": 7, "manager": {"serialQueries": true}})",
