@@ -65,7 +65,7 @@ Answers ask(const AskOptions& options, Deadline deadline) {
     settings.deadline = deadline;
     settings.tls = options.tls;
     settings.tls.verify = !options.insecure;
-    const WbemClient client(url, settings);
+    WbemClient client(url, settings);
     Answers answers;
     try {
         for (const std::string& name : classesToAsk(options.className))

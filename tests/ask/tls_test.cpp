@@ -54,7 +54,8 @@ public:
         server->Post(".*", [this](const httplib::Request& request, httplib::Response& response) {
             asked = request;
             const std::string body =
-                cimInstances(namedInstance(kDrive, "DeviceID", "d", "d - ONLINE", 2, 5));
+                withId(cimInstances(namedInstance(kDrive, "DeviceID", "d", "d - ONLINE", 2, 5)),
+                       request.body);
             response.set_chunked_content_provider(
                 "application/xml", [body](std::size_t offset, httplib::DataSink& sink) {
                     sink.write(body.data() + offset,
@@ -142,7 +143,10 @@ TEST(Tls, FailuresAreExplained) {
     const Serving plain(std::make_unique<httplib::Server>());
     EXPECT_NE(failure(urlOf(plain, "https://"), {}).find("TLS failed"), std::string::npos);
     const std::string missing = failure(urlOf(plain, "https://"), {"/nowhere.pem", true});
-    EXPECT_EQ(missing.find("/nowhere.pem: no certificates: "), 0u) << missing;
+    EXPECT_EQ(missing, "/nowhere.pem: No such file or directory");
+    EXPECT_EQ(failure(urlOf(plain, "https://"), {"/", true}), "/: Is a directory");
+    EXPECT_EQ(failure(urlOf(plain, "https://"), {"/dev/null", true}),
+              "/dev/null: no certificates in PEM form in this file");
 }
 
 }  // namespace
