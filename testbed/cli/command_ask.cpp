@@ -99,12 +99,13 @@ Answers askInTime(const AskOptions& options, const std::function<void(const std:
 
 int check(const AskOptions& options) {
     const auto late = [](const std::string& reason) {
-        endProcess(printCheck([&] { return unknownSummary(reason); }));
+        endProcess(printCheck(unknownSummary(reason)));
     };
-    return printCheck([&] {
+    return printCheck(summaryOf([&] {
         const Answers answers = askInTime(options, late);
-        return summarize(answers.inventory, {answers.failure, options.check.expected});
-    });
+        return summarize(answers.inventory,
+                         {answers.failure, options.check.expected, options.check.policy});
+    }));
 }
 
 bool reportStatuses(const Inventory& inventory) {

@@ -93,10 +93,11 @@ int show(const ShowOptions& options) {
 }
 
 int check(const ShowOptions& options) {
-    return printCheck([&] {
+    return printCheck(summaryOf([&] {
         const auto [inventory, complete] = ask(options);
-        return summarize(inventory, {complete ? "" : incomplete(options), options.check.expected});
-    });
+        return summarize(inventory, {complete ? "" : incomplete(options), options.check.expected,
+                                     options.check.policy});
+    }));
 }
 
 std::vector<std::string> knownClasses() {
