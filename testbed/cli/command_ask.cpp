@@ -126,7 +126,7 @@ int show(const AskOptions& options) {
     const Answers answers = askInTime(options, late);
     if (!answers.failure.empty()) throw WbemError(answers.failure);
     const bool colours = options.colour.onStandardOutput();
-    std::cout << (options.json ? jsonView(answers.inventory) : treeView(answers.inventory, colours))
+    std::cout << (options.json ? jsonView(answers.inventory) : treeView(answers.inventory, {.colours = colours}))
               << std::flush;
     return reportStatuses(answers.inventory) ? kServerFailed : 0;
 }

@@ -82,7 +82,7 @@ private:
         return line ? execute(*line) : !input_.atEnd();
     }
 
-    void show() override { printer().line(treeView(last_)); }
+    void show() override { printer().line(treeView(last_, TreeStyle::ofOutput(false))); }
 
     void wait(int seconds) override {
         for (int i = 0; i < seconds; i++) {

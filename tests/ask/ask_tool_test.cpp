@@ -66,7 +66,9 @@ TEST_F(Ask, PrintsJsonOfOneClass) {
     const Outcome outcome = ask("--json --class Tovexa_PlexorStorageExtent --namespace root/x");
     ASSERT_EQ(outcome.status, 0) << outcome.errors;
     const auto document = nlohmann::json::parse(outcome.output);
-    ASSERT_EQ(document.size(), 1u);
+    ASSERT_EQ(document.size(), 3u);
+    EXPECT_EQ(document.at("format"), 1);
+    EXPECT_EQ(document.at("errors"), nlohmann::json::array());
     const auto& drive = document.at("Tovexa_PlexorStorageExtent").at(0);
     EXPECT_EQ(drive.at("path"),
               "root/x:Tovexa_PlexorStorageExtent.DeviceID=\"tvxStorageExtC0_d0\"");

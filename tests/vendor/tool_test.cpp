@@ -46,7 +46,7 @@ protected:
     void allowLeaks() { setenv("ASAN_OPTIONS", "detect_leaks=0", 1); }
 
     Outcome run(const std::string& arguments) {
-        const std::string command = std::string(TOOL) + " " + arguments + " >" +
+        const std::string command = "LC_ALL=C.UTF-8 " + std::string(TOOL) + " " + arguments + " >" +
                                     (directory_ / "out").string() + " 2>" +
                                     (directory_ / "err").string();
         const int status = std::system(command.c_str());
