@@ -42,7 +42,8 @@ TEST(Colour, ControllersHaveNone) {
     ClassAnswer controllers{"Tovexa_PlexorController", {}};
     controllers.response.instances.push_back(
         element("Tovexa_PlexorController", "x", "Controller", 6, 30));
-    EXPECT_EQ(treeView({controllers}, {.colours = true}), "Controller  [health failed, status error]\n");
+    EXPECT_EQ(treeView({controllers}, {.colours = true}),
+              "Controller  [health failed, status error]\n");
 }
 
 /// Standard output is a terminal as long as it lives.
