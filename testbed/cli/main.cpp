@@ -58,7 +58,8 @@ int runTool(int argc, char** argv) {
     for (CLI::App* command : app.get_subcommands(nullptr))
         command->set_version_flag("-V,--version", "plexor-testbed " PLEXOR_VERSION);
     app.callback([&app] {
-        if (app.get_subcommands().empty()) throw CLI::RequiredError("a command");
+        if (app.get_subcommands().empty())
+            throw CLI::RequiredError("a command (ask, calls, serve, show or watch)");
     });
     return run(app, status, argc, argv);
 }

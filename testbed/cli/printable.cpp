@@ -52,7 +52,7 @@ std::size_t lineEnd(std::string_view text, std::size_t begin, std::size_t column
     std::size_t used = 0, lastBlank = begin;
     for (std::size_t at = begin; at < text.size();) {
         const Unit unit = firstUnit(text.substr(at));
-        if (text[at] == ' ') lastBlank = at;
+        if (text[at] == ' ' && at > begin && text[at - 1] != ' ') lastBlank = at;
         used += columnsOf(unit);
         if (used > columns && at > begin) return lastBlank > begin ? lastBlank : at;
         at += unit.size;

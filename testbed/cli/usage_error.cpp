@@ -33,14 +33,24 @@ const CLI::App& commandIn(const CLI::App& app) {
     return given.empty() ? app : *given.front();
 }
 
+/// A word that may be a mistyped command, and hardly anything secret.
+bool isWord(std::string_view argument) {
+    constexpr std::size_t kLongest = 12;
+    return !argument.empty() && argument.size() <= kLongest &&
+           std::all_of(argument.begin(), argument.end(),
+                       [](char c) { return c >= 'a' && c <= 'z'; });
+}
+
 /// What was given beyond what is known.
-std::string unexpected(const CLI::App& app) {
-    const CLI::App& command = commandIn(app);
-    for (const std::string& argument : app.remaining(true)) {
-        if (isOption(argument)) return "there is no option " + optionName(argument);
-        if (&command == &app && !app.get_subcommands(nullptr).empty())
-            return "there is no command of that name; commands are " + commandNames(app);
-    }
+std::string unexpected(const CLI::App& app, const std::string& first) {
+    const bool commandMissing =
+        &commandIn(app) == &app && !app.get_subcommands(nullptr).empty() && !isOption(first);
+    if (commandMissing)
+        return "there is no command " + (isWord(first) ? first : "of that name") +
+               "; commands are " + commandNames(app);
+    const auto arguments = app.remaining(true);
+    const auto option = std::find_if(arguments.begin(), arguments.end(), isOption);
+    if (option != arguments.end()) return "there is no option " + optionName(*option);
     return "there is an argument too many";
 }
 
@@ -66,9 +76,9 @@ std::string usageErrorText(const CLI::App& app, const CLI::ParseError& error, in
     const std::string name = commandIn(app).get_name();
     const bool isTop = &commandIn(app) == &app;
     const std::string hint = (isTop ? name : app.get_name() + " " + name) + " --help tells more";
-    const bool extras = error.get_name() == "ExtrasError";
-    const std::string text =
-        extras ? unexpected(app) : withoutCredentials(error.what(), argc, argv);
+    const bool extras = dynamic_cast<const CLI::ExtrasError*>(&error) != nullptr;
+    const std::string text = extras ? unexpected(app, argc > 1 ? argv[1] : "")
+                                    : withoutCredentials(error.what(), argc, argv);
     return printable(text + "; " + hint);
 }
 
