@@ -52,6 +52,9 @@ constexpr ChargeRule kChargeRules[] = {
     {13, kWarning},
 };
 
+/// A status that no rule has.
+constexpr std::uint64_t kSeveral = 0xffff;
+
 /// For a HealthState that does not belong to the OperationalStatus beside it.
 CheckLevel levelOfHealth(std::uint64_t health) {
     if (health == 5) return kOk;
@@ -60,7 +63,10 @@ CheckLevel levelOfHealth(std::uint64_t health) {
 
 std::uint64_t numberOf(const Instance& instance, const char* property) {
     const CimValue* value = instance.find(property);
-    return value ? value->asUnsigned() : 0;
+    if (!value) return 0;
+    // The provider tells one state. Of several, a bad one must not hide behind a good one.
+    const auto* elements = std::get_if<std::vector<CimValue>>(&value->data);
+    return elements && elements->size() > 1 ? kSeveral : value->asUnsigned();
 }
 
 std::string nameOf(const Instance& instance) {

@@ -137,7 +137,8 @@ void addShowCommand(CLI::App& app, int& status) {
         ->capture_default_str();
     command->add_flag("--json", options->json, "print JSON instead of a tree or a line");
     CLI::Option* checkFlag = addCheckOptions(*command, options->check);
-    command->add_flag("--problems", options->problems, "show only what is not ok")->excludes(checkFlag);
+    command->add_flag("--problems", options->problems, "show only what is not ok")
+        ->excludes(checkFlag);
     addColourOption(*command, options->colour);
     command->add_flag("--log", options->log, "print the provider's log lines on standard error");
     command->callback(
