@@ -265,6 +265,90 @@ TEST_F(Ask, AFailureHidesNothingCritical) {
     EXPECT_EQ(check().status, 3);
 }
 
+TEST_F(Ask, UsageErrorsNameWhatIsWrongAndNoSecrets) {
+    const struct {
+        const char* arguments;
+        const char* text;
+    } cases[] = {
+        {"nope", "there is no command nope; commands are show, watch, calls, ask, serve;"},
+        {"--bogus", "there is no option --bogus;"},
+        {"", "a command (ask, calls, serve, show or watch) is required;"},
+        {"http://me:secret@h", "there is no command of that name;"},
+        {"ask", "a URL or --hostname is required;"},
+        {"ask http://h -H h", "url excludes --hostname;"},
+        {"ask -w 1 http://mon:secret@h", "there is no option -w;"},
+        {"ask -wsecret http://h", "there is no option -w;"},
+        {"ask --password=secret http://h", "there is no option --password;"},
+        {"ask http://h secret", "there is an argument too many;"},
+        {"ask --timeout http://mon:secret@h", "--timeout: Value ***h not in range"},
+        {"ask --class=mon:secret@h http://h", "--class: ***h not in"},
+    };
+    for (const auto& [arguments, text] : cases) {
+        const Outcome outcome = runTool(arguments);
+        EXPECT_EQ(outcome.status, 2) << arguments;
+        EXPECT_EQ(outcome.output, "") << arguments;
+        EXPECT_EQ(outcome.errors.find(std::string("plexor-testbed: ") + text), 0u)
+            << outcome.errors;
+        EXPECT_EQ(outcome.errors.find("secret"), std::string::npos) << outcome.errors;
+        EXPECT_EQ(std::count(outcome.errors.begin(), outcome.errors.end(), '\n'), 1);
+    }
+    for (const char* arguments : {"--version", "-V", "ask --version", "show -V", "serve --version"})
+        EXPECT_EQ(runTool(arguments).output, "plexor-testbed 1.0.0\n") << arguments;
+}
+
+TEST_F(Ask, OutputThatCannotBeWrittenIsAnError) {
+    const auto statusOf = [&](const std::string& more) {
+        const std::string command = TOOL " ask " + server.url() + " " + more;
+        return WEXITSTATUS(std::system((command + " >/dev/full 2>/dev/null").c_str()));
+    };
+    for (const char* more : {"", "--json", "--metrics", "--problems"})
+        EXPECT_EQ(statusOf(more), 1) << more;
+    EXPECT_EQ(statusOf("--check --no-refresh"), 3);
+    EXPECT_EQ(statusOf("--check --no-refresh --json"), 3);
+    array.driveState = "FAILED";
+    array.driveStatus = 6;
+    array.driveHealth = 30;
+    EXPECT_EQ(statusOf("--check --no-refresh"), 2);
+}
+
+TEST_F(Ask, UrlsPathIsTheNamespace) {
+    const std::string host = server.url().substr(7);
+    EXPECT_EQ(runTool("ask http://" + host + "/root/nope").status, 0);
+    EXPECT_NE(server.requests().at(0).find("CIMObject: root%2Fnope\r\n"), std::string::npos);
+    EXPECT_NE(server.requests().at(0).find("POST /cimom HTTP/1.1"), std::string::npos);
+    EXPECT_EQ(runTool("ask http://" + host + "/root/a --namespace root/b").errors,
+              "plexor-testbed: the URL names one namespace and --namespace another\n");
+    EXPECT_EQ(
+        runTool("ask --path /other -H 127.0.0.1 -p " + host.substr(host.find(':') + 1)).status, 0);
+    EXPECT_NE(server.requests().back().find("POST /other HTTP/1.1"), std::string::npos);
+}
+
+TEST_F(Ask, PluginIsACheck) {
+    const auto directory = std::filesystem::path(::testing::TempDir());
+    const auto link = directory / "check_plexor";
+    std::filesystem::remove(link);
+    std::filesystem::create_symlink(TOOL, link);
+    const std::string port = server.url().substr(server.url().rfind(':') + 1);
+    const auto run = [&](const std::string& arguments) {
+        const std::string command = link.string() + " " + arguments + " 2>/dev/null >" +
+                                    (directory / "plugin.out").string();
+        const int status = WEXITSTATUS(std::system(command.c_str()));
+        std::ifstream stream(directory / "plugin.out");
+        return std::to_string(status) + " " +
+               std::string{std::istreambuf_iterator<char>(stream), {}};
+    };
+    EXPECT_EQ(run("-H 127.0.0.1 -p " + port + " -t 20 --refresh 0 --expect drives=1")
+                  .find("0 PLEXOR OK - 1 controller, 1 volume, 1 drive, 0 ports, 0 batteries | "),
+              0u);
+    EXPECT_EQ(run("-V"), "0 check_plexor 1.0.0\n");
+    EXPECT_EQ(run(""), "3 PLEXOR UNKNOWN - wrong usage\n");
+    EXPECT_EQ(run("-H 127.0.0.1 -p 1 -u me"),
+              "3 PLEXOR UNKNOWN - a user, but no password; name its file with --password-file\n");
+    EXPECT_EQ(run("-H h/x@y"),
+              "3 PLEXOR UNKNOWN - --hostname is a name or an address and nothing else\n");
+    std::filesystem::remove(link);
+}
+
 TEST_F(Ask, WrongUsageOfACheckIsUnknown) {
     for (const char* arguments :
          {"ask --check", "ask --check http://h --surprise", "ask --check http://h --metrics",
