@@ -98,7 +98,6 @@ TEST_F(Policy, LevelsOfTheSite) {
 }
 
 TEST_F(Policy, VerboseChecksNameElements) {
-    const std::string first = ask("--check --no-refresh --no-refresh").output;
     const auto behindFirst = [&](const std::string& more) {
         const std::string output = ask("--check --no-refresh " + more).output;
         return output.substr(output.find('\n') + 1);
