@@ -2,7 +2,6 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <charconv>
 #include <iostream>
 #include <string_view>
 
@@ -12,7 +11,50 @@ namespace {
 constexpr int kUsage = 2;
 constexpr const char* kFlag = "--check";
 
-CheckSummary made(const std::function<CheckSummary()>& make) {
+/// An option that can be given several times, each time with several texts, which `take` reads.
+CLI::Option* addTexts(CLI::App& command, const char* name, const char* form,
+                      const char* description,
+                      const std::function<bool(const std::string&)>& take) {
+    const auto takeAll = [take](const std::vector<std::string>& texts) {
+        return std::all_of(texts.begin(), texts.end(), take);
+    };
+    return command.add_option(name, takeAll, description)
+        ->type_name(form)
+        ->delimiter(',')
+        ->take_all()
+        ->allow_extra_args(false);
+}
+
+void addPolicyOptions(CLI::App& command, CheckPolicy& policy) {
+    addTexts(command, "--level", "[KIND:]WORD=LEVEL",
+             "what a state means here: ok, warning or critical; DEGRADED=critical",
+             [&policy](const std::string& text) { return policy.takeLevel(text); });
+    addTexts(command, "--ignore", "KIND:ID",
+             "an element whose state is acknowledged, by its DeviceID: drive:C0_32_3",
+             [&policy](const std::string& text) { return policy.takeIgnored(text); });
+}
+
+}  // namespace
+
+CLI::Option* addCheckOptions(CLI::App& command, CheckOptions& options, bool isPlugin) {
+    CLI::Option* check =
+        command.add_flag(kFlag, options.check,
+                         "print one line for a monitoring system and exit with 0 (ok), 1 "
+                         "(warning), 2 (critical) or 3 (unknown)");
+    CLI::Option* expect = addTexts(
+        command, "--expect", "KIND=N",
+        "volumes=N, drives=N, ...: critical when there are fewer, a warning when there are more; "
+        "drives>=N: more are fine",
+        [&options](const std::string& text) { return takeExpected(text, options.expected); });
+    if (!isPlugin) expect->needs(check);
+    addPolicyOptions(command, options.policy);
+    command.add_flag("-v,--verbose", options.verbosity,
+                     "behind the line of a check, one for each element that is not ok; twice: for "
+                     "each element");
+    return check;
+}
+
+CheckSummary summaryOf(const std::function<CheckSummary()>& make) {
     try {
         return make();
     } catch (const std::exception& error) {
@@ -20,51 +62,31 @@ CheckSummary made(const std::function<CheckSummary()>& make) {
     }
 }
 
-/// Reads "drives=9". False for anything else.
-bool takeExpected(const std::string& text, std::map<std::string, std::size_t>& expected) {
-    const std::size_t equals = std::min(text.find('='), text.size());
-    const std::string plural = text.substr(0, equals);
-    const std::string number = text.substr(std::min(equals + 1, text.size()));
-    const char* end = number.data() + number.size();
-    std::size_t count = 0;
-    const auto [stop, error] = std::from_chars(number.data(), end, count);
-    if (!isCounted(plural) || error != std::errc() || stop != end) return false;
-    expected[plural] = count;
-    return true;
+std::string checkText(const CheckSummary& summary, int verbosity) {
+    std::string text = summary.line() + "\n";
+    if (verbosity == 0) return text;
+    for (const std::string& detail : verbosity > 1 ? summary.details : summary.problems)
+        text += detail + "\n";
+    return text;
 }
 
-}  // namespace
-
-CLI::Option* addCheckOptions(CLI::App& command, CheckOptions& options) {
-    CLI::Option* check =
-        command.add_flag(kFlag, options.check,
-                         "print one line for a monitoring system and exit with 0 (ok), 1 "
-                         "(warning), 2 (critical) or 3 (unknown)");
-    const auto take = [&options](const std::vector<std::string>& texts) {
-        return std::all_of(texts.begin(), texts.end(), [&](const std::string& text) {
-            return takeExpected(text, options.expected);
-        });
-    };
-    command
-        .add_option("--expect", take,
-                    "critical when there are fewer: volumes=N, drives=N, batteries=N, ...")
-        ->type_name("KIND=N")
-        ->delimiter(',')
-        ->take_all()
-        ->needs(check);
-    return check;
-}
-
-int printCheck(const std::function<CheckSummary()>& make) {
-    const CheckSummary summary = made(make);
-    std::cout << summary.line << std::endl;
+int printCheck(const CheckSummary& summary, int verbosity) {
+    std::cout << checkText(summary, verbosity) << std::flush;
     return summary.status;
 }
 
+bool isCheck(int argc, const char* const* argv) {
+    return isPluginName(argv[0]) ||
+           std::any_of(argv, argv + argc, [](std::string_view word) { return word == kFlag; });
+}
+
 int usageStatus(int argc, const char* const* argv) {
-    const bool check =
-        std::any_of(argv, argv + argc, [](std::string_view word) { return word == kFlag; });
-    return check ? printCheck([] { return unknownSummary("wrong usage"); }) : kUsage;
+    return isCheck(argc, argv) ? printCheck(unknownSummary("wrong usage")) : kUsage;
+}
+
+bool isPluginName(const char* program) {
+    const std::string_view path = program ? program : "";
+    return path.substr(path.rfind('/') + 1) == kPluginName;
 }
 
 }  // namespace testbed

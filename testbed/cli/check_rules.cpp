@@ -52,6 +52,9 @@ constexpr ChargeRule kChargeRules[] = {
     {13, kWarning},
 };
 
+/// A status that no rule has.
+constexpr std::uint64_t kSeveral = 0xffff;
+
 /// For a HealthState that does not belong to the OperationalStatus beside it.
 CheckLevel levelOfHealth(std::uint64_t health) {
     if (health == 5) return kOk;
@@ -60,7 +63,10 @@ CheckLevel levelOfHealth(std::uint64_t health) {
 
 std::uint64_t numberOf(const Instance& instance, const char* property) {
     const CimValue* value = instance.find(property);
-    return value ? value->asUnsigned() : 0;
+    if (!value) return 0;
+    // The provider tells one state. Of several, a bad one must not hide behind a good one.
+    const auto* elements = std::get_if<std::vector<CimValue>>(&value->data);
+    return elements && elements->size() > 1 ? kSeveral : value->asUnsigned();
 }
 
 std::string nameOf(const Instance& instance) {
@@ -100,28 +106,34 @@ std::string wordOr(CodeWords words, std::uint64_t code, const char* fallback) {
     return word.empty() ? fallback : std::string(word);
 }
 
+Verdict verdictOf(CheckLevel level, const std::string& word) {
+    return {level, level == kOk ? "" : word, word};
+}
+
+Verdict verdictOfRule(const StateRule& rule, std::uint64_t status) {
+    const std::string statusWord = wordOr(operationalStatusWords(), status, "undefined");
+    Verdict verdict = verdictOf(rule.level, *rule.finding != '\0' ? rule.finding : statusWord);
+    verdict.isTableState = *rule.word != '\0';
+    verdict.word = verdict.isTableState ? rule.word : statusWord;
+    return verdict;
+}
+
 Verdict verdictOfState(const std::vector<const StateRule*>& rules, const Instance& instance) {
     const std::uint64_t status = numberOf(instance, "OperationalStatus");
-    if (const StateRule* rule = ruleOf(rules, instance)) {
-        if (rule->level == kOk) return {};
-        return {rule->level, *rule->finding != '\0'
-                                 ? rule->finding
-                                 : wordOr(operationalStatusWords(), status, "undefined")};
-    }
+    if (const StateRule* rule = ruleOf(rules, instance)) return verdictOfRule(*rule, status);
     // No state of the provider's: the worse of what the two numbers say.
     const std::uint64_t health = numberOf(instance, "HealthState");
     const CheckLevel level = std::max(rules.front()->level, levelOfHealth(health));
-    if (level == kOk) return {};
     if (levelOfHealth(health) == level)
-        return {level, wordOr(healthStateWords(), health, "undefined")};
-    return {level, wordOr(operationalStatusWords(), status, "undefined")};
+        return verdictOf(level, wordOr(healthStateWords(), health, "undefined"));
+    return verdictOf(level, wordOr(operationalStatusWords(), status, "undefined"));
 }
 
 Verdict verdictOfCharge(const Instance& instance) {
     const std::uint64_t status = numberOf(instance, "BatteryStatus");
     for (const ChargeRule& rule : kChargeRules)
         if (rule.batteryStatus == status)
-            return {rule.level, wordOr(batteryStatusWords(), status, "undefined")};
+            return verdictOf(rule.level, wordOr(batteryStatusWords(), status, "undefined"));
     return {};
 }
 
@@ -129,6 +141,11 @@ Verdict verdictOfCharge(const Instance& instance) {
 
 std::span<const StateRule> stateRules() {
     return kStateRules;
+}
+
+const char* levelName(CheckLevel level) {
+    static constexpr const char* kNames[] = {"ok", "warning", "critical"};
+    return kNames[static_cast<int>(level)];
 }
 
 std::span<const ChargeRule> chargeRules() {

@@ -36,8 +36,16 @@ std::span<const ChargeRule> chargeRules();
 
 struct Verdict {
     CheckLevel level = CheckLevel::Ok;
-    std::string finding;  ///< "failed", for a summary; "" when all is well
+    std::string finding = "";  ///< "failed", for a summary; "" when all is well
+    /// "FAILED" for the state of a volume or drive that the table of states has; otherwise the word
+    /// for the number that decided: "no contact".
+    std::string word = "";
+    bool isTableState = false;  ///< the word is one of the table's
+    bool ignored = false;       ///< not OK, but acknowledged; the level is that of the state
 };
+
+/// "ok", "warning" or "critical".
+const char* levelName(CheckLevel level);
 
 /// None for classes that are not judged: a controller's HealthState is always 5, and its
 /// OperationalStatus is as old as the loaded provider.

@@ -3,17 +3,19 @@
 #include <unistd.h>
 
 #include <CLI/CLI.hpp>
+#include <functional>
 #include <future>
 #include <iostream>
 #include <memory>
 #include <thread>
 
-#include "check_command.h"
-#include "colour.h"
-#include "inventory.h"
+#include "ask_options.h"
+#include "inventory_gaps.h"
 #include "json_view.h"
+#include "metrics_view.h"
+#include "output_status.h"
+#include "terminal.h"
 #include "tree_view.h"
-#include "wbem_client.h"
 
 namespace testbed {
 namespace {
@@ -23,125 +25,151 @@ constexpr int kServerFailed = 3;
 /// For the connection's own deadline, which tells more, to come first.
 constexpr std::chrono::milliseconds kGrace{250};
 
-struct AskOptions {
-    std::string url;
-    std::string nameSpace = "root/cimv2";
-    std::string className;
-    std::string user;
-    std::string passwordFile;
-    TlsOptions tls;
-    bool insecure = false;
-    unsigned timeoutSeconds = 30;
-    bool json = false;
-    CheckOptions check;
-    ColourChoice colour;
+/// What the command prints, and how it ends.
+struct Report {
+    std::string output;
+    std::string errors;
+    int status = 0;
 };
 
-/// What a server answered, and why it did not answer more; "" when it did.
-struct Answers {
-    Inventory inventory;
-    std::string failure;
-};
+using Asking = std::function<Report(std::atomic<int>& answered)>;
 
-std::vector<std::string> classesToAsk(const std::string& className) {
-    if (!className.empty()) return {className};
-    std::vector<std::string> names;
-    for (const ServedClass& served : servedClasses()) names.push_back(served.name);
-    return names;
+std::string errorLine(const std::string& text) {
+    return "plexor-testbed: " + text + "\n";
 }
 
-WbemUrl urlOf(const AskOptions& options) {
-    WbemUrl url = parseWbemUrl(options.url);
-    if (!options.user.empty()) url.credentials = Credentials{options.user, ""};
-    if (options.passwordFile.empty()) return url;
-    if (!url.credentials) throw WbemError("a password, but no user; name one with --user");
-    url.credentials->password = readPassword(options.passwordFile);
-    return url;
-}
+/// An asking on a thread of its own: neither a name server nor an answer that takes long to
+/// understand may hold the command beyond its time.
+class Watched {
+public:
+    Watched(const AskOptions& options, Asking ask)
+        : classes_(options.className.empty() ? servedClasses().size() : 1),
+          report_(promise_.get_future()),
+          thread_([this, ask = std::move(ask)] { run(ask); }) {}
+    ~Watched() { thread_.join(); }
+    Watched(const Watched&) = delete;
+    Watched& operator=(const Watched&) = delete;
 
-Answers ask(const AskOptions& options, Deadline deadline) {
-    const WbemUrl url = urlOf(options);
-    WbemClientOptions settings;
-    settings.deadline = deadline;
-    settings.tls = options.tls;
-    settings.tls.verify = !options.insecure;
-    const WbemClient client(url, settings);
-    Answers answers;
-    try {
-        for (const std::string& name : classesToAsk(options.className))
-            answers.inventory.push_back(
-                {name, client.enumerateInstances(name, {}, options.nameSpace)});
-    } catch (const WbemError& error) {
-        answers.failure = url.authority() + ": " + error.what();
+    /// None when the time has run out: the process has to end without the thread.
+    std::optional<Report> within(std::chrono::milliseconds time) {
+        const Progress progress([this](int seconds) {
+            return "asking, " + std::to_string(answered_.load()) + " answers for " +
+                   std::to_string(classes_) + " classes, " + std::to_string(seconds) + " s";
+        });
+        if (report_.wait_for(time) != std::future_status::ready) return std::nullopt;
+        return report_.get();
     }
-    return answers;
+
+private:
+    void run(const Asking& ask) {
+        try {
+            promise_.set_value(ask(answered_));
+        } catch (...) {
+            promise_.set_exception(std::current_exception());
+        }
+    }
+
+    std::size_t classes_;
+    std::atomic<int> answered_ = 0;
+    std::promise<Report> promise_;
+    std::future<Report> report_;
+    std::thread thread_;
+};
+
+int print(const Report& report, bool isCheck) {
+    std::cout << report.output;
+    const int status = statusOfOutput(report.status, isCheck);
+    std::cerr << report.errors << std::flush;
+    return status;
 }
 
-/// Asks on a thread of its own: neither a name server nor an answer that takes long to understand
-/// may hold the command beyond its time. When that has run out, `late` is to end the process, as
-/// the thread cannot be stopped.
-Answers askInTime(const AskOptions& options, const std::function<void(const std::string&)>& late) {
-    const Deadline deadline =
-        std::chrono::steady_clock::now() + std::chrono::seconds(options.timeoutSeconds);
-    std::packaged_task<Answers()> task([&] { return ask(options, deadline); });
-    std::future<Answers> answers = task.get_future();
-    std::thread thread(std::move(task));
-    if (answers.wait_until(deadline + kGrace) != std::future_status::ready)
-        late("no answer within " + std::to_string(options.timeoutSeconds) + " s");
-    thread.join();
-    return answers.get();
+/// Prints the report, or `late` when there is none in time; then the process ends here.
+int runInTime(const AskOptions& options, Asking ask, const Report& late) {
+    Watched watched(options, std::move(ask));
+    const auto report = watched.within(std::chrono::seconds(options.timeoutSeconds) + kGrace);
+    if (!report) _exit(print(late, options.check.check));
+    return print(*report, options.check.check);
 }
 
-[[noreturn]] void endProcess(int status) {
-    std::cout.flush();
-    _exit(status);
+std::string lateText(const AskOptions& options) {
+    return "no answer within " + std::to_string(options.timeoutSeconds) + " s";
+}
+
+Report checkReport(const AskOptions& options, const Inventory& inventory,
+                   const CheckSummary& summary) {
+    return {options.json ? jsonView(inventory, options.check.policy, &summary)
+                         : checkText(summary, options.check.verbosity),
+            "", summary.status};
 }
 
 int check(const AskOptions& options) {
-    const auto late = [](const std::string& reason) {
-        endProcess(printCheck([&] { return unknownSummary(reason); }));
+    const auto ask = [&options](std::atomic<int>& answered) {
+        Answers answers;
+        const CheckSummary summary = summaryOf([&] {
+            answers = askServer(targetOf(options), answered);
+            return summarize(answers.inventory,
+                             {.failure = answers.failure,
+                              .expected = options.check.expected,
+                              .policy = options.check.policy,
+                              .arriving = answers.arriving,
+                              .time = AskTime{answers.seconds, options.timeoutSeconds}});
+        });
+        return checkReport(options, answers.inventory, summary);
     };
-    return printCheck([&] {
-        const Answers answers = askInTime(options, late);
-        return summarize(answers.inventory, {answers.failure, options.check.expected});
-    });
+    return runInTime(options, ask, checkReport(options, {}, unknownSummary(lateText(options))));
 }
 
-bool reportStatuses(const Inventory& inventory) {
-    bool failed = false;
-    for (const ClassAnswer& answer : inventory) {
-        if (answer.response.rc == CMPI_RC_OK) continue;
-        std::cerr << "plexor-testbed: " << statusLine(answer) << "\n";
-        failed = true;
-    }
-    return failed;
+std::string statusErrors(const Inventory& inventory) {
+    std::string errors;
+    for (const ClassAnswer& answer : inventory)
+        if (answer.response.rc != CMPI_RC_OK) errors += errorLine(statusLine(answer));
+    return errors;
+}
+
+std::string treeOf(const AskOptions& options, const Inventory& inventory) {
+    TreeStyle style = TreeStyle::ofOutput(options.colour.onStandardOutput());
+    style.problemsOnly = options.problems;
+    style.policy = options.check.policy;
+    return treeView(inventory, style);
 }
 
 int show(const AskOptions& options) {
-    const auto late = [](const std::string& reason) {
-        std::cerr << "plexor-testbed: " << reason << std::endl;
-        endProcess(kFailed);
+    const auto ask = [&options](std::atomic<int>& answered) {
+        const Answers answers = askServer(targetOf(options), answered);
+        if (!answers.failure.empty()) throw WbemError(answers.failure);
+        Report report{options.json ? jsonView(answers.inventory, options.check.policy)
+                                   : treeOf(options, answers.inventory),
+                      statusErrors(answers.inventory)};
+        if (!answers.arriving.empty())
+            report.errors += errorLine("inventory still arriving: " + answers.arriving);
+        report.status = report.errors.empty() ? 0 : kServerFailed;
+        return report;
     };
-    const Answers answers = askInTime(options, late);
-    if (!answers.failure.empty()) throw WbemError(answers.failure);
-    const bool colours = options.colour.onStandardOutput();
-    std::cout << (options.json ? jsonView(answers.inventory) : treeView(answers.inventory, colours))
-              << std::flush;
-    return reportStatuses(answers.inventory) ? kServerFailed : 0;
+    return runInTime(options, ask, {"", errorLine(lateText(options)), kFailed});
 }
 
-void addConnectionOptions(CLI::App& command, AskOptions& options) {
-    command.add_option("url", options.url, "http[s]://[user:password@]host[:port][/path]")
-        ->required();
-    command.add_option("--user", options.user, "user name, instead of the URL's");
-    command.add_option("--password-file", options.passwordFile,
-                       "file whose first line is the password, instead of the URL's");
-    command.add_option("--ca-file", options.tls.authorities,
-                       "certificates to trust, instead of the system's");
-    command.add_flag("--insecure", options.insecure, "trust any certificate");
-    command.add_option("--timeout", options.timeoutSeconds, "seconds that all of it may take")
-        ->check(CLI::Range(1, 86400))
-        ->capture_default_str();
+/// Whoever collects metrics wants to read there that nothing was answered.
+int metrics(const AskOptions& options) {
+    const auto ask = [&options](std::atomic<int>& answered) {
+        const Answers answers = askServer(targetOf(options), answered);
+        const CheckPolicy& policy = options.check.policy;
+        std::string errors = statusErrors(answers.inventory);
+        if (!answers.failure.empty()) errors += errorLine(answers.failure);
+        const bool up = errors.empty();
+        const bool complete =
+            up && answers.arriving.empty() && gapsIn(answers.inventory, policy).empty();
+        return Report{metricsView(answers.inventory, policy, {up, complete, answers.seconds}),
+                      errors};
+    };
+    const double limit = options.timeoutSeconds;
+    return runInTime(options, ask,
+                     {metricsView({}, {}, {false, false, limit}), errorLine(lateText(options))});
+}
+
+int run(const AskOptions& options) {
+    requireSense(options);
+    if (options.check.check) return check(options);
+    return options.metrics ? metrics(options) : show(options);
 }
 
 }  // namespace
@@ -150,16 +178,17 @@ void addAskCommand(CLI::App& app, int& status) {
     const auto options = std::make_shared<AskOptions>();
     CLI::App* command =
         app.add_subcommand("ask", "Shows or checks what a WBEM server answers over CIM-XML");
-    addConnectionOptions(*command, *options);
-    command->add_option("--namespace", options->nameSpace, "namespace of the requests")
-        ->capture_default_str();
-    command->add_option("--class", options->className, "ask for this class only")
-        ->check(CLI::IsMember(classesToAsk("")));
-    CLI::Option* json = command->add_flag("--json", options->json, "print JSON instead of a tree");
-    addCheckOptions(*command, options->check)->excludes(json);
-    addColourOption(*command, options->colour);
-    command->callback(
-        [options, &status] { status = options->check.check ? check(*options) : show(*options); });
+    addAskOptions(*command, *options, false);
+    command->callback([options, &status] { status = run(*options); });
+}
+
+void makePlugin(CLI::App& app, int& status) {
+    const auto options = std::make_shared<AskOptions>();
+    addAskOptions(app, *options, true);
+    app.callback([options, &status] {
+        options->check.check = true;
+        status = run(*options);
+    });
 }
 
 }  // namespace testbed

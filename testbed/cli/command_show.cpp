@@ -16,6 +16,7 @@
 #include "provider_session.h"
 #include "scenario_locator.h"
 #include "scenario_parser.h"
+#include "terminal.h"
 #include "tree_view.h"
 
 namespace testbed {
@@ -33,6 +34,7 @@ struct ShowOptions {
     std::string nameSpace = "root/cimv2";
     unsigned timeoutSeconds = 60;
     bool json = false;
+    bool problems = false;
     CheckOptions check;
     bool log = false;
     ColourChoice colour;
@@ -76,6 +78,8 @@ Answers ask(const ShowOptions& options) {
     ProviderSession session(scenario, locateLibrary(options.library), options.provider,
                             options.schema, options.nameSpace);
     Answers answers;
+    const Progress progress(
+        [](int seconds) { return "waiting for the inventory, " + std::to_string(seconds) + " s"; });
     answers.complete =
         session.waitForInventory(std::chrono::seconds(options.timeoutSeconds), options.nameSpace);
     InstanceClient client = session.client();
@@ -91,16 +95,27 @@ int show(const ShowOptions& options) {
     const auto [inventory, complete] = ask(options);
     if (!complete) std::cerr << "plexor-testbed: " << incomplete(options) << "\n";
     const bool colours = options.colour.onStandardOutput();
-    std::cout << (options.json ? jsonView(inventory) : treeView(inventory, colours)) << std::flush;
+    TreeStyle style = TreeStyle::ofOutput(colours);
+    style.problemsOnly = options.problems;
+    style.policy = options.check.policy;
+    std::cout << (options.json ? jsonView(inventory, options.check.policy)
+                               : treeView(inventory, style))
+              << std::flush;
     const bool failed = reportFailures(inventory);
     return complete && !failed ? 0 : kProviderFailed;
 }
 
 int check(const ShowOptions& options) {
-    return printCheck([&] {
-        const auto [inventory, complete] = ask(options);
-        return summarize(inventory, {complete ? "" : incomplete(options), options.check.expected});
+    Answers answers;
+    const CheckSummary summary = summaryOf([&] {
+        answers = ask(options);
+        return summarize(answers.inventory, {.failure = answers.complete ? "" : incomplete(options),
+                                             .expected = options.check.expected,
+                                             .policy = options.check.policy});
     });
+    if (!options.json) return printCheck(summary, options.check.verbosity);
+    std::cout << jsonView(answers.inventory, options.check.policy, &summary) << std::flush;
+    return summary.status;
 }
 
 std::vector<std::string> knownClasses() {
@@ -125,8 +140,10 @@ void addShowCommand(CLI::App& app, int& status) {
         ->capture_default_str();
     command->add_option("--timeout", options->timeoutSeconds, "seconds to wait for the inventory")
         ->capture_default_str();
-    CLI::Option* json = command->add_flag("--json", options->json, "print JSON instead of a tree");
-    addCheckOptions(*command, options->check)->excludes(json);
+    command->add_flag("--json", options->json, "print JSON instead of a tree or a line");
+    CLI::Option* checkFlag = addCheckOptions(*command, options->check);
+    command->add_flag("--problems", options->problems, "show only what is not ok")
+        ->excludes(checkFlag);
     addColourOption(*command, options->colour);
     command->add_flag("--log", options->log, "print the provider's log lines on standard error");
     command->callback(

@@ -83,7 +83,7 @@ private:
         return line ? execute(*line) : !input_.atEnd();
     }
 
-    std::string tree() override { return treeView(last_); }
+    std::string tree() override { return treeView(last_, TreeStyle::ofOutput(false)); }
 
     void wait(int seconds) override {
         for (int i = 0; i < seconds && passTime(); i++) {

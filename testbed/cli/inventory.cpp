@@ -6,12 +6,17 @@ namespace testbed {
 namespace {
 
 constexpr ServedClass kServedClasses[] = {
-    {"Tovexa_PlexorController", "Controllers", "Name", "tvxController", false},
-    {"Tovexa_PlexorSoftwareIdentity", "Software", "InstanceID", "tovexa:ControllerSoftware", false},
-    {"Tovexa_PlexorStorageVolume", "Volumes", "DeviceID", "tvxStorageVolume", true},
-    {"Tovexa_PlexorStorageExtent", "Drives", "DeviceID", "tvxStorageExt", true},
-    {"Tovexa_PlexorSASSATAPort", "Ports", "DeviceID", "tvxPort", true},
-    {"Tovexa_PlexorBattery", "Batteries", "DeviceID", "tvxControllerBattery", true},
+    {"Tovexa_PlexorController", "Controllers", "Name", "tvxController", false, "controller",
+     "controllers", true},
+    {"Tovexa_PlexorSoftwareIdentity", "Software", "InstanceID", "tovexa:ControllerSoftware", false,
+     "software version", "software versions", false},
+    {"Tovexa_PlexorStorageVolume", "Volumes", "DeviceID", "tvxStorageVolume", true, "volume",
+     "volumes", true},
+    {"Tovexa_PlexorStorageExtent", "Drives", "DeviceID", "tvxStorageExt", true, "drive", "drives",
+     true},
+    {"Tovexa_PlexorSASSATAPort", "Ports", "DeviceID", "tvxPort", true, "port", "ports", true},
+    {"Tovexa_PlexorBattery", "Batteries", "DeviceID", "tvxControllerBattery", true, "battery",
+     "batteries", true},
 };
 
 }  // namespace
@@ -24,6 +29,19 @@ const ServedClass* findServedClass(const std::string& name) {
     for (const ServedClass& served : kServedClasses)
         if (sameName(served.name, name)) return &served;
     return nullptr;
+}
+
+std::optional<std::string> identityOf(const ServedClass& served, const Instance& instance) {
+    const CimValue* key = instance.path.findKey(served.identityKey);
+    if (!key) key = instance.find(served.identityKey);
+    const std::string prefix = served.prefix;
+    if (!key || !key->asString().starts_with(prefix)) return std::nullopt;
+    return key->asString().substr(prefix.size());
+}
+
+bool belongsTo(const ServedClass& served, const std::string& identity,
+               const std::string& controllerId) {
+    return served.isDevice ? identity.starts_with(controllerId + "_") : identity == controllerId;
 }
 
 Inventory collectInventory(InstanceClient& client, const std::vector<std::string>& classNames,

@@ -1,6 +1,7 @@
 // What a client sees: the provider's classes and its answers for them.
 #pragma once
 
+#include <optional>
 #include <span>
 #include <string>
 #include <vector>
@@ -16,12 +17,22 @@ struct ServedClass {
     const char* identityKey;  ///< the key that has the controller's id
     const char* prefix;       ///< what stands before the id in that key
     bool isDevice;            ///< "_" and the device's id follow the controller's id
+    const char* singular;     ///< "drive"
+    const char* plural;       ///< "drives"; what an option can count
+    bool isCounted;           ///< false for software, which nobody counts
 };
 
 /// Controllers first.
 std::span<const ServedClass> servedClasses();
 /// NULL for a class that is not served.
 const ServedClass* findServedClass(const std::string& name);
+
+/// What identifies an instance behind its class's prefix: "C0" for a controller, "C0_32_3" for a
+/// device of it. None for an instance that does not say it.
+std::optional<std::string> identityOf(const ServedClass& served, const Instance& instance);
+/// True when the identity may be one of that controller's; ids with underscores leave a doubt.
+bool belongsTo(const ServedClass& served, const std::string& identity,
+               const std::string& controllerId);
 
 struct ClassAnswer {
     std::string className;

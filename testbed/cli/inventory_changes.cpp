@@ -1,5 +1,8 @@
 #include "inventory_changes.h"
 
+#include "check_rules.h"
+#include "printable.h"
+
 namespace testbed {
 namespace {
 
@@ -35,7 +38,7 @@ void compareClass(const ClassAnswer& before, const ClassAnswer& after,
         if (old == nullptr) {
             lines.push_back("+ " + nameOf(now));
         } else if (const std::string text = differences(*old, now); !text.empty()) {
-            lines.push_back("~ " + text);
+            lines.push_back("~ " + shortName(now) + ": " + text);
         }
     }
 }
@@ -46,6 +49,7 @@ std::vector<std::string> changeLines(const Inventory& before, const Inventory& a
     std::vector<std::string> lines;
     for (std::size_t i = 0; i < before.size() && i < after.size(); i++)
         compareClass(before[i], after[i], lines);
+    for (std::string& line : lines) line = printable(line);
     return lines;
 }
 

@@ -8,8 +8,9 @@
 
 namespace testbed {
 
-/// One line for each instance that has come ("+ "), gone ("- ") or changed ("~ ", with the old and
-/// the new values of its properties), in the order of the new answer, those that have gone first.
+/// One line for each instance that has come ("+ "), gone ("- ") or changed ("~ ", its name, the old
+/// and the new values of its properties), in the order of the new answer, those that have gone
+/// first.
 std::vector<std::string> changeLines(const Inventory& before, const Inventory& after);
 
 }  // namespace testbed

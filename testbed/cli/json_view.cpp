@@ -7,6 +7,9 @@ namespace {
 
 using nlohmann::ordered_json;
 
+/// Of the document; changes only when a reader of the last one could not read the next one.
+constexpr int kFormat = 1;
+
 struct ToJson {
     ordered_json operator()(std::monostate) const { return nullptr; }
     ordered_json operator()(bool value) const { return value; }
@@ -33,19 +36,49 @@ ordered_json valuesAsJson(const std::vector<NamedValue>& values) {
     return object;
 }
 
+/// What a check says of the instance; null for one that is not judged.
+ordered_json verdictAsJson(const std::optional<Verdict>& verdict) {
+    if (!verdict) return nullptr;
+    return {{"level", levelName(verdict->level)},
+            {"word", verdict->word},
+            {"reason", verdict->finding},
+            {"ignored", verdict->ignored}};
+}
+
+ordered_json errorsAsJson(const Inventory& inventory) {
+    ordered_json list = ordered_json::array();
+    for (const ClassAnswer& answer : inventory)
+        if (answer.response.rc != CMPI_RC_OK)
+            list.push_back({{"class", answer.className},
+                            {"status", static_cast<int>(answer.response.rc)},
+                            {"message", answer.response.message.value_or("")}});
+    return list;
+}
+
+ordered_json checkAsJson(const CheckSummary& check) {
+    return {{"status", check.status},
+            {"level", statusName(check.status)},
+            {"text", check.text},
+            {"performance", check.numbers}};
+}
+
 }  // namespace
 
-std::string jsonView(const Inventory& inventory) {
-    ordered_json document = ordered_json::object();
+std::string jsonView(const Inventory& inventory, const CheckPolicy& policy,
+                     const CheckSummary* check) {
+    ordered_json document = {{"format", kFormat}};
+    if (check) document["check"] = checkAsJson(*check);
+    document["errors"] = errorsAsJson(inventory);
     for (const ClassAnswer& answer : inventory) {
         ordered_json& list = document[answer.className] = ordered_json::array();
         for (const Instance& instance : answer.response.instances)
             list.push_back({{"path", instance.path.text()},
                             {"keys", valuesAsJson(instance.path.keys)},
-                            {"properties", valuesAsJson(instance.properties)}});
+                            {"properties", valuesAsJson(instance.properties)},
+                            {"verdict", verdictAsJson(policy.judge(answer.className, instance))}});
     }
     // A vendor's text need not be valid UTF-8.
-    return document.dump(2, ' ', false, ordered_json::error_handler_t::replace) + "\n";
+    return document.dump(2, ' ', true, ordered_json::error_handler_t::replace) + "\n";
 }
 
 }  // namespace testbed

@@ -3,12 +3,15 @@
 
 #include <string>
 
+#include "check_summary.h"
 #include "inventory.h"
 
 namespace testbed {
 
-/// One member for each class: a list of objects with "path", "keys" and "properties". Ends with a
-/// line end.
-std::string jsonView(const Inventory& inventory);
+/// "format": 1; one member for each class, a list of objects with "path", "keys", "properties" and
+/// "verdict"; "errors", the classes that were answered with a status; and, with a summary, "check".
+/// ASCII, everything else escaped. Ends with a line end.
+std::string jsonView(const Inventory& inventory, const CheckPolicy& policy = {},
+                     const CheckSummary* check = nullptr);
 
 }  // namespace testbed

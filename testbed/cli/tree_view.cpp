@@ -5,13 +5,25 @@
 
 #include "cim_words.h"
 #include "colour.h"
+#include "printable.h"
+#include "terminal.h"
 
 namespace testbed {
 namespace {
 
+/// However narrow the terminal is, texts get that many columns.
+constexpr std::size_t kFewestColumns = 20;
+
+/// An element's text and its colour.
+struct Line {
+    std::string text;
+    std::optional<CheckLevel> level = std::nullopt;
+    std::size_t paintedFrom = 0;
+};
+
 /// A line of the tree with the lines beneath it.
 struct Branch {
-    std::string text;
+    Line line;
     std::vector<Branch> children;
 };
 
@@ -20,25 +32,21 @@ struct Root {
     Branch branch;
 };
 
-/// Text of a vendor on a terminal: no control characters.
-std::string printable(std::string text) {
-    for (char& c : text)
-        if (static_cast<unsigned char>(c) < 0x20 || c == 0x7f) c = '?';
-    return text;
-}
+/// What the lines of a tree hang on.
+struct Twigs {
+    const char* inner;
+    const char* last;
+    const char* passing;
+};
+
+constexpr Twigs kLines = {"├─ ", "└─ ", "│  "};
+constexpr Twigs kAsciiLines = {"|- ", "`- ", "|  "};
+constexpr const char* kBlank = "   ";
+constexpr std::size_t kTwigColumns = 3;
 
 std::string textOf(const Instance& instance, const char* property) {
     const CimValue* value = instance.find(property);
     return value ? value->asString() : "";
-}
-
-/// The key that says to which controller an instance belongs, without its prefix.
-std::optional<std::string> identityOf(const Instance& instance, const ServedClass& served) {
-    const CimValue* key = instance.path.findKey(served.identityKey);
-    if (!key) key = instance.find(served.identityKey);
-    const std::string prefix = served.prefix;
-    if (!key || !key->asString().starts_with(prefix)) return std::nullopt;
-    return key->asString().substr(prefix.size());
 }
 
 void appendState(std::string& text, const Instance& instance, const char* property,
@@ -59,30 +67,35 @@ std::string statesOf(const Instance& instance) {
     return text.empty() ? "" : "  [" + text + "]";
 }
 
-std::string lineOf(const Instance& instance, const ServedClass& served, bool colours) {
+std::string shown(const std::string& text, const TreeStyle& style) {
+    return style.ascii ? printableAscii(text) : printable(text);
+}
+
+Line lineOf(const Instance& instance, const ServedClass& served, const TreeStyle& style) {
     std::string name = textOf(instance, "VersionString");
     if (name.empty()) name = textOf(instance, "ElementName");
     if (name.empty()) name = instance.path.text();
-    const std::string states = statesOf(instance);
-    const auto verdict = colours ? judge(served.name, instance) : std::nullopt;
-    if (!verdict) return printable(name + states);
+    name = shown(name, style);
+    const std::string text = name + statesOf(instance);
+    const auto verdict = style.colours ? style.policy.judge(served.name, instance) : std::nullopt;
+    if (!verdict) return {text};
     // What is well is not to be louder than what is not.
-    if (verdict->level == CheckLevel::Ok)
-        return printable(name) + painted(printable(states), verdict->level);
-    return painted(printable(name + states), verdict->level);
+    return {text, verdict->level, verdict->level == CheckLevel::Ok ? name.size() : 0};
 }
 
-bool belongsTo(const std::string& identity, const ServedClass& served,
-               const std::string& controllerId) {
-    return served.isDevice ? identity.starts_with(controllerId + "_") : identity == controllerId;
+/// False for what the style leaves out.
+bool isShown(const Instance& instance, const ServedClass& served, const TreeStyle& style) {
+    if (!style.problemsOnly) return true;
+    const auto verdict = style.policy.judge(served.name, instance);
+    return verdict && verdict->level != CheckLevel::Ok && !verdict->ignored;
 }
 
 /// The controller with the longest id that fits; NULL without one.
 Root* ownerOf(std::vector<Root>& roots, const Instance& instance, const ServedClass& served) {
-    const auto identity = identityOf(instance, served);
+    const auto identity = identityOf(served, instance);
     Root* owner = nullptr;
     for (Root& root : roots) {
-        if (!identity || !belongsTo(*identity, served, root.controllerId)) continue;
+        if (!identity || !belongsTo(served, *identity, root.controllerId)) continue;
         if (!owner || owner->controllerId.size() < root.controllerId.size()) owner = &root;
     }
     return owner;
@@ -90,65 +103,119 @@ Root* ownerOf(std::vector<Root>& roots, const Instance& instance, const ServedCl
 
 /// The branch of a class beneath a root's, made when it is first needed.
 Branch& section(std::vector<Branch>& children, const std::string& heading) {
-    const auto found = std::find_if(children.begin(), children.end(),
-                                    [&](const Branch& child) { return child.text == heading; });
+    const auto found = std::find_if(children.begin(), children.end(), [&](const Branch& child) {
+        return child.line.text == heading;
+    });
     if (found != children.end()) return *found;
-    return children.emplace_back(Branch{heading, {}});
+    return children.emplace_back(Branch{{heading}, {}});
 }
 
-void print(std::string& out, const std::vector<Branch>& branches, const std::string& indent) {
-    for (const Branch& branch : branches) {
-        const bool last = &branch == &branches.back();
-        out += indent + (last ? "└─ " : "├─ ") + branch.text + "\n";
-        print(out, branch.children, indent + (last ? "   " : "│  "));
-    }
+std::string paintedPart(const Line& line, const TextPart& part) {
+    const std::string text = line.text.substr(part.begin, part.end - part.begin);
+    if (!line.level || line.paintedFrom >= part.end) return text;
+    const std::size_t plain = line.paintedFrom > part.begin ? line.paintedFrom - part.begin : 0;
+    return text.substr(0, plain) + painted(text.substr(plain), *line.level);
 }
+
+class Printer {
+public:
+    explicit Printer(const TreeStyle& style)
+        : style_(style), twigs_(style.ascii ? kAsciiLines : kLines) {}
+
+    void printRoot(const Branch& root) {
+        print(root.line, "", root.children.empty() ? "" : twigs_.passing, 0);
+        printChildren(root.children, "", 1);
+    }
+    std::string take() { return std::move(out_); }
+
+private:
+    void printChildren(const std::vector<Branch>& branches, const std::string& indent,
+                       std::size_t depth) {
+        for (const Branch& branch : branches) {
+            const bool last = &branch == &branches.back();
+            const std::string below = indent + (last ? kBlank : twigs_.passing);
+            const bool leaf = branch.children.empty();
+            print(branch.line, indent + (last ? twigs_.last : twigs_.inner),
+                  below + (leaf ? "" : twigs_.passing), depth);
+            printChildren(branch.children, below, depth + 1);
+        }
+    }
+
+    /// A line with what stands before it, and before what is folded of it.
+    void print(const Line& line, const std::string& first, const std::string& rest,
+               std::size_t depth) {
+        const std::string continued = rest + "  ";
+        const std::size_t before = depth * kTwigColumns;
+        const auto room = [&](std::size_t used) {
+            if (style_.columns == 0) return line.text.size() + 1;
+            return std::max(style_.columns, used + kFewestColumns) - used;
+        };
+        const auto parts =
+            foldedLines(line.text, room(before), room(std::max(before, kTwigColumns) + 2));
+        for (const TextPart& part : parts)
+            out_ += (&part == &parts.front() ? first : continued) + paintedPart(line, part) + "\n";
+    }
+
+    const TreeStyle& style_;
+    const Twigs& twigs_;
+    std::string out_;
+};
 
 /// Headings get the number of what is beneath them.
 void countChildren(std::vector<Branch>& sections) {
     for (Branch& branch : sections)
-        branch.text += " (" + std::to_string(branch.children.size()) + ")";
+        branch.line.text += " (" + std::to_string(branch.children.size()) + ")";
 }
 
-std::vector<Root> controllersOf(const Inventory& inventory, bool colours) {
+std::vector<Root> controllersOf(const Inventory& inventory, const TreeStyle& style) {
     std::vector<Root> roots;
     const ServedClass& controllers = servedClasses().front();
     for (const ClassAnswer& answer : inventory) {
         if (!sameName(answer.className, controllers.name)) continue;
         for (const Instance& instance : answer.response.instances)
-            roots.push_back({identityOf(instance, controllers).value_or(""),
-                             {lineOf(instance, controllers, colours), {}}});
+            roots.push_back({identityOf(controllers, instance).value_or(""),
+                             {lineOf(instance, controllers, style), {}}});
     }
     return roots;
 }
 
+std::string nothingText(const Inventory& inventory, const TreeStyle& style) {
+    std::size_t count = 0;
+    for (const ClassAnswer& answer : inventory) count += answer.response.instances.size();
+    if (!style.problemsOnly || count == 0) return "nothing\n";
+    return "no problems among " + std::to_string(count) + " elements\n";
+}
+
 }  // namespace
 
-std::string treeView(const Inventory& inventory, bool colours) {
-    std::vector<Root> roots = controllersOf(inventory, colours);
+TreeStyle TreeStyle::ofOutput(bool colours) {
+    return {.colours = colours, .ascii = !localeIsUtf8(), .columns = outputColumns()};
+}
+
+std::string treeView(const Inventory& inventory, const TreeStyle& style) {
+    std::vector<Root> roots = controllersOf(inventory, style);
     std::vector<Branch> strays;
     for (const ClassAnswer& answer : inventory) {
         const ServedClass* served = findServedClass(answer.className);
         if (!served || served == &servedClasses().front()) continue;
         for (const Instance& instance : answer.response.instances) {
+            if (!isShown(instance, *served, style)) continue;
             Root* owner = ownerOf(roots, instance, *served);
             std::vector<Branch>& parent = owner ? owner->branch.children : strays;
             section(parent, served->heading)
-                .children.push_back({lineOf(instance, *served, colours), {}});
+                .children.push_back({lineOf(instance, *served, style), {}});
         }
     }
-    std::string out;
+    Printer printer(style);
     for (Root& root : roots) {
+        if (style.problemsOnly && root.branch.children.empty()) continue;
         countChildren(root.branch.children);
-        out += root.branch.text + "\n";
-        print(out, root.branch.children, "");
+        printer.printRoot(root.branch);
     }
     countChildren(strays);
-    for (const Branch& branch : strays) {
-        out += branch.text + "\n";
-        print(out, branch.children, "");
-    }
-    return out.empty() ? "nothing\n" : out;
+    for (const Branch& branch : strays) printer.printRoot(branch);
+    std::string out = printer.take();
+    return out.empty() ? nothingText(inventory, style) : out;
 }
 
 }  // namespace testbed

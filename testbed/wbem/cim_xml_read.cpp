@@ -82,6 +82,9 @@ void parseXml(const std::string& text, pugi::xml_document& document) {
     constexpr unsigned kFlags = pugi::parse_default | pugi::parse_ws_pcdata;
     // The parser would take the end of a text for the end of the document.
     if (text.find('\0') != std::string::npos) throw CimXmlError("a NUL character in the message");
+    for (const char mark : {'<', '='})
+        if (std::count(text.begin(), text.end(), mark) > kMostMarks)
+            throw CimXmlError("more than " + std::to_string(kMostMarks) + " characters " + mark);
     const pugi::xml_parse_result result =
         document.load_buffer(text.data(), text.size(), kFlags, pugi::encoding_utf8);
     if (!result)
@@ -195,7 +198,11 @@ Instance readNamedInstance(pugi::xml_node node, const std::string& nameSpace) {
     Instance instance = readInstance(requiredChild(node, "INSTANCE"), nameSpace);
     for (const pugi::xml_node child : node.children()) {
         if (child.type() != pugi::node_element || isElement(child, "INSTANCE")) continue;
-        instance.path = readObjectPath(child, nameSpace);
+        ObjectPath path = readObjectPath(child, nameSpace);
+        if (!sameName(path.className, instance.path.className))
+            refuse(node, "an instance of " + xmlText(instance.path.className) +
+                             " with the name of one of " + xmlText(path.className));
+        instance.path = std::move(path);
         break;
     }
     return instance;

@@ -2,6 +2,7 @@
 // them. What cannot be understood throws CimXmlError with a text for people.
 #pragma once
 
+#include <cstddef>
 #include <pugixml.hpp>
 #include <string>
 
@@ -12,9 +13,13 @@ namespace testbed {
 
 /// Elements within elements, beyond which a message is refused.
 constexpr int kDeepestNesting = 64;
+/// Characters < and = in a message, of which each tag has one of the first kind and each attribute
+/// one of the second: what bounds the memory that a message takes.
+constexpr std::ptrdiff_t kMostMarks = 600'000;
 
-/// Reads a message into `document`. Throws CimXmlError when it is not well-formed or nested deeper
-/// than kDeepestNesting. No entity but those of XML itself is expanded.
+/// Reads a message into `document`. Throws CimXmlError when it is not well-formed, nested deeper
+/// than kDeepestNesting or has more than kMostMarks tags or attributes. No entity but those of XML
+/// itself is expanded.
 void parseXml(const std::string& text, pugi::xml_document& document);
 
 /// The element's text, of all its pieces, nothing trimmed.

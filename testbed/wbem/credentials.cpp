@@ -1,9 +1,11 @@
 #include "credentials.h"
 
+#include <cerrno>
 #include <fstream>
 #include <optional>
 #include <stdexcept>
 #include <string_view>
+#include <system_error>
 
 #include "cim_object.h"
 
@@ -50,11 +52,16 @@ bool isAuthorized(const std::string& header, const Credentials& expected) {
 }
 
 std::string readPassword(const std::string& file) {
+    errno = 0;
     std::ifstream stream(file);
     std::string password;
     std::getline(stream, password);
+    if (!stream && errno != 0)
+        throw std::runtime_error("no password in " + file + ": " +
+                                 std::generic_category().message(errno));
     if (password.ends_with('\r')) password.pop_back();
-    if (password.empty()) throw std::runtime_error("no password in " + file);
+    if (password.empty())
+        throw std::runtime_error("no password in " + file + ": its first line is empty");
     return password;
 }
 

@@ -14,6 +14,9 @@
 #include <boost/beast/core/tcp_stream.hpp>
 #include <boost/beast/http.hpp>
 #include <boost/beast/ssl.hpp>
+#include <cerrno>
+#include <fstream>
+#include <system_error>
 #include <utility>
 
 namespace testbed {
@@ -50,17 +53,26 @@ bool isOfTls(const beast::error_code& error) {
     throw WbemError(what + ": " + error.message());
 }
 
+void requireReadable(const std::string& file) {
+    errno = 0;
+    std::ifstream stream(file);
+    if (stream && (stream.peek(), errno == 0)) return;
+    throw WbemError(file + ": " + std::generic_category().message(errno));
+}
+
 ssl::context contextFor(const TlsOptions& options) {
     ssl::context context(ssl::context::tls_client);
     SSL_CTX_set_min_proto_version(context.native_handle(), TLS1_2_VERSION);
     if (!options.verify) return context;
     context.set_verify_mode(ssl::verify_peer);
     beast::error_code error;
-    if (options.authorities.empty())
+    if (options.authorities.empty()) {
         context.set_default_verify_paths(error);
-    else
-        context.load_verify_file(options.authorities, error);
-    if (error) throw WbemError(options.authorities + ": no certificates: " + error.message());
+        return context;
+    }
+    requireReadable(options.authorities);
+    context.load_verify_file(options.authorities, error);
+    if (error) throw WbemError(options.authorities + ": no certificates in PEM form in this file");
     return context;
 }
 
@@ -81,6 +93,7 @@ http::request<http::string_body> messageFrom(const PostRequest& request) {
     http::request<http::string_body> message(http::verb::post, request.path, 11);
     message.set(http::field::host, request.authority);
     message.keep_alive(false);
+    message.set(http::field::te, "trailers");  // a status may follow the body
     for (const auto& [name, value] : request.headers) message.insert(name, value);
     message.body() = request.body;
     message.prepare_payload();

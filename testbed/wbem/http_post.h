@@ -39,7 +39,7 @@ struct PostBounds {
 struct PostAnswer {
     int status = 0;
     std::string reason;
-    HttpHeaders headers;
+    HttpHeaders headers;  ///< trailers, which follow a chunked body, among them
     std::string body;
 
     /// The first header of that name, without regard to case; "" without one.

@@ -1,9 +1,10 @@
 #include "wbem_client.h"
 
 #include <algorithm>
+#include <random>
 #include <utility>
 
-#include "cim_xml_read.h"
+#include "cim_response.h"
 #include "cim_xml_write.h"
 #include "xml_text.h"
 
@@ -12,16 +13,22 @@ namespace {
 
 /// Characters of a server's own words that are repeated in a message.
 constexpr std::size_t kLongestQuote = 200;
-constexpr unsigned kLargestStatus = 255;
+
+/// A number of eight digits that no earlier answer of this server is likely to have.
+std::string newMessageId() {
+    static std::mt19937 random(std::random_device{}());
+    return std::to_string(std::uniform_int_distribution(10'000'000, 99'999'999)(random));
+}
 
 /// A request's message with its operation, to which parameters are added.
 struct Operation {
-    Operation(const char* method, const std::string& nameSpace) {
+    Operation(const char* method, const std::string& nameSpace)
+        : asked{method, newMessageId(), nameSpace, false} {
         pugi::xml_node cim = document.append_child("CIM");
         cim.append_attribute("CIMVERSION") = "2.0";
         cim.append_attribute("DTDVERSION") = "2.0";
         pugi::xml_node message = cim.append_child("MESSAGE");
-        message.append_attribute("ID") = "1";
+        message.append_attribute("ID") = asked.id.c_str();
         message.append_attribute("PROTOCOLVERSION") = "1.0";
         call = message.append_child("SIMPLEREQ").append_child("IMETHODCALL");
         call.append_attribute("NAME") = method;
@@ -45,6 +52,7 @@ struct Operation {
         writeValue(parameter("PropertyList"), CimValue::array(CMPI_string, std::move(names)));
     }
 
+    AskedOperation asked;
     pugi::xml_document document;
     pugi::xml_node call;
 };
@@ -87,59 +95,63 @@ std::string base64(std::string_view bytes) {
     return encoded;
 }
 
+/// Headers with which a server says that it failed, whatever HTTP's status is.
+constexpr const char* kErrorHeaders[] = {"CIMError", "PGErrorDetail"};
+
+bool saysError(const PostAnswer& answer) {
+    return std::any_of(std::begin(kErrorHeaders), std::end(kErrorHeaders),
+                       [&](const char* header) { return !answer.header(header).empty(); });
+}
+
 /// What an answer without a CIM message means.
-[[noreturn]] void refuse(const PostAnswer& answer) {
+std::string refusalOf(const PostAnswer& answer) {
     std::string text = "HTTP status " + std::to_string(answer.status);
     if (!answer.reason.empty()) text += " " + quoted(answer.reason);
     if (answer.status == 401) text += ": user name or password are missing or wrong";
     if (answer.status / 100 == 3) text += ": it is at " + quoted(answer.header("Location"));
-    for (const char* header : {"CIMError", "PGErrorDetail"})
+    for (const char* header : kErrorHeaders)
         if (const std::string& detail = answer.header(header); !detail.empty())
             text += ", " + std::string(header) + " " + quoted(detail);
-    throw WbemError(text);
+    return text;
 }
 
-pugi::xml_node methodResponse(const pugi::xml_document& document) {
-    const pugi::xml_node cim = document.child("CIM");
-    if (!cim) throw CimXmlError("no CIM message");
-    const pugi::xml_node response =
-        requiredChild(requiredChild(requiredChild(cim, "MESSAGE"), "SIMPLERSP"), "IMETHODRESPONSE");
+/// The status in the headers or behind the body; OK without one. A text without a code fails, too.
+Response statusIn(const PostAnswer& answer) {
+    const std::string description = answer.header("CIMStatusCodeDescription");
+    Response response;
+    bool told = false;
+    for (const auto& [name, value] : answer.headers) {
+        if (!sameName(name, "CIMStatusCode")) continue;
+        told = true;
+        if (response.rc == CMPI_RC_OK) readHttpStatus(value, description, response);
+    }
+    if (!told && !description.empty()) readHttpStatus("", description, response);
     return response;
 }
 
-void readError(pugi::xml_node error, Response& response) {
-    const unsigned code = error.attribute("CODE").as_uint();
-    // An error without a number of CIM's is an error all the same.
-    const bool known = code > 0 && code <= kLargestStatus;
-    response.rc = known ? static_cast<CMPIrc>(code) : CMPI_RC_ERR_FAILED;
-    if (const pugi::xml_attribute text = error.attribute("DESCRIPTION"))
-        response.message = text.value();
-}
-
-bool isPath(std::string_view name) {
-    return name == "INSTANCENAME" || name == "INSTANCEPATH" || name == "LOCALINSTANCEPATH";
-}
-
-void readReturnValue(pugi::xml_node value, const std::string& nameSpace, Response& response) {
-    for (const pugi::xml_node node : value.children()) {
-        if (node.type() != pugi::node_element) continue;
-        const std::string_view name = node.name();
-        if (isPath(name))
-            response.paths.push_back(readObjectPath(node, nameSpace));
-        else if (name == "OBJECTPATH")
-            response.paths.push_back(readReference(node, nameSpace));
-        else
-            response.instances.push_back(readNamedInstance(node, nameSpace));
-    }
+void replaceAll(std::string& text, const std::string& part) {
+    constexpr std::string_view kHidden = "***";
+    if (part.empty()) return;
+    for (std::size_t at = 0; (at = text.find(part, at)) != std::string::npos; at += kHidden.size())
+        text.replace(at, part.size(), kHidden);
 }
 
 }  // namespace
 
 WbemClient::WbemClient(WbemUrl url, WbemClientOptions options)
-    : url_(std::move(url)), options_(std::move(options)) {}
+    : url_(std::move(url)), options_(std::move(options)) {
+    if (const auto& known = url_.credentials) token_ = base64(known->user + ":" + known->password);
+}
 
-std::string WbemClient::post(const std::string& method, const std::string& nameSpace,
-                             const std::string& body) const {
+std::string WbemClient::withoutSecrets(std::string text) const {
+    if (!url_.credentials) return text;
+    replaceAll(text, token_);
+    replaceAll(text, url_.credentials->password);
+    return text;
+}
+
+PostAnswer WbemClient::post(const std::string& method, const std::string& nameSpace,
+                            const std::string& body) {
     PostRequest request{url_.host,
                         url_.port,
                         url_.tls ? std::optional(options_.tls) : std::nullopt,
@@ -151,42 +163,38 @@ std::string WbemClient::post(const std::string& method, const std::string& nameS
                          {"CIMMethod", method},
                          {"CIMObject", percentEncoded(nameSpace)}},
                         body};
-    if (const auto& known = url_.credentials)
-        request.headers.emplace_back("Authorization",
-                                     "Basic " + base64(known->user + ":" + known->password));
-    PostAnswer answer = httpPost(request, {options_.deadline, options_.largestAnswer});
-    if (answer.status != 200) refuse(answer);
-    return std::move(answer.body);
+    if (url_.credentials) request.headers.emplace_back("Authorization", "Basic " + token_);
+    PostAnswer answer = httpPost(request, {options_.deadline, options_.largestAnswer - received_});
+    received_ += answer.body.size();
+    if (answer.status != 200 || saysError(answer))
+        throw WbemError(withoutSecrets(refusalOf(answer)));
+    return answer;
 }
 
-void WbemClient::call(const std::string& method, const std::string& nameSpace,
-                      const pugi::xml_document& request, Response& response) const {
-    const std::string answer = post(method, nameSpace, serialize(request));
+Response WbemClient::call(const AskedOperation& asked, const pugi::xml_document& request) {
+    const PostAnswer answer = post(asked.method, asked.nameSpace, serialize(request));
+    Response response = statusIn(answer);
     try {
-        pugi::xml_document document;
-        parseXml(answer, document);
-        const pugi::xml_node node = methodResponse(document);
-        if (const pugi::xml_node error = node.child("ERROR"))
-            readError(error, response);
-        else
-            readReturnValue(node.child("IRETURNVALUE"), nameSpace, response);
+        // The body of an answer that failed may be empty, or end anywhere.
+        if (response.rc == CMPI_RC_OK) response = readCimResponse(answer.body, asked);
     } catch (const CimXmlError& error) {
-        throw WbemError("the answer is no CIM-XML: " + quoted(error.what()));
+        throw WbemError(withoutSecrets("the answer is no CIM-XML: " + quoted(error.what())));
     }
+    if (response.message) response.message = withoutSecrets(*response.message);
+    return response;
 }
 
 Response WbemClient::enumerateInstanceNames(const std::string& className,
-                                            const std::string& nameSpace) const {
+                                            const std::string& nameSpace) {
     Operation operation("EnumerateInstanceNames", nameSpace);
+    operation.asked.namesOnly = true;
     writeClassName(operation.parameter("ClassName"), className);
-    Response response;
-    call("EnumerateInstanceNames", nameSpace, operation.document, response);
-    return response;
+    return call(operation.asked, operation.document);
 }
 
 Response WbemClient::enumerateInstances(const std::string& className,
                                         const PropertyList& properties,
-                                        const std::string& nameSpace) const {
+                                        const std::string& nameSpace) {
     Operation operation("EnumerateInstances", nameSpace);
     writeClassName(operation.parameter("ClassName"), className);
     // Servers differ in what they take for granted.
@@ -195,20 +203,20 @@ Response WbemClient::enumerateInstances(const std::string& className,
     operation.flag("IncludeQualifiers", false);
     operation.flag("IncludeClassOrigin", false);
     operation.propertyList(properties);
-    Response response;
-    call("EnumerateInstances", nameSpace, operation.document, response);
-    return response;
+    return call(operation.asked, operation.document);
 }
 
-Response WbemClient::getInstance(const ObjectPath& path, const PropertyList& properties) const {
+Response WbemClient::getInstance(const ObjectPath& path, const PropertyList& properties) {
     Operation operation("GetInstance", path.nameSpace);
     writeInstanceName(operation.parameter("InstanceName"), path);
     operation.flag("LocalOnly", false);
     operation.flag("IncludeQualifiers", false);
     operation.flag("IncludeClassOrigin", false);
     operation.propertyList(properties);
-    Response response;
-    call("GetInstance", path.nameSpace, operation.document, response);
+    Response response = call(operation.asked, operation.document);
+    if (response.rc == CMPI_RC_OK && response.instances.size() != 1)
+        throw WbemError("the answer has " + std::to_string(response.instances.size()) +
+                        " instances instead of one");
     // A got instance comes without its name.
     for (Instance& instance : response.instances) instance.path = path;
     return response;

@@ -8,11 +8,12 @@ namespace testbed {
 namespace {
 
 constexpr unsigned short kHttpsPort = 5989;
+constexpr std::string_view kServersOwnPath = "cimom";
 
 [[noreturn]] void refuse(const std::string& why) {
     // The text itself is left out: it may hold a password.
     throw WbemError("the URL " + why +
-                    "; it looks like http://[user:password@]host[:5988][/cimom]");
+                    "; it looks like http://[user:password@]host[:5988][/root/cimv2]");
 }
 
 /// Removes the prefix, without regard to case. False when the text begins otherwise.
@@ -81,6 +82,22 @@ bool isPrintable(std::string_view text) {
     return std::all_of(text.begin(), text.end(), [](char c) { return c > ' ' && c < 0x7f; });
 }
 
+/// The namespace that the part behind the host names; "" for the server's own path and for none.
+std::string namespaceIn(std::string_view path) {
+    if (path.find_first_of("?#") != std::string_view::npos)
+        refuse(
+            "has a ? or # behind its host; in a user name or password, /, ? and # are written "
+            "%2F, %3F and %23");
+    while (path.starts_with('/')) path.remove_prefix(1);
+    while (path.ends_with('/')) path.remove_suffix(1);
+    if (path == kServersOwnPath) return "";
+    const std::string nameSpace = percentDecoded(path);
+    if (nameSpace.find(':') != std::string::npos)
+        refuse("names a class behind its namespace, which --class does");
+    if (!isPrintable(nameSpace)) refuse("has a namespace with blanks or control characters");
+    return nameSpace;
+}
+
 }  // namespace
 
 std::string WbemUrl::authority() const {
@@ -98,15 +115,16 @@ WbemUrl parseWbemUrl(const std::string& text) {
     } else if (!takePrefix(rest, "http://")) {
         refuse("begins neither with http:// nor with https://");
     }
-    // An unencoded / may be part of a password, so what ends it is looked for first.
-    const std::size_t at = rest.rfind('@');
-    if (at != std::string_view::npos) {
-        url.credentials = credentialsIn(rest.substr(0, at));
-        rest.remove_prefix(at + 1);
+    std::string_view authority = rest.substr(0, rest.find_first_of("/?#"));
+    const std::string_view path = rest.substr(authority.size());
+    if (const std::size_t at = authority.rfind('@'); at != std::string_view::npos) {
+        const std::string_view userInfo = authority.substr(0, at);
+        url.credentials = credentialsIn(userInfo);
+        url.hasPassword = userInfo.find(':') != std::string_view::npos;
+        authority.remove_prefix(at + 1);
     }
-    const std::size_t slash = std::min(rest.find('/'), rest.size());
-    readAuthority(rest.substr(0, slash), url);
-    if (slash + 1 < rest.size()) url.path = rest.substr(slash);
+    readAuthority(authority, url);
+    url.nameSpace = namespaceIn(path);
     return url;
 }
 

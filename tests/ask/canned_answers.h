@@ -10,16 +10,33 @@ inline std::string http(const std::string& body, const std::string& status = "20
            headers + "Content-Length: " + std::to_string(body.size()) + "\r\n\r\n" + body;
 }
 
-/// A CIM message with that in its IMETHODRESPONSE.
-inline std::string cimResponse(const std::string& content) {
-    return "<?xml version=\"1.0\" encoding=\"utf-8\"?>\n<CIM CIMVERSION=\"2.0\" "
-           "DTDVERSION=\"2.0\"><MESSAGE ID=\"1\" PROTOCOLVERSION=\"1.0\"><SIMPLERSP>"
-           "<IMETHODRESPONSE NAME=\"EnumerateInstances\">" +
-           content + "</IMETHODRESPONSE></SIMPLERSP></MESSAGE></CIM>\n";
+/// Stands for the id of the request's message, and is as long.
+inline constexpr const char* kSameId = "asked-id";
+
+/// The answer with the id of the request in the place of kSameId.
+inline std::string withId(std::string answer, const std::string& request) {
+    const std::string begin = "<MESSAGE ID=\"";
+    const std::string id = request.substr(request.find(begin) + begin.size(), 8);
+    const std::size_t at = answer.find(kSameId);
+    return at == std::string::npos || request.find(begin) == std::string::npos
+               ? answer
+               : answer.replace(at, id.size(), id);
 }
 
-inline std::string cimInstances(const std::string& instances) {
-    return cimResponse("<IRETURNVALUE>" + instances + "</IRETURNVALUE>");
+/// A CIM message with that in its IMETHODRESPONSE.
+inline std::string cimResponse(const std::string& content,
+                               const std::string& method = "EnumerateInstances") {
+    return "<?xml version=\"1.0\" encoding=\"utf-8\"?>\n<CIM CIMVERSION=\"2.0\" "
+           "DTDVERSION=\"2.0\"><MESSAGE ID=\"" +
+           std::string(kSameId) +
+           "\" PROTOCOLVERSION=\"1.0\"><SIMPLERSP>"
+           "<IMETHODRESPONSE NAME=\"" +
+           method + "\">" + content + "</IMETHODRESPONSE></SIMPLERSP></MESSAGE></CIM>\n";
+}
+
+inline std::string cimInstances(const std::string& instances,
+                                const std::string& method = "EnumerateInstances") {
+    return cimResponse("<IRETURNVALUE>" + instances + "</IRETURNVALUE>", method);
 }
 
 inline std::string cimError(int code, const std::string& description) {

@@ -144,6 +144,13 @@ TEST(CheckRules, AbsentAndNullValuesAreNoGoodSign) {
     EXPECT_EQ(judge(kDrive, bare)->level, kWarning);
 }
 
+TEST(CheckRules, SeveralStatesAreNoGoodSign) {
+    Instance drive = element("d - ONLINE", 2, 5);
+    drive.set("OperationalStatus", CimValue::uint16Array({2, 6}));
+    EXPECT_EQ(judge(kDrive, drive)->level, kWarning);
+    EXPECT_EQ(judge(kBattery, drive)->level, kWarning);
+}
+
 TEST(CheckRules, ControllersAreNotJudged) {
     EXPECT_FALSE(judge("Tovexa_PlexorController", element("c", 6, 30)));
     EXPECT_FALSE(judge("Tovexa_PlexorSoftwareIdentity", element("s", 6, 30)));

@@ -30,7 +30,7 @@ TEST(Colour, TreeShowsWhatACheckWouldSay) {
     add("a - ONLINE", 2, 5);
     add("b - REBUILD", 2, 5);
     add("c\x1b[0m - FAILED", 6, 30);
-    EXPECT_EQ(treeView({drives}, true),
+    EXPECT_EQ(treeView({drives}, {.colours = true}),
               "Drives (3)\n"
               "├─ a - ONLINE\x1b[32m  [health ok, status ok]\x1b[0m\n"
               "├─ \x1b[33mb - REBUILD  [health ok, status ok]\x1b[0m\n"
@@ -42,7 +42,8 @@ TEST(Colour, ControllersHaveNone) {
     ClassAnswer controllers{"Tovexa_PlexorController", {}};
     controllers.response.instances.push_back(
         element("Tovexa_PlexorController", "x", "Controller", 6, 30));
-    EXPECT_EQ(treeView({controllers}, true), "Controller  [health failed, status error]\n");
+    EXPECT_EQ(treeView({controllers}, {.colours = true}),
+              "Controller  [health failed, status error]\n");
 }
 
 /// Standard output is a terminal as long as it lives.

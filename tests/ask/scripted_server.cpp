@@ -9,6 +9,8 @@
 #include <cstdlib>
 #include <stdexcept>
 
+#include "canned_answers.h"
+
 namespace {
 
 /// Head and body of a request, as far as they come.
@@ -98,7 +100,7 @@ void ScriptedServer::answer(int connection) {
         before = before_;
         between = between_;
     }
-    const std::string text = script_(request);
+    const std::string text = withId(script_(request), request);
     if (!pause(before)) return;
     if (between.count() == 0) {
         sendAll(connection, text);

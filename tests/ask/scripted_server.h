@@ -11,7 +11,8 @@
 /// Listens on a free port of 127.0.0.1 and answers one connection after the other.
 class ScriptedServer {
 public:
-    /// What is sent for a request (head and body); the connection is closed afterwards.
+    /// What is sent for a request (head and body), with kSameId replaced; the connection is closed
+    /// afterwards.
     using Script = std::function<std::string(const std::string& request)>;
 
     explicit ScriptedServer(Script script);

@@ -4,7 +4,11 @@
 #include <netdb.h>
 #include <openssl/pem.h>
 
+#include <algorithm>
+
 #include "canned_answers.h"
+#include "scripted_server.h"
+#include "tool_process.h"
 #include "wbem_client.h"
 
 namespace testbed {
@@ -54,7 +58,8 @@ public:
         server->Post(".*", [this](const httplib::Request& request, httplib::Response& response) {
             asked = request;
             const std::string body =
-                cimInstances(namedInstance(kDrive, "DeviceID", "d", "d - ONLINE", 2, 5));
+                withId(cimInstances(namedInstance(kDrive, "DeviceID", "d", "d - ONLINE", 2, 5)),
+                       request.body);
             response.set_chunked_content_provider(
                 "application/xml", [body](std::size_t offset, httplib::DataSink& sink) {
                     sink.write(body.data() + offset,
@@ -142,7 +147,37 @@ TEST(Tls, FailuresAreExplained) {
     const Serving plain(std::make_unique<httplib::Server>());
     EXPECT_NE(failure(urlOf(plain, "https://"), {}).find("TLS failed"), std::string::npos);
     const std::string missing = failure(urlOf(plain, "https://"), {"/nowhere.pem", true});
-    EXPECT_EQ(missing.find("/nowhere.pem: no certificates: "), 0u) << missing;
+    EXPECT_EQ(missing, "/nowhere.pem: No such file or directory");
+    EXPECT_EQ(failure(urlOf(plain, "https://"), {"/", true}), "/: Is a directory");
+    EXPECT_EQ(failure(urlOf(plain, "https://"), {"/dev/null", true}),
+              "/dev/null: no certificates in PEM form in this file");
+}
+
+TEST(Tls, CheckIsUnknownWithoutTrust) {
+    const Identity other("DNS:other.example.com,IP:127.0.0.2");
+    const Serving secure(secureServer(other));
+    const Serving plain(std::make_unique<httplib::Server>());
+    const ScriptedServer cut([](const std::string&) { return "\x16\x03\x03"; });
+    const std::string silent = "https" + cut.url().substr(4);
+    const struct {
+        std::string arguments, text;
+    } cases[] = {
+        {urlOf(secure, "https://"), "the server's certificate is not trusted: self-signed "},
+        {urlOf(secure, "https://") + " -C " + other.file,
+         "the server's certificate is not trusted: IP address mismatch"},
+        {urlOf(secure, "https://") + " -C /nowhere.pem", "/nowhere.pem: No such file or directory"},
+        {urlOf(secure, "https://") + " --ca-file /dev/null", "/dev/null: no certificates"},
+        {urlOf(plain, "https://"), "TLS failed: "},
+        {silent, "no answer in time"},
+        {urlOf(secure, "http://"), "the server "},
+    };
+    for (const auto& [arguments, text] : cases) {
+        const Outcome outcome = runTool("ask --check --timeout 1 " + arguments);
+        EXPECT_EQ(outcome.status, 3) << arguments;
+        EXPECT_EQ(outcome.output.find("PLEXOR UNKNOWN - 127.0.0.1:"), 0u) << outcome.output;
+        EXPECT_NE(outcome.output.find(": " + text), std::string::npos) << outcome.output;
+        EXPECT_EQ(std::count(outcome.output.begin(), outcome.output.end(), '\n'), 1);
+    }
 }
 
 }  // namespace

@@ -45,8 +45,9 @@ Outcome runTool(const std::string& arguments) {
     if (!mkdtemp(directory.data())) throw std::runtime_error("no scratch directory");
     const fs::path output = fs::path(directory) / "out";
     const fs::path errors = fs::path(directory) / "err";
-    const std::string command =
-        std::string(TOOL) + " " + arguments + " >" + output.string() + " 2>" + errors.string();
+    // The tree is to have its lines wherever the tests run.
+    const std::string command = "LC_ALL=${PLEXOR_TEST_LOCALE-C.UTF-8} " + std::string(TOOL) + " " +
+                                arguments + " >" + output.string() + " 2>" + errors.string();
     const int status = std::system(command.c_str());
     Outcome outcome{WIFEXITED(status) ? WEXITSTATUS(status) : -1, contentOf(output),
                     contentOf(errors)};

@@ -22,6 +22,13 @@ expected_files() {
     for file in copyright messages.md operating.md scenarios.md; do
         echo "644 usr/share/doc/$package/$file"
     done
+    for file in plexor-icinga2.conf plexor-nagios.cfg; do
+        echo "644 usr/share/doc/$package/examples/$file"
+    done
+    for file in check_plexor plexor-testbed; do
+        echo "644 usr/share/bash-completion/completions/$file"
+    done
+    echo "755 usr/lib/nagios/plugins/check_plexor"
     echo "644 usr/share/man/man1/plexor-testbed.1"
     echo "644 usr/share/man/man5/plexor-scenario.5"
     echo "644 usr/share/man/man7/plexor-provider.7"
@@ -38,8 +45,8 @@ expected_files() {
     done
 }
 
-# ROOT: mode and path of what is there.
-found_files() { (cd "$1" && find . -type f -printf '%m %P\n'); }
+# ROOT: mode and path of what is there; of a link, the mode of what it leads to.
+found_files() { (cd "$1" && find -L . -type f -printf '%m %P\n'); }
 
 # EXPECTED FOUND, both lists: fails with the difference.
 expect_same_files() {

@@ -32,8 +32,11 @@ expect_sound_binaries "$scratch/root" "$libdir"
 listing=$(dpkg-deb -c "$deb")
 strangers=$(awk '$2 != "root/root"' <<<"$listing")
 [ -z "$strangers" ] || fail "not root's: $strangers"
-modes=$(awk '$1 !~ /^(drwxr-xr-x|-rwxr-xr-x|-rw-r--r--)$/' <<<"$listing")
+modes=$(awk '$1 !~ /^(drwxr-xr-x|-rwxr-xr-x|-rw-r--r--|lrwxrwxrwx)$/' <<<"$listing")
 [ -z "$modes" ] || fail "modes: $modes"
+links=$(sed -n 's/^l.* \(\.[^ ]* -> .*\)/\1/p' <<<"$listing")
+[ "$links" = './usr/lib/nagios/plugins/check_plexor -> ../../../bin/plexor-testbed' ] ||
+    fail "links: $links"
 
 # FIELD PATTERN
 expect_field() {

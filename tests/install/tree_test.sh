@@ -20,6 +20,12 @@ tree=$(env -i "$root/usr/bin/plexor-testbed" show --scenario "$root/scenario.jso
     fail "show: $tree"
 grep -qF 'RAID5 data Logical Volume 0 on controller C0' <<<"$tree" || fail "show: $tree"
 
+# The plugin finds itself, whatever directory it is called from.
+said=$(cd / && env -i "$root/usr/lib/nagios/plugins/check_plexor" -H 127.0.0.1 -p 1 2>&1) &&
+    fail "check_plexor: $said"
+[ "$said" = 'PLEXOR UNKNOWN - 127.0.0.1:1: no connection: Connection refused' ] ||
+    fail "check_plexor: $said"
+
 # Without its classes it says so.
 mv "$root/usr/share/plexor-provider/mof" "$root/mof"
 said=$(env -i "$root/usr/bin/plexor-testbed" show --scenario "$root/scenario.json" 2>&1) &&

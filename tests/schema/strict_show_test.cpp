@@ -65,8 +65,9 @@ TEST_F(StrictShow, EveryDeclaredPropertyHasAValue) {
     ASSERT_EQ(show("--json"), 0) << errors();
     const MofDocument schema = readMof(SCHEMA_DIR "/Tovexa_Plexor.mof");
     const json document = answer();
-    ASSERT_EQ(document.size(), 6u);
+    ASSERT_EQ(document.size(), 8u) << "six classes, the format and the errors";
     for (const auto& [className, instances] : document.items()) {
+        if (!className.starts_with("Tovexa_")) continue;
         const auto declared = declaredBy(schema, className);
         EXPECT_GE(declared.size(), 5u) << className;
         EXPECT_FALSE(instances.empty()) << className;

@@ -4,6 +4,7 @@
 
 #include <nlohmann/json.hpp>
 
+#include "inventory_changes.h"
 #include "json_view.h"
 
 namespace testbed {
@@ -79,6 +80,37 @@ TEST(TreeView, UnknownCodesAreShownAsNumbers) {
     odd.set("HealthState", CimValue::uint16(77));
     const std::string text = treeView({answer("Tovexa_PlexorController", {odd})});
     EXPECT_NE(text.find("[health 77, status degraded]"), std::string::npos) << text;
+}
+
+TEST(TreeView, FoldsToTheTerminal) {
+    const Inventory inventory = {
+        answer("Tovexa_PlexorController", {controller("C1")}),
+        answer(
+            "Tovexa_PlexorBattery",
+            {served("Tovexa_PlexorBattery", "DeviceID", "tvxControllerBatteryC1_0",
+                    "Battery 0 of a controller"),
+             served("Tovexa_PlexorBattery", "DeviceID", "tvxControllerBatteryC1_1", "b\xc3\xa4")})};
+    EXPECT_EQ(treeView(inventory, {.columns = 24}),
+              "Controller C1 (M)\n"
+              "│    [health ok, status\n"
+              "│    degraded]\n"
+              "└─ Batteries (2)\n"
+              "   ├─ Battery 0 of a\n"
+              "   │    controller\n"
+              "   └─ bä\n");
+    EXPECT_EQ(treeView(inventory, {.ascii = true}),
+              "Controller C1 (M)  [health ok, status degraded]\n"
+              "`- Batteries (2)\n"
+              "   |- Battery 0 of a controller\n"
+              "   `- b?\n");
+}
+
+TEST(ChangeLines, NameWhatChanged) {
+    Instance before = controller("C1"), after = before;
+    after.set("HealthState", CimValue::uint16(30));
+    EXPECT_EQ(changeLines({answer("Tovexa_PlexorController", {before})},
+                          {answer("Tovexa_PlexorController", {after})}),
+              std::vector<std::string>{"~ Controller C1 (M): HealthState 5 -> 30"});
 }
 
 TEST(JsonView, ListsInstancesByClass) {
