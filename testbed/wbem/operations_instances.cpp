@@ -8,7 +8,7 @@ namespace {
 
 ViewOptions viewOptions(const CimRequest& request) {
     ViewOptions options;
-    options.localOnly = request.flag("LocalOnly", true);
+    request.flag("LocalOnly", true);  // must be a truth value; what it says is ignored
     options.withQualifiers = request.flag("IncludeQualifiers", false);
     options.withClassOrigin = request.flag("IncludeClassOrigin", false);
     return options;
