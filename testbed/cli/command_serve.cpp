@@ -8,6 +8,7 @@
 #include <iostream>
 #include <memory>
 
+#include "access.h"
 #include "cim_server.h"
 #include "http_server.h"
 #include "input_lines.h"
@@ -22,8 +23,7 @@ namespace {
 struct ServeOptions {
     LiveOptions live;
     HttpServerOptions http;
-    std::string user;
-    std::string passwordFile;
+    AccessOptions access;
     bool log = false;
 };
 
@@ -38,11 +38,6 @@ Registration registrationOf(ProviderSession& session) {
     for (const ServedClass& served : servedClasses())
         registration.classes.emplace_back(served.name);
     return registration;
-}
-
-std::optional<Credentials> credentialsOf(const ServeOptions& options) {
-    if (options.user.empty()) return std::nullopt;
-    return Credentials{options.user, readPassword(options.passwordFile)};
 }
 
 class Serve : private LiveSession {
@@ -67,6 +62,9 @@ public:
             takeNewFile();
         }
     }
+
+    /// Requests that a fault keeps waiting would keep the server from ending.
+    ~Serve() override { session().broker().faults().endWaits(); }
 
 private:
     std::string urlOf(const ServeOptions& options) const {
@@ -98,7 +96,13 @@ void serve(const ServeOptions& options) {
                       [show = options.log](int, const std::string& line) {
                           if (show) std::cerr << line << "\n";
                       });
-    Serve server(options, credentialsOf(options), signals);
+    AccessOptions access = options.access;
+    access.address = options.http.address;
+    auto credentials = accessOf(access);
+    if (!credentials && isPublic(access.address))
+        std::cerr << "plexor-testbed: warning: everybody who reaches " << access.address
+                  << " may ask\n";
+    Serve server(options, std::move(credentials), signals);
     server.run();
     // A provider that does not return keeps the server from ending.
     signals.letNextOneEnd();
@@ -117,16 +121,19 @@ void addServeCommand(CLI::App& app, int& status) {
         ->capture_default_str();
     command->add_option("--port", options->http.port, "port to listen on; 0: any that is free")
         ->capture_default_str();
-    CLI::Option* user = command->add_option("--user", options->user,
+    CLI::Option* user = command->add_option("--user", options->access.user,
                                             "the only user who may ask (default: anybody)");
-    CLI::Option* file = command->add_option("--password-file", options->passwordFile,
+    CLI::Option* file = command->add_option("--password-file", options->access.passwordFile,
                                             "file whose first line is the user's password");
     user->needs(file);
     file->needs(user);
+    command->add_flag("--insecure-public", options->access.insecurePublic,
+                      "let everybody ask on an address that other hosts reach");
     command->add_option("--interval", options->live.intervalSeconds,
                         "the provider's polling interval in seconds");
     command->add_flag("--log", options->log, "print the provider's log lines on standard error");
-    command->callback([options, &status] {
+    command->callback([options, user, &status] {
+        options->access.isUserGiven = user->count() > 0;
         serve(*options);
         status = 0;
     });

@@ -284,6 +284,10 @@ class LiveServer(unittest.TestCase):
         file = support.scenario_file("healthy-array")
         for why, arguments, port in (("Address already in use", [], taken),
                                      ("cannot listen on nowhere", ["--listen", "nowhere"], "0"),
+                                     ("--user has no name",
+                                      ["--user", "", "--password-file", file], "0"),
+                                     ("everybody who reaches 0.0.0.0 could ask",
+                                      ["--listen", "0.0.0.0"], "0"),
                                      ("no password in /nonexistent",
                                       ["--user", "a", "--password-file", "/nonexistent"], "0")):
             with self.assertRaisesRegex(RuntimeError, "plexor-testbed: .*" + why):
