@@ -17,9 +17,8 @@ void InstanceView::apply(Instance& instance) {
     if (shallow.empty() || sameName(shallow, instance.path.className)) return;
     const auto wanted = repository_.allProperties(instance.path.nameSpace, shallow);
     if (wanted.empty()) return;
-    std::erase_if(instance.properties, [&](const NamedValue& property) {
-        return !knows(wanted, property.first);
-    });
+    std::erase_if(instance.properties,
+                  [&](const NamedValue& property) { return !knows(wanted, property.first); });
 }
 
 const InstanceDetails& InstanceView::detailsOf(const Instance& instance) {
