@@ -200,4 +200,9 @@ bool CimRequest::isClassPath(const char* name) const {
     return isElement(value(name), "CLASSNAME");
 }
 
+std::string CimRequest::classIn(const char* name) const {
+    const pugi::xml_node node = value(name);
+    return node.attribute(isElement(node, "CLASSNAME") ? "NAME" : "CLASSNAME").value();
+}
+
 }  // namespace testbed

@@ -32,6 +32,11 @@ public:
     /// The class is in the namespace, or registered for it. Status 5.
     void requireClass(const std::string& nameSpace, const std::string& className) const;
 
+    /// Whether the class, or one below it, is a provider's.
+    bool asksProvider(const std::string& nameSpace, const std::string& className) const {
+        return !providerClasses(nameSpace, className).empty();
+    }
+
     /// Of the class and all below it. A provider that fails fails the request.
     std::vector<ObjectPath> instanceNames(const std::string& nameSpace,
                                           const std::string& className) const;

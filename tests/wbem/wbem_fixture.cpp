@@ -145,6 +145,8 @@ void WbemFixture::serve(HttpServerOptions options, std::optional<Credentials> cr
     manager_ = std::make_unique<ObjectManager>(
         repository_, Registration{provider_.client(), "root/cimv2", {"Served_Disk"}});
     cim_ = std::make_unique<CimServer>(*manager_, "host", std::move(credentials));
+    cim_->failBy(faults_);
+    options.welcome = [this] { return faults_.welcome(); };
     http_ = std::make_unique<HttpServer>(
         options, [this](const HttpRequest& request) { return cim_->answer(request); });
 }

@@ -58,6 +58,7 @@ protected:
     Repository repository_;
     Broker broker_{repository_};
     FakeProvider provider_{broker_};
+    ServerFaults faults_;
     std::unique_ptr<ObjectManager> manager_;
     std::unique_ptr<CimServer> cim_;
     std::unique_ptr<HttpServer> http_;
