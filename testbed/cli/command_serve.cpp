@@ -10,10 +10,12 @@
 
 #include "access.h"
 #include "cim_server.h"
+#include "descriptor_limit.h"
 #include "http_server.h"
 #include "input_lines.h"
 #include "live_session.h"
 #include "provider_log.h"
+#include "server_faults.h"
 #include "stop_signals.h"
 #include "tree_view.h"
 
@@ -24,8 +26,14 @@ struct ServeOptions {
     LiveOptions live;
     HttpServerOptions http;
     AccessOptions access;
+    std::string certificate;
+    std::string key;
+    bool selfSigned = false;
     bool log = false;
 };
+
+/// Beside connections: files, the provider's and those of the system's libraries.
+constexpr std::size_t kOtherDescriptors = 64;
 
 std::string hostName() {
     char name[256] = "";
@@ -48,10 +56,12 @@ public:
           signals_(signals),
           manager_(session().repository(), registrationOf(session())),
           cim_(manager_, hostName(), std::move(credentials)),
-          http_(options.http, [this](const HttpRequest& request) { return cim_.answer(request); }),
+          http_(httpOptions(options),
+                [this](const HttpRequest& request) { return cim_.answer(request); }),
           url_(urlOf(options)) {
         // Nobody asks for the calls, and there is no end to them.
         session().broker().books().keepCalls(false);
+        cim_.failBy(faults_);
     }
 
     void run() {
@@ -67,11 +77,36 @@ public:
     ~Serve() override { session().broker().faults().endWaits(); }
 
 private:
+    HttpServerOptions httpOptions(const ServeOptions& options) {
+        HttpServerOptions http = options.http;
+        http.welcome = [this] { return faults_.welcome(); };
+        if (!options.certificate.empty())
+            http.tls = tlsFromFiles(options.certificate, options.key);
+        else if (options.selfSigned)
+            http.tls = tlsSelfSigned(hostName());
+        raiseDescriptorLimit(http.connections + kOtherDescriptors);
+        return http;
+    }
+
     std::string urlOf(const ServeOptions& options) const {
         const std::string& address = options.http.address;
         const bool isIpv6 = address.find(':') != std::string::npos;
-        return "http://" + (isIpv6 ? "[" + address + "]" : address) + ":" +
-               std::to_string(http_.port()) + "/cimom";
+        const bool isSecure = !options.certificate.empty() || options.selfSigned;
+        return (isSecure ? "https://" : "http://") + (isIpv6 ? "[" + address + "]" : address) +
+               ":" + std::to_string(http_.port()) + "/cimom";
+    }
+
+    /// "server NAME=VALUE..." and "clear server".
+    bool executeOwn(const std::string& line) override {
+        constexpr std::string_view kVerb = "server ";
+        if (line == "clear server")
+            faults_.clear();
+        else if (line.starts_with(kVerb))
+            faults_.add(parseServerFault(std::string_view(line).substr(kVerb.size())));
+        else
+            return false;
+        http_.listen(!faults_.refusesConnections());
+        return true;
     }
 
     void show() override { printer().line(treeView(ask())); }
@@ -82,6 +117,7 @@ private:
 
     const StopSignals& signals_;
     InputLines input_;
+    ServerFaults faults_;
     ObjectManager manager_;
     CimServer cim_;
     HttpServer http_;
@@ -129,6 +165,16 @@ void addServeCommand(CLI::App& app, int& status) {
     file->needs(user);
     command->add_flag("--insecure-public", options->access.insecurePublic,
                       "let everybody ask on an address that other hosts reach");
+    CLI::Option* certificate = command->add_option(
+        "--cert", options->certificate, "serve HTTPS with the certificate in this PEM file");
+    CLI::Option* key =
+        command->add_option("--key", options->key, "PEM file with the certificate's key");
+    certificate->needs(key);
+    key->needs(certificate);
+    command
+        ->add_flag("--tls-self-signed", options->selfSigned,
+                   "serve HTTPS with a certificate that is made now and thrown away at the end")
+        ->excludes(certificate);
     command->add_option("--interval", options->live.intervalSeconds,
                         "the provider's polling interval in seconds");
     command->add_flag("--log", options->log, "print the provider's log lines on standard error");

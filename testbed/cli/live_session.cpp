@@ -67,7 +67,7 @@ template <typename Change>
 void LiveSession::change(Change makeChange) {
     try {
         makeChange();
-    } catch (const ScenarioError& error) {
+    } catch (const std::runtime_error& error) {
         printer_.line(std::string("? ") + error.what());
     }
 }
@@ -85,7 +85,9 @@ bool LiveSession::execute(const std::string& line) {
         wait(std::atoi(line.c_str() + 5));
     } else {
         printer_.line("> " + line);
-        change([&] { array_->apply(line); });
+        change([&] {
+            if (!executeOwn(line)) array_->apply(line);
+        });
     }
     return true;
 }

@@ -77,6 +77,9 @@ protected:
     /// The commands whose effect is not the array's.
     virtual void show() = 0;
     virtual void wait(int seconds) = 0;
+    /// Carries out a command that only this kind of session has; false when it is none of those.
+    /// Throws a std::runtime_error for the user.
+    virtual bool executeOwn(const std::string& /*line*/) { return false; }
 
 private:
     template <typename Change>
