@@ -12,6 +12,7 @@
 #include "provider_log.h"
 #include "provider_session.h"
 #include "scenario_parser.h"
+#include "schema_choice.h"
 
 namespace testbed {
 namespace {
@@ -88,7 +89,7 @@ void addCallsCommand(CLI::App& app, int& status) {
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")
         ->capture_default_str();
-    command->add_option("--schema", options->schema, "directory of the provider's classes (MOF)");
+    command->add_option("--schema", options->schema, kSchemaHelp);
     command->add_option("--timeout", options->timeoutSeconds, "seconds to wait for the inventory")
         ->capture_default_str();
     command->callback([options, &status] { status = printCalls(*options); });

@@ -14,6 +14,7 @@
 #include "provider_log.h"
 #include "provider_session.h"
 #include "scenario_parser.h"
+#include "schema_choice.h"
 #include "tree_view.h"
 
 namespace testbed {
@@ -113,7 +114,7 @@ void addShowCommand(CLI::App& app, int& status) {
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")
         ->capture_default_str();
-    command->add_option("--schema", options->schema, "directory of the provider's classes (MOF)");
+    command->add_option("--schema", options->schema, kSchemaHelp);
     command->add_option("--class", options->className, "show this class only")
         ->check(CLI::IsMember(knownClasses()));
     command->add_option("--namespace", options->nameSpace, "namespace of the requests")

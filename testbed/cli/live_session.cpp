@@ -10,8 +10,7 @@
 #include "library_locator.h"
 #include "provider_log.h"
 #include "scenario_parser.h"
-#include "schema_locator.h"
-#include "served_classes.h"
+#include "schema_choice.h"
 
 namespace testbed {
 
@@ -21,7 +20,7 @@ void addLiveOptions(CLI::App& command, LiveOptions& options) {
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command.add_option("--provider", options.provider, "name that the factory begins with")
         ->capture_default_str();
-    command.add_option("--schema", options.schema, "directory of the provider's classes (MOF)");
+    command.add_option("--schema", options.schema, kSchemaHelp);
 }
 
 void Printer::line(const std::string& text) {
@@ -47,8 +46,7 @@ LiveSession::LiveSession(const LiveOptions& options)
           [&](Broker& broker) {
               if (options.intervalSeconds) polling_.emplace(*options.intervalSeconds);
               array_ = std::make_unique<LiveArray>(broker, options.scenario);
-              defineServedClasses(broker.repository(), kServedNamespace,
-                                  locateSchema(options.schema));
+              defineChosenClasses(broker.repository(), kServedNamespace, options.schema);
           },
           locateLibrary(options.library), options.provider) {}
 

@@ -4,8 +4,7 @@
 
 #include <thread>
 
-#include "schema_locator.h"
-#include "served_classes.h"
+#include "schema_choice.h"
 #include "vendor.h"
 
 namespace testbed {
@@ -44,7 +43,7 @@ ProviderSession::ProviderSession(const Scenario& scenario, const std::string& li
           scenario.manager,
           [&](Broker& broker) {
               buildVendor(broker.repository(), scenario);
-              defineServedClasses(broker.repository(), nameSpace, locateSchema(schema));
+              defineChosenClasses(broker.repository(), nameSpace, schema);
               applyBehaviour(broker, scenario);
           },
           library, providerName) {}
