@@ -54,7 +54,7 @@ public:
           const StopSignals& signals)
         : LiveSession(options.live),
           signals_(signals),
-          manager_(session().repository(), registrationOf(session())),
+          manager_(session().repository(), registrationOf(session()), hostName()),
           cim_(manager_, hostName(), std::move(credentials)),
           http_(httpOptions(options),
                 [this](const HttpRequest& request) { return cim_.answer(request); }),

@@ -20,7 +20,7 @@ void enumerateInstanceNames(const OperationContext& context, const CimRequest& r
                             pugi::xml_node result) {
     for (const ObjectPath& name :
          context.manager.instanceNames(request.nameSpace(), request.className()))
-        writeInstanceName(result, name);
+        writeInstanceName(result, name, KeyTypes::Told);
 }
 
 void enumerateInstances(const OperationContext& context, const CimRequest& request,

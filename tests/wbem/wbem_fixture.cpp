@@ -39,11 +39,6 @@ void defineServed(Repository& repository) {
     repository.put(local);
 }
 
-ObjectPath vendorPath(const char* className, const char* name) {
-    ObjectPath path{"root/vendor", className, {}};
-    return path.key("Name", CimValue::string(name));
-}
-
 void buildVendorSide(Repository& repository) {
     defineThings(repository, "root/vendor");
     repository.defineClass("root/vendor", {"Vendor_Box", "CIM_Thing", {}, {}, false});
@@ -72,6 +67,11 @@ std::string element(const char* name, const std::string& value) {
 }
 
 }  // namespace
+
+ObjectPath vendorPath(const char* className, const char* name) {
+    ObjectPath path{"root/vendor", className, {}};
+    return path.key("Name", CimValue::string(name));
+}
 
 std::string localNamespace(const std::string& nameSpace) {
     std::istringstream parts(nameSpace);

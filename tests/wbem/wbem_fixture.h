@@ -15,6 +15,8 @@
 
 namespace testbed {
 
+/// The path of a box or a disk in root/vendor.
+ObjectPath vendorPath(const char* className, const char* name);
 /// A namespace path in XML.
 std::string localNamespace(const std::string& nameSpace);
 /// The message for an intrinsic operation; `parameters` are IPARAMVALUE elements.
