@@ -41,6 +41,7 @@ HttpRequest requestFrom(http::request<http::string_body> message) {
         std::string(message.method_string()), std::string(message.target()), {}, {}};
     for (const auto& field : message)
         request.headers.emplace_back(field.name_string(), field.value());
+    request.version = static_cast<int>(message.version());
     request.body = std::move(message.body());
     return request;
 }

@@ -22,6 +22,7 @@ struct HttpRequest {
     std::string target;
     HttpHeaders headers;
     std::string body;
+    int version = 11;  ///< 10 or 11
 
     const std::string* header(std::string_view name) const { return findHeader(headers, name); }
 };
