@@ -6,6 +6,7 @@ import re
 import shutil
 import signal
 import tempfile
+import time
 import unittest
 
 import wbemcli_support as support
@@ -278,6 +279,44 @@ class LiveServer(unittest.TestCase):
         self.assertIn("Invalid username/password",
                       Client("ein", url.replace("//", "//admin:wrong@")).errors)
         self.assertEqual(len(Client("ein", url.replace("//", "//admin:open-sesame@")).lines()), 1)
+
+    def test_https_with_a_throw_away_certificate(self):
+        server = self.start("--tls-self-signed")
+        url = server.url(PREFIX + "Controller").replace("http:", "https:")
+        answer = Client("-noverify", "ein", url)
+        self.assertEqual(len(answer.lines()), 1, answer.errors)
+        self.assertEqual(Client("ein", url.replace("https:", "http:")).output, "")
+
+    def test_server_fails_on_command(self):
+        server = self.start()
+        controllers = server.url(PREFIX + "Controller")
+        server.say('server status=2 message="the array sleeps" times=1')
+        server.say("server http=20")
+        for expected in ("> server status=2", "> server http=20", "? http: a number from 400"):
+            self.assertTrue(server.process.stdout.readline().startswith(expected), expected)
+        self.assertIn("the array sleeps", Client("ein", controllers).errors)
+        self.assertEqual(len(Client("ein", controllers).lines()), 1)
+        server.say("server connection=refuse")
+        self.assertTrue(support.wait_until(
+            lambda: "connect" in Client("ein", controllers).errors, 20))
+        server.say("clear server")
+        self.assertTrue(support.wait_until(lambda: Client("ein", controllers).lines(), 20))
+
+    def hang(self, server):
+        """Lets the provider's questions wait for ten minutes."""
+        server.say("latency 600000 600000")
+        server.say("fault call=associators delayMs=600000")
+
+    def test_waiting_faults_do_not_keep_it_from_ending(self):
+        for end in (lambda ended: ended.process.terminate(), lambda ended: ended.say("quit")):
+            server = self.start("--interval", "1")
+            volumes = server.url(PREFIX + "StorageVolume")
+            self.assertTrue(support.wait_until(lambda: len(Client("ein", volumes).lines()) == 2))
+            self.hang(server)
+            time.sleep(3)  # a refresh is under way, and waits
+            begin = time.monotonic()
+            self.assertEqual(server.end(end), 0)
+            self.assertLess(time.monotonic() - begin, 20)
 
     def test_mistakes_end_with_a_line(self):
         taken = self.start().host.rpartition(":")[2]
