@@ -18,7 +18,7 @@ expected_files() {
     echo "755 usr/bin/plexor-testbed"
     echo "755 usr/sbin/plexor-register"
     echo "644 usr/$libdir/cmpi/libPlexorProvider.so"
-    for file in copyright messages.md operating.md; do
+    for file in copyright messages.md operating.md security.md; do
         echo "644 usr/share/doc/$package/$file"
     done
     echo "644 usr/share/man/man1/plexor-testbed.1"
