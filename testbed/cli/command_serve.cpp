@@ -18,6 +18,7 @@
 #include "server_faults.h"
 #include "stop_signals.h"
 #include "tree_view.h"
+#include "wait_ender.h"
 
 namespace testbed {
 namespace {
@@ -138,8 +139,12 @@ void serve(const ServeOptions& options) {
     if (!credentials && isPublic(access.address))
         std::cerr << "plexor-testbed: warning: everybody who reaches " << access.address
                   << " may ask\n";
-    Serve server(options, std::move(credentials), signals);
+    WaitEnder ender(signals);
+    ServeOptions watched = options;
+    watched.live.onBroker = [&ender](Broker& broker) { ender.watch(&broker.faults()); };
+    Serve server(watched, std::move(credentials), signals);
     server.run();
+    ender.watch(nullptr);
     // A provider that does not return keeps the server from ending.
     signals.letNextOneEnd();
 }

@@ -44,6 +44,7 @@ LiveSession::LiveSession(const LiveOptions& options)
       session_(
           readScenario(options.scenario).manager,
           [&](Broker& broker) {
+              if (options.onBroker) options.onBroker(broker);
               if (options.intervalSeconds) polling_.emplace(*options.intervalSeconds);
               array_ = std::make_unique<LiveArray>(broker, options.scenario);
               defineChosenClasses(broker.repository(), kServedNamespace, options.schema);

@@ -2,6 +2,7 @@
 // its scenario file.
 #pragma once
 
+#include <functional>
 #include <memory>
 #include <mutex>
 #include <optional>
@@ -28,6 +29,8 @@ struct LiveOptions {
     std::string schema;
     std::string provider = "PlexorProvider";
     std::optional<unsigned> intervalSeconds;  ///< of the provider's polling; its own without
+    /// Called with the broker before the provider is loaded, which may take long.
+    std::function<void(Broker&)> onBroker = nullptr;
 };
 
 /// The options that every live command takes. `options` must live until the command runs.

@@ -1,10 +1,12 @@
 #!/usr/bin/env python3
 """wbemcli against `plexor-testbed serve` from an install tree: what the client prints must be what
 `plexor-testbed show` answers for the same scenario, and what was worked out by hand."""
+import json
 import os
 import re
 import shutil
 import signal
+import subprocess
 import tempfile
 import time
 import unittest
@@ -317,6 +319,23 @@ class LiveServer(unittest.TestCase):
             begin = time.monotonic()
             self.assertEqual(server.end(end), 0)
             self.assertLess(time.monotonic() - begin, 20)
+
+    def test_faults_at_the_start_do_not_keep_it_from_ending(self):
+        file = os.path.join(self.directory(), "scenario.json")
+        with open(support.scenario_file("healthy-array"), encoding="utf-8") as stream:
+            scenario = json.load(stream)
+        scenario["faults"] = [{"call": call, "delayMs": 600000} for call in
+                              ("enumerateInstances", "enumerateInstanceNames", "associators")]
+        with open(file, "w", encoding="utf-8") as stream:
+            json.dump(scenario, stream)
+        process = subprocess.Popen([support.TOOL, "serve", "--scenario", file, "--port", "0"],
+                                   stdin=subprocess.PIPE, stdout=subprocess.DEVNULL,
+                                   env=support.environment())
+        self.addCleanup(process.kill)
+        self.addCleanup(process.stdin.close)
+        time.sleep(2)  # the provider's start waits by now
+        process.terminate()
+        self.assertEqual(process.wait(timeout=30), 0)
 
     def test_mistakes_end_with_a_line(self):
         taken = self.start().host.rpartition(":")[2]
