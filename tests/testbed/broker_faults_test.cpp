@@ -236,7 +236,7 @@ TEST_F(BrokerFaults, WaitsEndWhenTheFaultsAreCleared) {
     broker.faults().add(hang);
     std::thread rescue([&] {
         while (broker.books().queries().empty()) std::this_thread::yield();
-        std::this_thread::sleep_for(milliseconds(20));
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
         broker.faults().clear();
     });
     EXPECT_LT(timeOf([&] { EXPECT_NE(query(), nullptr); }), std::chrono::minutes(1));
