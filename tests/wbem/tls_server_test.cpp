@@ -57,6 +57,10 @@ protected:
 };
 
 TEST_F(TlsServer, SpeaksTheTwoLastVersionsOnly) {
+    // The library's own reservations would hide what the server says.
+    const auto context = tlsSelfSigned("array");
+    SSL_CTX_set_security_level(context->native_handle(), 0);
+    serveTls(context);
     for (const auto& [version, isSpoken] :
          {std::pair(TLS1_VERSION, false), std::pair(TLS1_1_VERSION, false),
           std::pair(TLS1_2_VERSION, true), std::pair(TLS1_3_VERSION, true)}) {
