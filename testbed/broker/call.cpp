@@ -1,7 +1,6 @@
 #include "call.h"
 
 #include <cstring>
-#include <thread>
 
 #include "object_string.h"
 
@@ -25,9 +24,8 @@ Call::Call(BrokerCore& core, CallRecord record) : core_(core), entry_(record.ent
     // The hook runs outside of all locks: it may ask this broker something.
     Faults::runHook(effect_);
     if (core.options.serialQueries && isQuery(entry_)) turn_ = std::unique_lock(core.queryMutex);
-    Faults::wait(effect_);
+    core.faults.wait(effect_, isQuery(entry_));
     if (!isQuery(entry_)) return;
-    if (!effect_) std::this_thread::sleep_for(core.faults.drawLatency());
     if (core.stopGate.admits(core.options.whileStopping)) return;
     effect_.emplace();
     effect_->rc = CMPI_RC_ERR_FAILED;

@@ -1,7 +1,6 @@
 #include "faults.h"
 
 #include <algorithm>
-#include <thread>
 
 #include "cim_object.h"
 
@@ -41,6 +40,14 @@ void Faults::clear() {
     const std::lock_guard lock(mutex_);
     rules_.clear();
     noteObjectRules();
+    clearings_++;
+    waits_.notify_all();
+}
+
+void Faults::endWaits() {
+    const std::lock_guard lock(mutex_);
+    isEnding_ = true;
+    waits_.notify_all();
 }
 
 void Faults::noteObjectRules() {
@@ -72,17 +79,22 @@ FaultEffect Faults::match(const CallRecord& call) {
     return std::nullopt;
 }
 
-void Faults::perform(const FaultEffect& effect) {
-    runHook(effect);
-    wait(effect);
-}
-
 void Faults::runHook(const FaultEffect& effect) {
     if (effect && effect->hook) effect->hook();
 }
 
-void Faults::wait(const FaultEffect& effect) {
-    if (effect) std::this_thread::sleep_for(effect->delay);
+void Faults::wait(const FaultEffect& effect, bool isQuery) {
+    if (effect)
+        sleep(effect->delay);
+    else if (isQuery)
+        sleep(drawLatency());
+}
+
+void Faults::sleep(std::chrono::milliseconds time) {
+    if (time.count() == 0) return;
+    std::unique_lock lock(mutex_);
+    const unsigned before = clearings_;
+    waits_.wait_for(lock, time, [&] { return isEnding_ || clearings_ != before; });
 }
 
 std::chrono::milliseconds Faults::drawLatency() {

@@ -3,6 +3,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <condition_variable>
 #include <functional>
 #include <mutex>
 #include <optional>
@@ -44,16 +45,17 @@ public:
     /// Returns a number for `remove`.
     int add(FaultRule rule);
     void remove(int id);
+    /// Forgets all rules; calls that wait because of one go on at once.
     void clear();
+    /// From now on nothing is waited for, rules and latency alike: the manager is to end.
+    void endWaits();
     /// Delay for every query (see isQuery) that no rule catches.
     void setLatency(std::chrono::milliseconds minimum, std::chrono::milliseconds maximum);
     /// Picks the rule for a call and counts it.
     FaultEffect match(const CallRecord& call);
-    /// Runs the hook of an effect and waits.
-    static void perform(const FaultEffect& effect);
-    /// The two halves of perform.
     static void runHook(const FaultEffect& effect);
-    static void wait(const FaultEffect& effect);
+    /// Waits as long as the effect says, or a query's answer takes when there is none.
+    void wait(const FaultEffect& effect, bool isQuery);
     std::chrono::milliseconds drawLatency();
     /// Whether any rule names an entry of an object (see isObjectEntry); cheap.
     bool hasObjectRules() const { return hasObjectRules_; }
@@ -66,9 +68,13 @@ private:
         int applied = 0;  // calls that the rule decided
     };
     void noteObjectRules();  // mutex_ held
+    void sleep(std::chrono::milliseconds time);
 
     std::atomic<bool> hasObjectRules_ = false;
     std::mutex mutex_;
+    std::condition_variable waits_;                      // some waits are over before their time
+    unsigned clearings_ = 0;                             // guarded by mutex_
+    bool isEnding_ = false;                              // guarded by mutex_
     std::vector<Entry_> rules_;                          // guarded by mutex_
     int nextId_ = 1;                                     // guarded by mutex_
     std::chrono::milliseconds minimum_{0}, maximum_{0};  // guarded by mutex_

@@ -15,6 +15,13 @@ bool Repository::hasNamespace(std::string_view nameSpace) const {
     return space(nameSpace) != nullptr;
 }
 
+std::vector<std::string> Repository::namespaceNames() const {
+    const std::shared_lock lock(mutex_);
+    std::vector<std::string> names;
+    for (const auto& entry : spaces_) names.push_back(entry.second.name);
+    return names;
+}
+
 const Repository::Space* Repository::space(std::string_view nameSpace) const {
     const auto found = spaces_.find(foldName(nameSpace));
     return found == spaces_.end() ? nullptr : &found->second;
@@ -93,6 +100,30 @@ std::optional<PropertyDefinition> Repository::findProperty(std::string_view name
         }
     }
     return std::nullopt;
+}
+
+std::vector<MethodDefinition> Repository::allMethods(std::string_view nameSpace,
+                                                     std::string_view className) const {
+    const std::shared_lock lock(mutex_);
+    std::vector<MethodDefinition> methods;
+    auto lineage = lineageLocked(nameSpace, className);
+    std::reverse(lineage.begin(), lineage.end());
+    for (const ClassDefinition* definition : lineage) {
+        for (const MethodDefinition& own : definition->methods) {
+            std::erase_if(methods, [&](const MethodDefinition& inherited) {
+                return sameName(inherited.name, own.name);
+            });
+            methods.push_back(own);
+        }
+    }
+    return methods;
+}
+
+bool Repository::knowsClass(std::string_view className) const {
+    const std::shared_lock lock(mutex_);
+    const std::string key = foldName(className);
+    return std::any_of(spaces_.begin(), spaces_.end(),
+                       [&](const auto& entry) { return entry.second.classes.count(key) > 0; });
 }
 
 std::vector<std::string> Repository::classNames(std::string_view nameSpace) const {

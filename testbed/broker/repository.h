@@ -25,9 +25,26 @@ struct PropertyDefinition {
     std::string name;
     CMPIType type = CMPI_null;
     bool isKey = false;
-    std::string originClass;     ///< class that introduced the property
-    CimValue defaultValue;       ///< null when there is none
-    Qualifiers qualifiers = {};  ///< without Key, which isKey tells
+    std::string originClass;          ///< class that introduced the property
+    CimValue defaultValue;            ///< null when there is none
+    Qualifiers qualifiers = {};       ///< without Key, which isKey tells
+    std::string referenceClass = {};  ///< of a reference, as far as it is known
+};
+
+struct ParameterDefinition {
+    std::string name;
+    CMPIType type = CMPI_null;
+    std::string referenceClass;  ///< of a reference
+    Qualifiers qualifiers = {};
+};
+
+/// A method is described to clients; none can be called.
+struct MethodDefinition {
+    std::string name;
+    CMPIType type = CMPI_null;  ///< of what it returns
+    std::string originClass;    ///< class that introduced the method
+    std::vector<ParameterDefinition> parameters = {};
+    Qualifiers qualifiers = {};
 };
 
 struct ClassDefinition {
@@ -36,6 +53,7 @@ struct ClassDefinition {
     std::vector<PropertyDefinition> properties;  ///< own properties only, not inherited ones
     Qualifiers qualifiers = {};
     bool isAssociation = false;
+    std::vector<MethodDefinition> methods = {};  ///< own ones only
 };
 
 /// One end of an association instance.
@@ -60,6 +78,7 @@ public:
 
     void addNamespace(std::string_view nameSpace);
     bool hasNamespace(std::string_view nameSpace) const;
+    std::vector<std::string> namespaceNames() const;
 
     /// Adds or replaces a class; its namespace is created when it is new.
     void defineClass(std::string_view nameSpace, ClassDefinition definition);
@@ -73,6 +92,11 @@ public:
     std::optional<PropertyDefinition> findProperty(std::string_view nameSpace,
                                                    std::string_view className,
                                                    std::string_view name) const;
+    /// Own and inherited methods, the root class's first.
+    std::vector<MethodDefinition> allMethods(std::string_view nameSpace,
+                                             std::string_view className) const;
+    /// True when any namespace has the class.
+    bool knowsClass(std::string_view className) const;
     std::vector<std::string> classNames(std::string_view nameSpace) const;
     /// True for the class itself and for every class below `ancestor`; false for anything unknown.
     bool isA(std::string_view nameSpace, std::string_view className,
@@ -101,6 +125,11 @@ public:
     /// Association instances that the source takes part in; references as CMPI_ref properties.
     std::vector<Instance> references(const ObjectPath& source, std::string_view resultClass,
                                      std::string_view role) const;
+
+    /// The instances of an association class, and of those below it, that have an end in the
+    /// namespace and both ends there.
+    std::vector<Instance> associationInstances(std::string_view nameSpace,
+                                               std::string_view className) const;
 
     /// From now on association walks come in an order drawn from `seed`, another one each time.
     void shuffleResults(std::uint32_t seed);
@@ -135,6 +164,7 @@ private:
     /// instance is NULL for a dangling reference.
     template <class Visit>
     void walkLocked(const ObjectPath& source, const AssociationFilter& filter, Visit visit) const;
+    static Instance instanceOf(const Association& association, std::string_view nameSpace);
     bool matchesEnd(const Association& association, const AssociationEnd& near,
                     const AssociationEnd& far, const AssociationFilter& filter) const;
 

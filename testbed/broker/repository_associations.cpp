@@ -110,16 +110,35 @@ std::vector<Instance> Repository::references(const ObjectPath& source, std::stri
                    [&](const Association& association, const std::string&, const Instance* far) {
                        if (far == nullptr) return;
                        if (!seen.insert(&association).second) return;
-                       Instance instance;
-                       instance.path = {source.nameSpace, association.assocClass, {}};
-                       for (const AssociationEnd* end : {&association.left, &association.right}) {
-                           instance.path.key(end->role, CimValue::reference(end->object));
-                           instance.set(end->role, CimValue::reference(end->object));
-                       }
-                       found.push_back(std::move(instance));
+                       found.push_back(instanceOf(association, source.nameSpace));
                    });
     }
     shuffle(found);
+    return found;
+}
+
+Instance Repository::instanceOf(const Association& association, std::string_view nameSpace) {
+    Instance instance;
+    instance.path = {std::string(nameSpace), association.assocClass, {}};
+    for (const AssociationEnd* end : {&association.left, &association.right}) {
+        instance.path.key(end->role, CimValue::reference(end->object));
+        instance.set(end->role, CimValue::reference(end->object));
+    }
+    return instance;
+}
+
+std::vector<Instance> Repository::associationInstances(std::string_view nameSpace,
+                                                       std::string_view className) const {
+    const std::shared_lock lock(mutex_);
+    std::vector<Instance> found;
+    for (const Association& association : associations_) {
+        const bool isHere = sameName(association.left.object.nameSpace, nameSpace) ||
+                            sameName(association.right.object.nameSpace, nameSpace);
+        if (!isHere || !isALocked(nameSpace, association.assocClass, className)) continue;
+        if (instanceLocked(association.leftIdentity) == nullptr) continue;
+        if (instanceLocked(association.rightIdentity) == nullptr) continue;
+        found.push_back(instanceOf(association, nameSpace));
+    }
     return found;
 }
 

@@ -14,6 +14,7 @@
 #include "provider_session.h"
 #include "scenario_locator.h"
 #include "scenario_parser.h"
+#include "schema_choice.h"
 
 namespace testbed {
 namespace {
@@ -92,7 +93,7 @@ void addCallsCommand(CLI::App& app, int& status) {
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")
         ->capture_default_str();
-    command->add_option("--schema", options->schema, "directory of the provider's classes (MOF)");
+    command->add_option("--schema", options->schema, kSchemaHelp);
     addManagerOption(*command, options->manager);
     command->add_option("--timeout", options->timeoutSeconds, "seconds to wait for the inventory")
         ->capture_default_str();

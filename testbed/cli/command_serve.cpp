@@ -9,14 +9,18 @@
 #include <iostream>
 #include <memory>
 
+#include "access.h"
 #include "cim_server.h"
 #include "control_socket.h"
+#include "descriptor_limit.h"
 #include "http_server.h"
 #include "input_lines.h"
 #include "live_session.h"
 #include "provider_log.h"
+#include "server_faults.h"
 #include "stop_signals.h"
 #include "tree_view.h"
+#include "wait_ender.h"
 
 namespace testbed {
 namespace {
@@ -24,11 +28,16 @@ namespace {
 struct ServeOptions {
     LiveOptions live;
     HttpServerOptions http;
-    std::string user;
-    std::string passwordFile;
     std::string control;
+    AccessOptions access;
+    std::string certificate;
+    std::string key;
+    bool selfSigned = false;
     bool log = false;
 };
+
+/// Beside connections: files, the provider's and those of the system's libraries.
+constexpr std::size_t kOtherDescriptors = 64;
 
 std::string hostName() {
     char name[256] = "";
@@ -43,24 +52,21 @@ Registration registrationOf(ProviderSession& session) {
     return registration;
 }
 
-std::optional<Credentials> credentialsOf(const ServeOptions& options) {
-    if (options.user.empty()) return std::nullopt;
-    return Credentials{options.user, readPassword(options.passwordFile)};
-}
-
 class Serve : private LiveSession {
 public:
     Serve(const ServeOptions& options, std::optional<Credentials> credentials,
           const StopSignals& signals)
         : LiveSession(options.live),
           signals_(signals),
-          manager_(session().repository(), registrationOf(session())),
+          manager_(session().repository(), registrationOf(session()), hostName()),
           cim_(manager_, hostName(), std::move(credentials)),
-          http_(options.http, [this](const HttpRequest& request) { return cim_.answer(request); }),
+          http_(httpOptions(options),
+                [this](const HttpRequest& request) { return cim_.answer(request); }),
           control_(options.control),
           url_(urlOf(options)) {
         // Nobody asks for the calls, and there is no end to them.
         session().broker().books().keepCalls(false);
+        cim_.failBy(faults_);
     }
 
     /// False when a refused command has ended it.
@@ -70,12 +76,40 @@ public:
         return !hasFailed();
     }
 
+    /// Requests that a fault keeps waiting would keep the server from ending.
+    ~Serve() override { session().broker().faults().endWaits(); }
+
 private:
+    HttpServerOptions httpOptions(const ServeOptions& options) {
+        HttpServerOptions http = options.http;
+        http.welcome = [this] { return faults_.welcome(); };
+        if (!options.certificate.empty())
+            http.tls = tlsFromFiles(options.certificate, options.key);
+        else if (options.selfSigned)
+            http.tls = tlsSelfSigned(hostName());
+        raiseDescriptorLimit(http.connections + kOtherDescriptors);
+        return http;
+    }
+
     std::string urlOf(const ServeOptions& options) const {
         const std::string& address = options.http.address;
         const bool isIpv6 = address.find(':') != std::string::npos;
-        return "http://" + (isIpv6 ? "[" + address + "]" : address) + ":" +
-               std::to_string(http_.port()) + "/cimom";
+        const bool isSecure = !options.certificate.empty() || options.selfSigned;
+        return (isSecure ? "https://" : "http://") + (isIpv6 ? "[" + address + "]" : address) +
+               ":" + std::to_string(http_.port()) + "/cimom";
+    }
+
+    /// "server NAME=VALUE..." and "clear server".
+    bool executeOwn(const std::string& line) override {
+        constexpr std::string_view kVerb = "server ";
+        if (line == "clear server")
+            faults_.clear();
+        else if (line.starts_with(kVerb))
+            faults_.add(parseServerFault(std::string_view(line).substr(kVerb.size())));
+        else
+            return false;
+        http_.listen(!faults_.refusesConnections());
+        return true;
     }
 
     /// Waits a second at most for commands and carries them out. False when one ends the server.
@@ -107,6 +141,7 @@ private:
 
     const StopSignals& signals_;
     InputLines input_{InputLines::Pipe::Reopens};
+    ServerFaults faults_;
     ObjectManager manager_;
     CimServer cim_;
     HttpServer http_;
@@ -123,8 +158,18 @@ bool serve(const ServeOptions& options) {
                       [show = options.log](int, const std::string& line) {
                           if (show) std::cerr << line << "\n";
                       });
-    Serve server(options, credentialsOf(options), signals);
+    AccessOptions access = options.access;
+    access.address = options.http.address;
+    auto credentials = accessOf(access);
+    if (!credentials && isPublic(access.address))
+        std::cerr << "plexor-testbed: warning: everybody who reaches " << access.address
+                  << " may ask\n";
+    WaitEnder ender(signals);
+    ServeOptions watched = options;
+    watched.live.onBroker = [&ender](Broker& broker) { ender.watch(&broker.faults()); };
+    Serve server(watched, std::move(credentials), signals);
     const bool succeeded = server.run();
+    ender.watch(nullptr);
     // A provider that does not return keeps the server from ending.
     signals.letNextOneEnd();
     return succeeded;
@@ -143,18 +188,33 @@ void addServeCommand(CLI::App& app, int& status) {
         ->capture_default_str();
     command->add_option("--port", options->http.port, "port to listen on; 0: any that is free")
         ->capture_default_str();
-    CLI::Option* user = command->add_option("--user", options->user,
+    CLI::Option* user = command->add_option("--user", options->access.user,
                                             "the only user who may ask (default: anybody)");
-    CLI::Option* file = command->add_option("--password-file", options->passwordFile,
+    CLI::Option* file = command->add_option("--password-file", options->access.passwordFile,
                                             "file whose first line is the user's password");
     user->needs(file);
     file->needs(user);
+    command->add_flag("--insecure-public", options->access.insecurePublic,
+                      "let everybody ask on an address that other hosts reach");
+    CLI::Option* certificate = command->add_option(
+        "--cert", options->certificate, "serve HTTPS with the certificate in this PEM file");
+    CLI::Option* key =
+        command->add_option("--key", options->key, "PEM file with the certificate's key");
+    certificate->needs(key);
+    key->needs(certificate);
+    command
+        ->add_flag("--tls-self-signed", options->selfSigned,
+                   "serve HTTPS with a certificate that is made now and thrown away at the end")
+        ->excludes(certificate);
     command->add_option("--interval", options->live.intervalSeconds,
                         "the provider's polling interval in seconds");
     command->add_option("--control", options->control,
                         "socket on which plexor-testbed tell gives commands");
     command->add_flag("--log", options->log, "print the provider's log lines on standard error");
-    command->callback([options, &status] { status = serve(*options) ? 0 : 1; });
+    command->callback([options, user, &status] {
+        options->access.isUserGiven = user->count() > 0;
+        status = serve(*options) ? 0 : 1;
+    });
 }
 
 }  // namespace testbed

@@ -16,6 +16,7 @@
 #include "provider_session.h"
 #include "scenario_locator.h"
 #include "scenario_parser.h"
+#include "schema_choice.h"
 #include "terminal.h"
 #include "tree_view.h"
 
@@ -132,7 +133,7 @@ void addShowCommand(CLI::App& app, int& status) {
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command->add_option("--provider", options->provider, "name that the factory begins with")
         ->capture_default_str();
-    command->add_option("--schema", options->schema, "directory of the provider's classes (MOF)");
+    command->add_option("--schema", options->schema, kSchemaHelp);
     addManagerOption(*command, options->manager);
     command->add_option("--class", options->className, "show this class only")
         ->check(CLI::IsMember(knownClasses()));

@@ -18,8 +18,7 @@
 #include "provider_log.h"
 #include "scenario_locator.h"
 #include "scenario_parser.h"
-#include "schema_locator.h"
-#include "served_classes.h"
+#include "schema_choice.h"
 
 namespace testbed {
 
@@ -29,7 +28,7 @@ void addLiveOptions(CLI::App& command, LiveOptions& options) {
         ->envname("PLEXOR_PROVIDER_LIBRARY");
     command.add_option("--provider", options.provider, "name that the factory begins with")
         ->capture_default_str();
-    command.add_option("--schema", options.schema, "directory of the provider's classes (MOF)");
+    command.add_option("--schema", options.schema, kSchemaHelp);
     addManagerOption(command, options.manager);
     command
         .add_option("--speed", options.speed,
@@ -85,10 +84,10 @@ LiveSession::LiveSession(const LiveOptions& options)
       session_(
           chosenManager(readScenario(options.scenario), options.manager),
           [&](Broker& broker) {
+              if (options.onBroker) options.onBroker(broker);
               if (options.intervalSeconds) polling_.emplace(*options.intervalSeconds);
               array_ = std::make_unique<LiveArray>(broker, options.scenario);
-              defineServedClasses(broker.repository(), kServedNamespace,
-                                  locateSchema(options.schema));
+              defineChosenClasses(broker.repository(), kServedNamespace, options.schema);
           },
           locateLibrary(options.library), options.provider) {}
 
@@ -137,7 +136,7 @@ void LiveSession::takeNewFile() {
     if (!file_.changed()) return;
     try {
         array_->reload();
-    } catch (const ScenarioError& error) {
+    } catch (const std::runtime_error& error) {
         printer_.line(std::string("? ") + error.what());
     }
 }
@@ -151,7 +150,7 @@ CommandResult LiveSession::change(const std::string& line) {
         array_->save(words[1].text);
     } else if (verb == "reset") {
         array_->reset();
-    } else {
+    } else if (!executeOwn(line)) {
         array_->apply(line);
     }
     return {};
@@ -170,7 +169,7 @@ CommandResult LiveSession::carryOut(const std::string& line) {
         if (verb == "wait") refuseCommand("wait is for commands on standard input");
         printer_.line("> " + line);
         return change(line);
-    } catch (const ScenarioError& error) {
+    } catch (const std::runtime_error& error) {
         return {true, false, error.what()};
     }
 }

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <chrono>
+#include <functional>
 #include <memory>
 #include <mutex>
 #include <optional>
@@ -33,6 +34,8 @@ struct LiveOptions {
     std::optional<unsigned> intervalSeconds;  ///< of the provider's polling; its own without
     double speed = 1;                         ///< seconds of the scenario in a second
     bool strict = false;                      ///< a refused command ends the session
+    /// Called with the broker before the provider is loaded, which may take long.
+    std::function<void(Broker&)> onBroker = nullptr;
 };
 
 /// The options that every live command takes. `options` must live until the command runs.
@@ -93,6 +96,9 @@ protected:
     virtual std::string tree() = 0;
     /// Takes no command of the input for that long.
     virtual void wait(int seconds) = 0;
+    /// Carries out a command that only this kind of session has; false when it is none of those.
+    /// Throws a std::runtime_error for the user.
+    virtual bool executeOwn(const std::string& /*line*/) { return false; }
 
 private:
     CommandResult change(const std::string& line);

@@ -5,8 +5,7 @@
 #include <thread>
 
 #include "manager_stop.h"
-#include "schema_locator.h"
-#include "served_classes.h"
+#include "schema_choice.h"
 #include "vendor.h"
 
 namespace testbed {
@@ -45,7 +44,7 @@ ProviderSession::ProviderSession(const Scenario& scenario, const std::string& li
           scenario.manager,
           [&](Broker& broker) {
               buildVendor(broker.repository(), scenario);
-              defineServedClasses(broker.repository(), nameSpace, locateSchema(schema));
+              defineChosenClasses(broker.repository(), nameSpace, schema);
               applyBehaviour(broker, scenario);
           },
           library, providerName) {}

@@ -1,24 +1,8 @@
 #include "mof_parser.h"
 
-#include <algorithm>
-
 #include "mof_error.h"
 
 namespace testbed {
-namespace {
-
-/// True when one of the values has that name.
-bool hasNamed(const std::vector<NamedValue>& values, const std::string& name) {
-    return std::any_of(values.begin(), values.end(),
-                       [&](const NamedValue& value) { return sameName(value.first, name); });
-}
-
-/// A qualifier without a value is true.
-MofValue trueValue() {
-    return {false, {{MofLiteralKind::Boolean, "true"}}};
-}
-
-}  // namespace
 
 MofParser::MofParser(std::string_view text, const std::string& file, MofDocument& document,
                      Include include)
@@ -86,51 +70,11 @@ void MofParser::parseDeclaration() {
         parseClass(std::move(qualifiers));
     } else if (takeWord("instance")) {
         parseInstance();
-    } else if (token_.isWord("qualifier")) {
-        fail("declarations of qualifiers are not read");
+    } else if (takeWord("qualifier")) {
+        parseQualifierDeclaration();
     } else {
-        fail("\"class\" or \"instance\" expected, not " + token_.shown());
+        fail("\"class\", \"instance\" or \"qualifier\" expected, not " + token_.shown());
     }
-}
-
-MofParser::QualifierList MofParser::parseQualifiers() {
-    QualifierList list;
-    if (!take('[')) return list;
-    do {
-        parseQualifier(list);
-    } while (take(','));
-    expect(']');
-    return list;
-}
-
-void MofParser::parseQualifier(QualifierList& list) {
-    const std::string name = expectWord("a qualifier");
-    if (hasNamed(list.others, name)) fail("the qualifier " + name + " twice");
-    MofValue value = trueValue();
-    if (token_.isSymbol('{')) {
-        value = parseValue();
-    } else if (take('(')) {
-        value = parseValue();
-        expect(')');
-    }
-    const auto typed = untypedValue(value);
-    if (!typed) fail("the value of the qualifier " + name + " cannot be read");
-    skipFlavours();
-    const bool isTrue = typed->type == CMPI_boolean && typed->asUnsigned() != 0;
-    if (sameName(name, "Key")) {
-        list.isKey = isTrue;
-    } else if (sameName(name, "Association")) {
-        list.isAssociation = isTrue;
-    } else {
-        list.others.emplace_back(name, *typed);
-    }
-}
-
-void MofParser::skipFlavours() {
-    if (!take(':')) return;
-    do {
-        expectWord("a flavour");
-    } while (token_.kind == MofTokenKind::Word);
 }
 
 void MofParser::skipAlias() {
@@ -144,21 +88,34 @@ void MofParser::parseClass(QualifierList qualifiers) {
     definition.name = expectWord("the name of the class");
     definition.qualifiers = std::move(qualifiers.others);
     definition.isAssociation = qualifiers.isAssociation;
-    for (const ClassDefinition& other : document_.classes)
-        if (sameName(other.name, definition.name)) fail("the class " + definition.name + " twice");
+    if (!document_.classNames.insert(foldName(definition.name)).second)
+        fail("the class " + definition.name + " twice");
     skipAlias();
     if (take(':')) definition.superclass = expectWord("the name of the superclass");
     expect('{');
-    while (!take('}')) parseProperty(definition);
+    while (!take('}')) parseMember(definition);
     expect(';');
     document_.classes.push_back(std::move(definition));
 }
 
-void MofParser::parseProperty(ClassDefinition& definition) {
+/// A property, a reference or a method.
+void MofParser::parseMember(ClassDefinition& definition) {
     QualifierList qualifiers = parseQualifiers();
-    PropertyDefinition property = parsePropertyHead();
+    const Declared head = parseTypeAndName();
+    if (token_.isSymbol('('))
+        parseMethod(definition, head, std::move(qualifiers.others));
+    else
+        parseProperty(definition, head, std::move(qualifiers));
+}
+
+void MofParser::parseProperty(ClassDefinition& definition, const Declared& head,
+                              QualifierList qualifiers) {
     for (const PropertyDefinition& other : definition.properties)
-        if (sameName(other.name, property.name)) fail("the property " + property.name + " twice");
+        if (sameName(other.name, head.name)) fail("the property " + head.name + " twice");
+    PropertyDefinition property;
+    property.name = head.name;
+    property.referenceClass = head.referenceClass;
+    property.type = parseArraySuffix(head.type);
     property.isKey = qualifiers.isKey;
     property.qualifiers = std::move(qualifiers.others);
     parseDefault(property);
@@ -166,22 +123,46 @@ void MofParser::parseProperty(ClassDefinition& definition) {
     definition.properties.push_back(std::move(property));
 }
 
-/// Type, name and brackets.
-PropertyDefinition MofParser::parsePropertyHead() {
-    const std::string typeWord = expectWord("the type of a property");
-    PropertyDefinition property;
+void MofParser::parseMethod(ClassDefinition& definition, const Declared& head,
+                            Qualifiers qualifiers) {
+    for (const MethodDefinition& other : definition.methods)
+        if (sameName(other.name, head.name)) fail("the method " + head.name + " twice");
+    if (head.type == CMPI_ref) fail("the method " + head.name + " returns a reference");
+    MethodDefinition method{head.name, head.type, "", {}, std::move(qualifiers)};
+    expect('(');
+    if (!take(')')) {
+        do {
+            parseParameter(method);
+        } while (take(','));
+        expect(')');
+    }
+    expect(';');
+    definition.methods.push_back(std::move(method));
+}
+
+void MofParser::parseParameter(MethodDefinition& method) {
+    QualifierList qualifiers = parseQualifiers();
+    const Declared head = parseTypeAndName();
+    for (const ParameterDefinition& other : method.parameters)
+        if (sameName(other.name, head.name)) fail("the parameter " + head.name + " twice");
+    method.parameters.push_back({head.name, parseArraySuffix(head.type), head.referenceClass,
+                                 std::move(qualifiers.others)});
+}
+
+MofParser::Declared MofParser::parseTypeAndName() {
+    const std::string typeWord = expectWord("a type");
+    Declared head;
     const auto type = mofType(typeWord);
     if (takeWord("REF")) {
-        property.type = CMPI_ref;
+        head.type = CMPI_ref;
+        head.referenceClass = typeWord;
     } else if (type) {
-        property.type = *type;
+        head.type = *type;
     } else {
         fail("unknown type " + typeWord);
     }
-    property.name = expectWord("the name of a property");
-    if (token_.isSymbol('(')) fail("methods are not read");
-    property.type = parseArraySuffix(property.type);
-    return property;
+    head.name = expectWord("a name");
+    return head;
 }
 
 CMPIType MofParser::parseArraySuffix(CMPIType type) {

@@ -1,7 +1,10 @@
-// Parses MOF: classes and instances.
+// Parses MOF: classes with their methods, instances, and declarations of qualifiers.
 #pragma once
 
 #include <functional>
+#include <map>
+#include <optional>
+#include <set>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -18,11 +21,14 @@ struct MofDocument {
     std::vector<ClassDefinition> classes;
     /// Without keys and namespace; values typed as untypedValue does.
     std::vector<Instance> instances;
+    /// What the qualifiers are declared as, by folded name; those of undeclared ones are typed as
+    /// untypedValue does.
+    std::map<std::string, CMPIType> qualifierTypes;
+    std::set<std::string> classNames;  ///< of `classes`, folded
 };
 
 /// Reads one text into a document. Understands comments, #pragma, qualifiers with flavours (which
-/// are not kept), classes with properties and references, instances. Refuses declarations of
-/// qualifiers, and methods.
+/// are not kept), their declarations, classes with properties, references and methods, instances.
 class MofParser {
 public:
     /// Called for `#pragma include`, with the file's name as written and the line.
@@ -42,6 +48,13 @@ private:
         bool isAssociation = false;
     };
 
+    /// What properties, methods and parameters begin with.
+    struct Declared {
+        std::string name;
+        CMPIType type = CMPI_null;
+        std::string referenceClass;  ///< of a reference
+    };
+
     [[noreturn]] void fail(const std::string& what) const;
     void advance();
     void expect(char symbol);
@@ -53,11 +66,16 @@ private:
     void parseDeclaration();
     QualifierList parseQualifiers();
     void parseQualifier(QualifierList& list);
+    CimValue qualifierValue(const std::string& name, std::optional<MofValue> value);
+    void parseQualifierDeclaration();
     void skipFlavours();
     void skipAlias();
     void parseClass(QualifierList qualifiers);
-    void parseProperty(ClassDefinition& definition);
-    PropertyDefinition parsePropertyHead();
+    void parseMember(ClassDefinition& definition);
+    Declared parseTypeAndName();
+    void parseProperty(ClassDefinition& definition, const Declared& head, QualifierList qualifiers);
+    void parseMethod(ClassDefinition& definition, const Declared& head, Qualifiers qualifiers);
+    void parseParameter(MethodDefinition& method);
     CMPIType parseArraySuffix(CMPIType type);
     void parseDefault(PropertyDefinition& property);
     void parseInstance();

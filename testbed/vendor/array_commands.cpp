@@ -62,6 +62,8 @@ constexpr CommandHelp kHelp[] = {
     {"latency MINIMUM MAXIMUM", "milliseconds that each answer of the vendor takes"},
     {"fault NAME=VALUE...", "add an entry to the faults"},
     {"clear faults", "take all faults away"},
+    {"server NAME=VALUE...", "for serve: let the server fail, see plexor-testbed(1)"},
+    {"clear server", "for serve: let the server work again"},
     {"reset", "go back to the scenario as the file has it"},
     {"save FILE", "write the present state as a scenario"},
     {"wait SECONDS", "take no command of this input meanwhile"},

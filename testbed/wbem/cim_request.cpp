@@ -2,9 +2,11 @@
 
 #include <algorithm>
 #include <set>
+#include <sstream>
 
 #include "cim_status.h"
 #include "cim_xml_read.h"
+#include "xml_well_formed.h"
 
 namespace testbed {
 namespace {
@@ -52,16 +54,48 @@ std::string unescaped(const std::string& text) {
     return result;
 }
 
+std::string trimmed(const std::string& text) {
+    const std::size_t first = text.find_first_not_of(" \t\"");
+    if (first == std::string::npos) return {};
+    return text.substr(first, text.find_last_not_of(" \t\"") - first + 1);
+}
+
+/// The value of a header's parameter without its quotation marks; empty when it has none.
+std::string parameterOf(const std::string& header, const std::string& name) {
+    std::istringstream parts(header.substr(std::min(header.find(';'), header.size())));
+    for (std::string part; std::getline(parts, part, ';');) {
+        const std::size_t equals = part.find('=');
+        if (equals != std::string::npos && sameName(trimmed(part.substr(0, equals)), name))
+            return trimmed(part.substr(equals + 1));
+    }
+    return {};
+}
+
+void checkContent(const HttpRequest& request) {
+    const std::string* type = request.header("Content-Type");
+    const std::string media = type ? trimmed(type->substr(0, type->find(';'))) : "";
+    if (!sameName(media, "text/xml") && !sameName(media, "application/xml"))
+        throw MessageError(415, "", "Content-Type is not XML");
+    const std::string charset = parameterOf(*type, "charset");
+    if (!charset.empty() && !sameName(charset, "utf-8"))
+        throw MessageError(415, "", "the charset is not UTF-8");
+    const std::string* coding = request.header("Content-Encoding");
+    if (coding && !sameName(trimmed(*coding), "identity"))
+        throw MessageError(415, "", "no Content-Encoding is understood");
+}
+
 void checkHttpHeaders(const HttpRequest& request) {
     const std::string* operation = request.header("CIMOperation");
     if (operation == nullptr || !sameName(*operation, "MethodCall"))
         refuse("unsupported-operation", "CIMOperation is not MethodCall");
     const std::string* version = request.header("CIMProtocolVersion");
     if (version != nullptr) requireVersion(*version, "1", "unsupported-protocol-version");
-    const std::string* type = request.header("Content-Type");
-    const std::string media = type ? foldName(type->substr(0, type->find(';'))) : "text/xml";
-    if (media.find("text/xml") != 0 && media.find("application/xml") != 0)
-        throw MessageError(415, "", "Content-Type is not XML");
+    checkContent(request);
+    const auto hosts =
+        std::count_if(request.headers.begin(), request.headers.end(),
+                      [](const auto& field) { return sameName(field.first, "Host"); });
+    if (hosts > 1 || (hosts == 0 && request.version >= 11))
+        throw MessageError(400, "", "not exactly one Host");
 }
 
 [[noreturn]] void refuseParameter(const char* name, const std::string& why) {
@@ -84,6 +118,7 @@ CimRequest::CimRequest(const HttpRequest& request)
     : document_(std::make_shared<pugi::xml_document>()) {
     checkHttpHeaders(request);
     try {
+        requireWellFormed(request.body);
         parseXml(request.body, *document_);
     } catch (const CimXmlError& error) {
         refuse("request-not-well-formed", error.what());
@@ -198,6 +233,11 @@ ObjectPath CimRequest::objectPath(const char* name) const {
 
 bool CimRequest::isClassPath(const char* name) const {
     return isElement(value(name), "CLASSNAME");
+}
+
+std::string CimRequest::classIn(const char* name) const {
+    const pugi::xml_node node = value(name);
+    return node.attribute(isElement(node, "CLASSNAME") ? "NAME" : "CLASSNAME").value();
 }
 
 }  // namespace testbed

@@ -43,6 +43,8 @@ public:
     /// INSTANCENAME, or CLASSNAME: then without keys.
     ObjectPath objectPath(const char* name) const;
     bool isClassPath(const char* name) const;
+    /// The class that the parameter names, as CLASSNAME or in INSTANCENAME; empty for none.
+    std::string classIn(const char* name) const;
 
 private:
     void readMessage(const HttpRequest& request);

@@ -48,12 +48,12 @@ pugi::xml_node openResponse(pugi::xml_document& document, const CimRequest& requ
 
 }  // namespace
 
-HttpResponse CimServer::answer(const HttpRequest& request) const {
-    if (request.method == "M-POST") return {501, {}, {}};
-    if (request.method != "POST") return {405, {{"Allow", "POST"}}, {}};
+HttpOutcome CimServer::answer(const HttpRequest& request) const {
+    if (request.method == "M-POST") return HttpResponse{501, {}, {}};
+    if (request.method != "POST") return HttpResponse{405, {{"Allow", "POST"}}, {}};
     const std::string* authorization = request.header("Authorization");
     if (credentials_ && (!authorization || !isAuthorized(*authorization, *credentials_)))
-        return {401, {{"WWW-Authenticate", "Basic realm=\"plexor-testbed\""}}, {}};
+        return HttpResponse{401, {{"WWW-Authenticate", "Basic realm=\"plexor-testbed\""}}, {}};
     try {
         return answerCall(request);
     } catch (const MessageError& error) {
@@ -61,23 +61,39 @@ HttpResponse CimServer::answer(const HttpRequest& request) const {
     }
 }
 
-HttpResponse CimServer::answerCall(const HttpRequest& request) const {
+HttpOutcome CimServer::answerCall(const HttpRequest& request) const {
     const CimRequest call(request);
+    const std::string* named = request.header("Host");
+    const std::string host = named && !named->empty() ? *named : host_;
+    const Operation* operation = call.isExtrinsic() ? nullptr : findOperation(call.method());
+    const std::string about = operation ? call.classIn(operation->parameters.front()) : "";
+    std::optional<ServerFault> fault;
+    if (faults_) fault = faults_->match(call.method(), about);
+    const bool isSlow =
+        operation && operation->asksProvider && manager_.asksProvider(call.nameSpace(), about);
+    if (!isSlow) return answerTo(call, host, fault);
+    return SlowWork([this, call, host, fault] { return answerTo(call, host, fault); });
+}
+
+HttpResponse CimServer::answerTo(const CimRequest& call, const std::string& host,
+                                 const std::optional<ServerFault>& fault) const {
     pugi::xml_document document;
     pugi::xml_node response = openResponse(document, call);
     try {
-        const std::string* host = request.header("Host");
-        carryOut(call, host && !host->empty() ? *host : host_,
-                 response.append_child("IRETURNVALUE"));
+        if (fault && fault->cimStatus)
+            throw providerStatus(static_cast<CMPIrc>(*fault->cimStatus), fault->message);
+        carryOut(call, host, response.append_child("IRETURNVALUE"));
     } catch (const CimStatus& status) {
         response.remove_child("IRETURNVALUE");
         writeError(response, status);
     }
-    return {200,
-            {{"Content-Type", "application/xml; charset=\"utf-8\""},
-             {"CIMOperation", "MethodResponse"},
-             {"Cache-Control", "no-cache"}},
-            serialize(document)};
+    HttpResponse answer{200,
+                        {{"Content-Type", "application/xml; charset=\"utf-8\""},
+                         {"CIMOperation", "MethodResponse"},
+                         {"Cache-Control", "no-cache"}},
+                        serialize(document)};
+    if (fault) befall(*fault, answer);
+    return answer;
 }
 
 void CimServer::carryOut(const CimRequest& request, const std::string& host,

@@ -25,12 +25,13 @@ const Reference* referenceIn(const CimValue& value) {
 }
 
 /// VALUE.REFERENCE tells the namespace when there is one to tell.
-void writeReference(pugi::xml_node parent, const ObjectPath& path) {
-    const pugi::xml_node node = parent.append_child("VALUE.REFERENCE");
-    if (path.nameSpace.empty())
-        writeInstanceName(node, path);
-    else
-        writeLocalInstancePath(node, path);
+void writeReference(pugi::xml_node parent, const ObjectPath& path, KeyTypes types) {
+    pugi::xml_node node = parent.append_child("VALUE.REFERENCE");
+    if (!path.nameSpace.empty()) {
+        node = node.append_child("LOCALINSTANCEPATH");
+        writeLocalNamespacePath(node, path.nameSpace);
+    }
+    writeInstanceName(node, path, types);
 }
 
 void writeArray(pugi::xml_node parent, const Elements& elements) {
@@ -51,15 +52,16 @@ const char* keyValueType(const CimValue& value) {
                : "string";
 }
 
-void writeKey(pugi::xml_node parent, const NamedValue& key) {
+void writeKey(pugi::xml_node parent, const NamedValue& key, KeyTypes types) {
     pugi::xml_node binding = parent.append_child("KEYBINDING");
     addAttribute(binding, "NAME", key.first);
     if (const Reference* reference = referenceIn(key.second)) {
-        writeReference(binding, **reference);
+        writeReference(binding, **reference, types);
         return;
     }
     pugi::xml_node node = binding.append_child("KEYVALUE");
     addAttribute(node, "VALUETYPE", keyValueType(key.second));
+    if (types == KeyTypes::Told) addAttribute(node, "TYPE", xmlTypeName(key.second.type));
     // A key that was never given a value reaches clients as an empty text.
     addText(node, key.second.isNull ? std::string() : scalarText(key.second));
 }
@@ -103,6 +105,8 @@ void writeClassProperty(pugi::xml_node parent, const PropertyDefinition& propert
     CimValue value = property.defaultValue;
     if (value.isNull) value = CimValue::null(property.type);
     pugi::xml_node node = openProperty(parent, property.name, value);
+    if (!property.referenceClass.empty())
+        addAttribute(node, "REFERENCECLASS", property.referenceClass);
     if (view.withClassOrigin) addAttribute(node, "CLASSORIGIN", property.originClass);
     if (!findDefinition(view.definition.properties, property.name))
         addAttribute(node, "PROPAGATED", "true");
@@ -111,6 +115,39 @@ void writeClassProperty(pugi::xml_node parent, const PropertyDefinition& propert
         writeQualifiers(node, property.qualifiers);
     }
     writeValue(node, value);
+}
+
+const char* parameterElement(const ParameterDefinition& parameter) {
+    const bool isArray = (parameter.type & CMPI_ARRAY) != 0;
+    if ((parameter.type & ~CMPI_ARRAY) == CMPI_ref)
+        return isArray ? "PARAMETER.REFARRAY" : "PARAMETER.REFERENCE";
+    return isArray ? "PARAMETER.ARRAY" : "PARAMETER";
+}
+
+void writeParameter(pugi::xml_node parent, const ParameterDefinition& parameter,
+                    bool withQualifiers) {
+    pugi::xml_node node = parent.append_child(parameterElement(parameter));
+    addAttribute(node, "NAME", parameter.name);
+    if ((parameter.type & ~CMPI_ARRAY) != CMPI_ref)
+        addAttribute(node, "TYPE", xmlTypeName(parameter.type));
+    else if (!parameter.referenceClass.empty())
+        addAttribute(node, "REFERENCECLASS", parameter.referenceClass);
+    if (withQualifiers) writeQualifiers(node, parameter.qualifiers);
+}
+
+void writeMethod(pugi::xml_node parent, const MethodDefinition& method, const ClassView& view) {
+    pugi::xml_node node = parent.append_child("METHOD");
+    addAttribute(node, "NAME", method.name);
+    addAttribute(node, "TYPE", xmlTypeName(method.type));
+    if (view.withClassOrigin) addAttribute(node, "CLASSORIGIN", method.originClass);
+    const auto& own = view.definition.methods;
+    if (std::none_of(own.begin(), own.end(), [&](const MethodDefinition& entry) {
+            return sameName(entry.name, method.name);
+        }))
+        addAttribute(node, "PROPAGATED", "true");
+    if (view.withQualifiers) writeQualifiers(node, method.qualifiers);
+    for (const ParameterDefinition& parameter : method.parameters)
+        writeParameter(node, parameter, view.withQualifiers);
 }
 
 /// Line ends of the carriage return kind survive only as character references.
@@ -133,7 +170,7 @@ void writeValue(pugi::xml_node parent, const CimValue& value) {
     if (const auto* elements = std::get_if<Elements>(&value.data))
         writeArray(parent, *elements);
     else if (const Reference* reference = referenceIn(value))
-        writeReference(parent, **reference);
+        writeReference(parent, **reference, KeyTypes::Told);
     else
         addText(parent.append_child("VALUE"), scalarText(value));
 }
@@ -170,22 +207,22 @@ void writeClassName(pugi::xml_node parent, std::string_view className) {
     addAttribute(parent.append_child("CLASSNAME"), "NAME", className);
 }
 
-void writeInstanceName(pugi::xml_node parent, const ObjectPath& path) {
+void writeInstanceName(pugi::xml_node parent, const ObjectPath& path, KeyTypes types) {
     pugi::xml_node node = parent.append_child("INSTANCENAME");
     addAttribute(node, "CLASSNAME", path.className);
-    for (const NamedValue& key : path.keys) writeKey(node, key);
+    for (const NamedValue& key : path.keys) writeKey(node, key, types);
 }
 
 void writeLocalInstancePath(pugi::xml_node parent, const ObjectPath& path) {
     const pugi::xml_node node = parent.append_child("LOCALINSTANCEPATH");
     writeLocalNamespacePath(node, path.nameSpace);
-    writeInstanceName(node, path);
+    writeInstanceName(node, path, KeyTypes::Told);
 }
 
 void writeInstancePath(pugi::xml_node parent, const ObjectPath& path, std::string_view host) {
     const pugi::xml_node node = parent.append_child("INSTANCEPATH");
     writeNamespacePath(node, path.nameSpace, host);
-    writeInstanceName(node, path);
+    writeInstanceName(node, path, KeyTypes::Told);
 }
 
 void writeInstance(pugi::xml_node parent, const Instance& instance,
@@ -200,7 +237,7 @@ void writeInstance(pugi::xml_node parent, const Instance& instance,
 void writeNamedInstance(pugi::xml_node parent, const Instance& instance,
                         const InstanceDetails& details) {
     const pugi::xml_node node = parent.append_child("VALUE.NAMEDINSTANCE");
-    writeInstanceName(node, instance.path);
+    writeInstanceName(node, instance.path, KeyTypes::Told);
     writeInstance(node, instance, details);
 }
 
@@ -216,9 +253,14 @@ void writeClass(pugi::xml_node parent, const ClassView& view) {
     addAttribute(node, "NAME", view.definition.name);
     if (!view.definition.superclass.empty())
         addAttribute(node, "SUPERCLASS", view.definition.superclass);
-    if (view.withQualifiers) writeQualifiers(node, view.definition.qualifiers);
+    if (view.withQualifiers) {
+        if (view.definition.isAssociation)
+            writeQualifier(node, {"Association", CimValue::boolean(true)});
+        writeQualifiers(node, view.definition.qualifiers);
+    }
     for (const PropertyDefinition& property : view.properties)
         writeClassProperty(node, property, view);
+    for (const MethodDefinition& method : view.methods) writeMethod(node, method, view);
 }
 
 std::string serialize(const pugi::xml_document& document) {

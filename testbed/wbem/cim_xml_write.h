@@ -24,11 +24,12 @@ struct InstanceDetails {
 struct ClassView {
     ClassDefinition definition;                  ///< its properties: those it does not inherit
     std::vector<PropertyDefinition> properties;  ///< those to show
+    std::vector<MethodDefinition> methods;       ///< those to show
     bool withQualifiers = false;
     bool withClassOrigin = false;
 };
 
-/// VALUE, VALUE.ARRAY or VALUE.REFERENCE; nothing for a null value.
+/// VALUE, VALUE.ARRAY or VALUE.REFERENCE, whose keys tell their types; nothing for a null value.
 void writeValue(pugi::xml_node parent, const CimValue& value);
 /// PROPERTY, PROPERTY.ARRAY or PROPERTY.REFERENCE, whose node is returned.
 pugi::xml_node writeProperty(pugi::xml_node parent, const NamedValue& property);
@@ -37,7 +38,10 @@ void writeQualifier(pugi::xml_node parent, const NamedValue& qualifier);
 void writeLocalNamespacePath(pugi::xml_node parent, std::string_view nameSpace);
 void writeNamespacePath(pugi::xml_node parent, std::string_view nameSpace, std::string_view host);
 void writeClassName(pugi::xml_node parent, std::string_view className);
-void writeInstanceName(pugi::xml_node parent, const ObjectPath& path);
+/// Whether keys tell their CIM type. A client that has only guessed it from a text must not.
+enum class KeyTypes { Told, Untold };
+void writeInstanceName(pugi::xml_node parent, const ObjectPath& path,
+                       KeyTypes types = KeyTypes::Untold);
 void writeLocalInstancePath(pugi::xml_node parent, const ObjectPath& path);
 void writeInstancePath(pugi::xml_node parent, const ObjectPath& path, std::string_view host);
 

@@ -9,9 +9,10 @@
 
 namespace testbed {
 
-/// What an operation's parameters say about the instances it returns.
+/// What an operation's parameters say about the instances it returns. LocalOnly is not among them:
+/// for instances the protocol lets servers ignore it, and most do, as clients leave it out and mean
+/// all properties.
 struct ViewOptions {
-    bool localOnly = false;
     bool withQualifiers = false;
     bool withClassOrigin = false;
     /// Only properties that this class knows; empty: those of the subclasses too.
@@ -19,7 +20,7 @@ struct ViewOptions {
 };
 
 /// For the instances of one request: what is asked of a class once is kept. Properties that the
-/// class does not know are shown always, as are all of a class that is not known.
+/// class does not know are shown, unless only those of a superclass are wanted.
 class InstanceView {
 public:
     InstanceView(const Repository& repository, ViewOptions options)
@@ -30,16 +31,10 @@ public:
     const InstanceDetails& detailsOf(const Instance& instance);
 
 private:
-    struct Known {
-        InstanceDetails details;
-        std::vector<PropertyDefinition> own;
-    };
-    const Known& knownOf(const Instance& instance);
-    bool isShown(const std::string& property, const Known& known) const;
-
     const Repository& repository_;
     ViewOptions options_;
-    std::map<std::string, Known> classes_;  // by the path's class, folded, behind its namespace
+    std::map<std::string, InstanceDetails>
+        classes_;  // by the path's class, folded, behind its namespace
 };
 
 }  // namespace testbed

@@ -4,6 +4,7 @@
 #include <iterator>
 
 #include "cim_status.h"
+#include "interop_objects.h"
 
 namespace testbed {
 namespace {
@@ -33,6 +34,12 @@ void restrictTo(const PropertyList& properties, Instance& instance) {
     });
 }
 
+ObjectManager::ObjectManager(Repository& repository, std::optional<Registration> provider,
+                             std::string system)
+    : repository_(repository), provider_(std::move(provider)), system_(std::move(system)) {
+    defineInteropClasses(repository_);
+}
+
 void ObjectManager::requireNamespace(const std::string& nameSpace) const {
     if (!repository_.hasNamespace(nameSpace))
         throw CimStatus(CMPI_RC_ERR_INVALID_NAMESPACE, "no namespace " + nameSpace);
@@ -60,6 +67,29 @@ std::vector<std::string> ObjectManager::providerClasses(const std::string& nameS
     return classes;
 }
 
+std::vector<Instance> ObjectManager::staticInstances(const std::string& nameSpace,
+                                                     const std::string& className) const {
+    std::vector<Instance> found = repository_.enumerate(nameSpace, className);
+    append(found, repository_.associationInstances(nameSpace, className));
+    append(found, interopInstances(repository_, nameSpace, className, system_));
+    return found;
+}
+
+std::optional<Instance> ObjectManager::staticInstance(const ObjectPath& path) const {
+    if (auto found = repository_.get(path)) return found;
+    for (Instance& instance : staticInstances(path.nameSpace, path.className))
+        if (instance.path == path) return std::move(instance);
+    return std::nullopt;
+}
+
+void ObjectManager::requireKnown(const char* parameter,
+                                 const std::optional<std::string>& className) const {
+    // An association may lead into a namespace with classes of its own.
+    if (className && !className->empty() && !repository_.knowsClass(*className))
+        throw CimStatus(CMPI_RC_ERR_INVALID_PARAMETER,
+                        std::string(parameter) + ": no class " + *className);
+}
+
 std::vector<ObjectPath> ObjectManager::instanceNames(const std::string& nameSpace,
                                                      const std::string& className) const {
     requireClass(nameSpace, className);
@@ -68,7 +98,7 @@ std::vector<ObjectPath> ObjectManager::instanceNames(const std::string& nameSpac
         InstanceClient client = provider_->client;
         append(names, checked(client.enumerateInstanceNames(served, nameSpace)).paths);
     }
-    for (Instance& instance : repository_.enumerate(nameSpace, className))
+    for (Instance& instance : staticInstances(nameSpace, className))
         names.push_back(std::move(instance.path));
     return names;
 }
@@ -82,7 +112,7 @@ std::vector<Instance> ObjectManager::instances(const std::string& nameSpace,
         InstanceClient client = provider_->client;
         append(found, checked(client.enumerateInstances(served, properties, nameSpace)).instances);
     }
-    for (Instance& instance : repository_.enumerate(nameSpace, className)) {
+    for (Instance& instance : staticInstances(nameSpace, className)) {
         restrictTo(properties, instance);
         found.push_back(std::move(instance));
     }
@@ -96,7 +126,7 @@ Instance ObjectManager::instance(const ObjectPath& path, const PropertyList& pro
         Response response = checked(client.getInstance(path, properties));
         // More than one instance is a provider's mistake that managers do not show to clients.
         if (!response.instances.empty()) return std::move(response.instances.front());
-    } else if (auto found = repository_.get(path)) {
+    } else if (auto found = staticInstance(path)) {
         restrictTo(properties, *found);
         return std::move(*found);
     }
@@ -106,6 +136,8 @@ Instance ObjectManager::instance(const ObjectPath& path, const PropertyList& pro
 std::vector<Instance> ObjectManager::associators(const ObjectPath& source,
                                                  const AssociationFilter& filter) const {
     requireClass(source.nameSpace, source.className);
+    requireKnown("AssocClass", filter.assocClass);
+    requireKnown("ResultClass", filter.resultClass);
     return repository_.associators(source, filter);
 }
 
@@ -113,6 +145,7 @@ std::vector<Instance> ObjectManager::references(const ObjectPath& source,
                                                 const std::string& resultClass,
                                                 const std::string& role) const {
     requireClass(source.nameSpace, source.className);
+    requireKnown("ResultClass", resultClass);
     return repository_.references(source, resultClass, role);
 }
 

@@ -23,14 +23,21 @@ struct Registration {
 class ObjectManager {
 public:
     /// The repository and the provider must outlive the manager.
-    explicit ObjectManager(Repository& repository, std::optional<Registration> provider = {})
-        : repository_(repository), provider_(std::move(provider)) {}
+    /// Defines in root/interop the classes by which clients find namespaces and server. `system`
+    /// names this host.
+    explicit ObjectManager(Repository& repository, std::optional<Registration> provider = {},
+                           std::string system = "localhost");
 
     const Repository& repository() const { return repository_; }
 
     void requireNamespace(const std::string& nameSpace) const;
     /// The class is in the namespace, or registered for it. Status 5.
     void requireClass(const std::string& nameSpace, const std::string& className) const;
+
+    /// Whether the class, or one below it, is a provider's.
+    bool asksProvider(const std::string& nameSpace, const std::string& className) const {
+        return !providerClasses(nameSpace, className).empty();
+    }
 
     /// Of the class and all below it. A provider that fails fails the request.
     std::vector<ObjectPath> instanceNames(const std::string& nameSpace,
@@ -50,6 +57,13 @@ public:
     ObjectPath withKeyName(ObjectPath path) const;
 
 private:
+    /// All that need no provider: the repository's instances and associations, and the manager's
+    /// own.
+    std::vector<Instance> staticInstances(const std::string& nameSpace,
+                                          const std::string& className) const;
+    std::optional<Instance> staticInstance(const ObjectPath& path) const;
+    /// Classes that a walk names must be known. Status 4.
+    void requireKnown(const char* parameter, const std::optional<std::string>& className) const;
     /// The provider's classes that a request for the class is meant for, each in the spelling in
     /// which the provider is to see it.
     std::vector<std::string> providerClasses(const std::string& nameSpace,
@@ -58,6 +72,7 @@ private:
 
     Repository& repository_;
     std::optional<Registration> provider_;
+    std::string system_;
 };
 
 /// Leaves only those properties that the list has.

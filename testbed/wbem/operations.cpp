@@ -5,14 +5,16 @@ namespace {
 
 const std::vector<Operation>& operations() {
     static const std::vector<Operation> table = {
-        {"EnumerateInstanceNames", enumerateInstanceNames, {"ClassName"}},
+        {"EnumerateInstanceNames", enumerateInstanceNames, {"ClassName"}, true},
         {"EnumerateInstances",
          enumerateInstances,
          {"ClassName", "LocalOnly", "DeepInheritance", "IncludeQualifiers", "IncludeClassOrigin",
-          "PropertyList"}},
+          "PropertyList"},
+         true},
         {"GetInstance",
          getInstance,
-         {"InstanceName", "LocalOnly", "IncludeQualifiers", "IncludeClassOrigin", "PropertyList"}},
+         {"InstanceName", "LocalOnly", "IncludeQualifiers", "IncludeClassOrigin", "PropertyList"},
+         true},
         {"Associators",
          associators,
          {"ObjectName", "AssocClass", "ResultClass", "Role", "ResultRole", "IncludeQualifiers",

@@ -23,7 +23,9 @@ using OperationFunction = void (*)(const OperationContext& context, const CimReq
 struct Operation {
     const char* name;
     OperationFunction run;
+    /// The first names the class or the object that it is about.
     std::vector<const char*> parameters;
+    bool asksProvider = false;  ///< for the classes that have one
 };
 
 /// NULL for an operation that is not served.

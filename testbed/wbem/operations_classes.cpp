@@ -13,9 +13,11 @@ ClassView viewOf(const Repository& repository, const CimRequest& request,
     ClassView view;
     view.withQualifiers = request.flag("IncludeQualifiers", true);
     view.withClassOrigin = request.flag("IncludeClassOrigin", false);
-    view.properties = request.flag("LocalOnly", true)
-                          ? definition.properties
-                          : repository.allProperties(request.nameSpace(), definition.name);
+    const bool isLocal = request.flag("LocalOnly", true);
+    view.properties = isLocal ? definition.properties
+                              : repository.allProperties(request.nameSpace(), definition.name);
+    view.methods =
+        isLocal ? definition.methods : repository.allMethods(request.nameSpace(), definition.name);
     view.definition = std::move(definition);
     return view;
 }

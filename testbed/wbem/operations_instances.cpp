@@ -8,7 +8,7 @@ namespace {
 
 ViewOptions viewOptions(const CimRequest& request) {
     ViewOptions options;
-    options.localOnly = request.flag("LocalOnly", true);
+    request.flag("LocalOnly", true);  // must be a truth value; what it says is ignored
     options.withQualifiers = request.flag("IncludeQualifiers", false);
     options.withClassOrigin = request.flag("IncludeClassOrigin", false);
     return options;
@@ -20,7 +20,7 @@ void enumerateInstanceNames(const OperationContext& context, const CimRequest& r
                             pugi::xml_node result) {
     for (const ObjectPath& name :
          context.manager.instanceNames(request.nameSpace(), request.className()))
-        writeInstanceName(result, name);
+        writeInstanceName(result, name, KeyTypes::Told);
 }
 
 void enumerateInstances(const OperationContext& context, const CimRequest& request,

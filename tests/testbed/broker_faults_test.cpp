@@ -230,6 +230,33 @@ TEST_F(BrokerFaults, DelayAndLatency) {
     }
 }
 
+TEST_F(BrokerFaults, WaitsEndWhenTheFaultsAreCleared) {
+    FaultRule hang = rule(Entry::EnumerateInstances);
+    hang.delay = std::chrono::minutes(10);
+    broker.faults().add(hang);
+    std::thread rescue([&] {
+        while (broker.books().queries().empty()) std::this_thread::yield();
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+        broker.faults().clear();
+    });
+    EXPECT_LT(timeOf([&] { EXPECT_NE(query(), nullptr); }), std::chrono::minutes(1));
+    rescue.join();
+}
+
+TEST_F(BrokerFaults, NothingIsWaitedForAtTheEnd) {
+    FaultRule hang = rule(Entry::EnumerateInstances);
+    hang.delay = std::chrono::minutes(10);
+    broker.faults().add(hang);
+    broker.faults().setLatency(std::chrono::minutes(10), std::chrono::minutes(10));
+    broker.faults().endWaits();
+    EXPECT_LT(timeOf([&] {
+                  query();
+                  broker.faults().clear();
+                  query();
+              }),
+              std::chrono::minutes(1));
+}
+
 TEST_F(BrokerFaults, HookRunsBeforeTheAnswerAndMayUseTheBroker) {
     FaultRule change = rule(Entry::EnumerateInstances);
     change.times = 1;

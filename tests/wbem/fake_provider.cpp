@@ -18,8 +18,11 @@ void FakeProvider::note(const CMPIObjectPath* path, const char** properties) {
     if (properties != nullptr) question.properties.emplace();
     for (; properties != nullptr && *properties != nullptr; ++properties)
         question.properties->emplace_back(*properties);
-    const std::lock_guard lock(mutex_);
-    questions_.push_back(std::move(question));
+    {
+        const std::lock_guard lock(mutex_);
+        questions_.push_back(std::move(question));
+    }
+    if (hook) hook();
 }
 
 CMPIStatus FakeProvider::status() {

@@ -3,6 +3,7 @@
 
 #include <cmpift.h>
 
+#include <functional>
 #include <mutex>
 #include <optional>
 #include <string>
@@ -25,6 +26,7 @@ public:
     std::vector<Instance> instances;
     CMPIrc rc = CMPI_RC_OK;
     std::string message;
+    std::function<void()> hook;  ///< run by each request, on its thread
 
     struct Question {
         ObjectPath path;

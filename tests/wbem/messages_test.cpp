@@ -30,13 +30,14 @@ TEST_F(Messages, AnswerIsFramedAsDemanded) {
     EXPECT_EQ(reply.status, 200);
     EXPECT_EQ(reply.header("CIMOperation"), "MethodResponse");
     EXPECT_EQ(reply.header("Content-Type"), "application/xml; charset=\"utf-8\"");
-    EXPECT_EQ(reply.body,
-              R"(<?xml version="1.0" encoding="utf-8"?><CIM CIMVERSION="2.0" DTDVERSION="2.0">)"
-              R"(<MESSAGE ID="m1" PROTOCOLVERSION="1.0"><SIMPLERSP>)"
-              R"(<IMETHODRESPONSE NAME="EnumerateInstanceNames"><IRETURNVALUE>)"
-              R"(<INSTANCENAME CLASSNAME="Local_Disk"><KEYBINDING NAME="Name">)"
-              R"(<KEYVALUE VALUETYPE="string">l0</KEYVALUE></KEYBINDING></INSTANCENAME>)"
-              R"(</IRETURNVALUE></IMETHODRESPONSE></SIMPLERSP></MESSAGE></CIM>)");
+    EXPECT_EQ(
+        reply.body,
+        R"(<?xml version="1.0" encoding="utf-8"?><CIM CIMVERSION="2.0" DTDVERSION="2.0">)"
+        R"(<MESSAGE ID="m1" PROTOCOLVERSION="1.0"><SIMPLERSP>)"
+        R"(<IMETHODRESPONSE NAME="EnumerateInstanceNames"><IRETURNVALUE>)"
+        R"(<INSTANCENAME CLASSNAME="Local_Disk"><KEYBINDING NAME="Name">)"
+        R"(<KEYVALUE VALUETYPE="string" TYPE="string">l0</KEYVALUE></KEYBINDING></INSTANCENAME>)"
+        R"(</IRETURNVALUE></IMETHODRESPONSE></SIMPLERSP></MESSAGE></CIM>)");
 }
 
 TEST_F(Messages, FailureIsFramedAsDemanded) {

@@ -34,6 +34,40 @@ TEST_F(ClassOperations, GetClassAsAskedFor) {
               Names{"Size"});
 }
 
+TEST_F(ClassOperations, AssociationsSayWhatTheyAre) {
+    PropertyDefinition part{"Part", CMPI_ref, true, "Vendor_Owns", CimValue::null(CMPI_ref), {}};
+    part.referenceClass = "Vendor_Disk";
+    repository_.defineClass("root/cimv2", {"Vendor_Owns", "", {part}, {}, true});
+    EXPECT_EQ(get("//CLASS/QUALIFIER/@NAME", "Vendor_Owns"), Names{"Association"});
+    EXPECT_EQ(get("//PROPERTY.REFERENCE/@REFERENCECLASS", "Vendor_Owns"), Names{"Vendor_Disk"});
+    EXPECT_EQ(get("//PROPERTY.REFERENCE/QUALIFIER/@NAME", "Vendor_Owns"), Names{"Key"});
+}
+
+TEST_F(ClassOperations, MethodsAreDescribed) {
+    ClassDefinition definition = *repository_.findClass("root/cimv2", "CIM_Disk");
+    definition.methods = {
+        {"Reset",
+         CMPI_uint32,
+         "CIM_Disk",
+         {{"Mode", CMPI_uint16, "", {{"In", CimValue::boolean(true)}}},
+          {"Names", CMPI_stringA, "", {}},
+          {"Job", CMPI_ref, "CIM_Thing", {}},
+          {"Others", static_cast<CMPIType>(CMPI_ref | CMPI_ARRAY), "CIM_Disk", {}}},
+         {{"Description", CimValue::string("Begins anew.")}}}};
+    repository_.defineClass("root/cimv2", definition);
+    EXPECT_EQ(get("//METHOD/@TYPE", "CIM_Disk"), Names{"uint32"});
+    EXPECT_EQ(get("//METHOD/*[self::PARAMETER or self::PARAMETER.ARRAY]/@TYPE", "CIM_Disk"),
+              (Names{"uint16", "string"}));
+    EXPECT_EQ(get("//PARAMETER.REFERENCE/@REFERENCECLASS", "CIM_Disk"), Names{"CIM_Thing"});
+    EXPECT_EQ(get("//PARAMETER.REFARRAY/@NAME", "CIM_Disk"), Names{"Others"});
+    EXPECT_EQ(get("//METHOD//QUALIFIER/@NAME", "CIM_Disk"), (Names{"Description", "In"}));
+    EXPECT_EQ(get("//METHOD", "Served_Disk").size(), 0U);
+    EXPECT_EQ(
+        get("//METHOD[@PROPAGATED='true']/@CLASSORIGIN", "Served_Disk",
+            valueParameter("LocalOnly", "FALSE") + valueParameter("IncludeClassOrigin", "TRUE")),
+        Names{"CIM_Disk"});
+}
+
 TEST_F(ClassOperations, EnumerateClassNames) {
     const auto names = [&](const std::string& parameters, const char* nameSpace = "root/cimv2") {
         return callFor("//CLASSNAME/@NAME", "EnumerateClassNames", parameters, nameSpace);

@@ -60,12 +60,14 @@ TEST_F(InstanceOperations, PropertyListRestrictsTheRepositorysInstances) {
     EXPECT_EQ(propertiesOf("Local_Disk", all_ + listParameter("PropertyList", {})), Names{});
 }
 
-TEST_F(InstanceOperations, LocalOnlyIsTheDefaultAndLeavesInheritedPropertiesAway) {
-    EXPECT_EQ(propertiesOf("Served_Disk", ""), Names{"Speed"});
-    EXPECT_EQ(propertiesOf("Served_Disk", valueParameter("LocalOnly", "true")), Names{"Speed"});
-    EXPECT_EQ(propertiesOf("Served_Disk", all_), (Names{"Name", "Caption", "Size", "Speed"}));
-    // What no class knows is no inherited property.
-    EXPECT_EQ(propertiesOf("Local_Disk", ""), Names{"Extra"});
+TEST_F(InstanceOperations, LocalOnlyLeavesNothingAway) {
+    const Names all = {"Name", "Caption", "Size", "Speed"};
+    for (const std::string& parameter : {std::string(), valueParameter("LocalOnly", "true"), all_})
+        EXPECT_EQ(propertiesOf("Served_Disk", parameter), all) << parameter;
+    EXPECT_EQ(propertiesOf("Local_Disk", ""), (Names{"Name", "Caption", "Size", "Extra"}));
+    EXPECT_EQ(callFor(kPropertyNames, "GetInstance",
+                      instanceNameParameter("InstanceName", "Served_Disk", {{"Name", "s0"}})),
+              all);
 }
 
 TEST_F(InstanceOperations, WithoutDeepInheritanceSubclassesAddNothing) {

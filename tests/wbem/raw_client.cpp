@@ -87,6 +87,24 @@ Reply RawClient::receive(std::chrono::milliseconds limit) {
     return reply;
 }
 
+std::string RawClient::receiveUntil(std::string_view mark, int count) {
+    const auto deadline = std::chrono::steady_clock::now() + std::chrono::seconds(20);
+    std::size_t end = 0;
+    while (count > 0) {
+        const std::size_t found = arrived_.find(mark, end);
+        if (found != std::string::npos) {
+            end = found + mark.size();
+            count--;
+        } else if (!waitForBytes(deadline)) {
+            end = arrived_.size();
+            break;
+        }
+    }
+    std::string text = arrived_.substr(0, end);
+    arrived_.erase(0, end);
+    return text;
+}
+
 bool RawClient::isClosedWithin(std::chrono::milliseconds limit) {
     const auto deadline = std::chrono::steady_clock::now() + limit;
     while (waitForBytes(deadline)) {

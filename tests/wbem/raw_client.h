@@ -33,6 +33,9 @@ public:
     void endSending();
     /// The next answer; as far as it came when the server closes or the time is over.
     Reply receive(std::chrono::milliseconds limit = std::chrono::seconds(20));
+    /// Everything as it comes, up to the `count`th `mark` and with it; less when the server closes
+    /// or the time is over.
+    std::string receiveUntil(std::string_view mark, int count);
     /// True when the server closes the connection within the time.
     bool isClosedWithin(std::chrono::milliseconds limit);
 

@@ -39,11 +39,6 @@ void defineServed(Repository& repository) {
     repository.put(local);
 }
 
-ObjectPath vendorPath(const char* className, const char* name) {
-    ObjectPath path{"root/vendor", className, {}};
-    return path.key("Name", CimValue::string(name));
-}
-
 void buildVendorSide(Repository& repository) {
     defineThings(repository, "root/vendor");
     repository.defineClass("root/vendor", {"Vendor_Box", "CIM_Thing", {}, {}, false});
@@ -72,6 +67,11 @@ std::string element(const char* name, const std::string& value) {
 }
 
 }  // namespace
+
+ObjectPath vendorPath(const char* className, const char* name) {
+    ObjectPath path{"root/vendor", className, {}};
+    return path.key("Name", CimValue::string(name));
+}
 
 std::string localNamespace(const std::string& nameSpace) {
     std::istringstream parts(nameSpace);
@@ -145,6 +145,8 @@ void WbemFixture::serve(HttpServerOptions options, std::optional<Credentials> cr
     manager_ = std::make_unique<ObjectManager>(
         repository_, Registration{provider_.client(), "root/cimv2", {"Served_Disk"}});
     cim_ = std::make_unique<CimServer>(*manager_, "host", std::move(credentials));
+    cim_->failBy(faults_);
+    options.welcome = [this] { return faults_.welcome(); };
     http_ = std::make_unique<HttpServer>(
         options, [this](const HttpRequest& request) { return cim_->answer(request); });
 }

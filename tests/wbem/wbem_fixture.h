@@ -15,6 +15,8 @@
 
 namespace testbed {
 
+/// The path of a box or a disk in root/vendor.
+ObjectPath vendorPath(const char* className, const char* name);
 /// A namespace path in XML.
 std::string localNamespace(const std::string& nameSpace);
 /// The message for an intrinsic operation; `parameters` are IPARAMVALUE elements.
@@ -58,6 +60,7 @@ protected:
     Repository repository_;
     Broker broker_{repository_};
     FakeProvider provider_{broker_};
+    ServerFaults faults_;
     std::unique_ptr<ObjectManager> manager_;
     std::unique_ptr<CimServer> cim_;
     std::unique_ptr<HttpServer> http_;

@@ -72,7 +72,7 @@ class Server:
             env=environment(), text=True)
         atexit.register(self.process.kill)  # whatever becomes of the test
         first = self.process.stdout.readline()
-        match = re.fullmatch(r"serving http://(127\.0\.0\.1:\d+)/cimom\n", first)
+        match = re.fullmatch(r"serving https?://(127\.0\.0\.1:\d+)/cimom\n", first)
         if not match:
             self.process.kill()
             raise RuntimeError("the server said: " + first + self.process.communicate()[1])

@@ -1,11 +1,14 @@
 #!/usr/bin/env python3
 """wbemcli against `plexor-testbed serve` from an install tree: what the client prints must be what
 `plexor-testbed show` answers for the same scenario, and what was worked out by hand."""
+import json
 import os
 import re
 import shutil
 import signal
+import subprocess
 import tempfile
+import time
 import unittest
 
 import wbemcli_support as support
@@ -279,11 +282,70 @@ class LiveServer(unittest.TestCase):
                       Client("ein", url.replace("//", "//admin:wrong@")).errors)
         self.assertEqual(len(Client("ein", url.replace("//", "//admin:open-sesame@")).lines()), 1)
 
+    def test_https_with_a_throw_away_certificate(self):
+        server = self.start("--tls-self-signed")
+        url = server.url(PREFIX + "Controller").replace("http:", "https:")
+        answer = Client("-noverify", "ein", url)
+        self.assertEqual(len(answer.lines()), 1, answer.errors)
+        self.assertEqual(Client("ein", url.replace("https:", "http:")).output, "")
+
+    def test_server_fails_on_command(self):
+        server = self.start()
+        controllers = server.url(PREFIX + "Controller")
+        server.say('server status=2 message="the array sleeps" times=1')
+        server.say("server http=20")
+        for expected in ("> server status=2", "> server http=20", "? http: a number from 400"):
+            self.assertTrue(server.process.stdout.readline().startswith(expected), expected)
+        self.assertIn("the array sleeps", Client("ein", controllers).errors)
+        self.assertEqual(len(Client("ein", controllers).lines()), 1)
+        server.say("server connection=refuse")
+        self.assertTrue(support.wait_until(
+            lambda: "connect" in Client("ein", controllers).errors, 20))
+        server.say("clear server")
+        self.assertTrue(support.wait_until(lambda: Client("ein", controllers).lines(), 20))
+
+    def hang(self, server):
+        """Lets the provider's questions wait for ten minutes."""
+        server.say("latency 600000 600000")
+        server.say("fault call=associators delayMs=600000")
+
+    def test_waiting_faults_do_not_keep_it_from_ending(self):
+        for end in (lambda ended: ended.process.terminate(), lambda ended: ended.say("quit")):
+            server = self.start("--interval", "1")
+            volumes = server.url(PREFIX + "StorageVolume")
+            self.assertTrue(support.wait_until(lambda: len(Client("ein", volumes).lines()) == 2))
+            self.hang(server)
+            time.sleep(3)  # a refresh is under way, and waits
+            begin = time.monotonic()
+            self.assertEqual(server.end(end), 0)
+            self.assertLess(time.monotonic() - begin, 20)
+
+    def test_faults_at_the_start_do_not_keep_it_from_ending(self):
+        file = os.path.join(self.directory(), "scenario.json")
+        with open(support.scenario_file("healthy-array"), encoding="utf-8") as stream:
+            scenario = json.load(stream)
+        scenario["faults"] = [{"call": call, "delayMs": 600000} for call in
+                              ("enumerateInstances", "enumerateInstanceNames", "associators")]
+        with open(file, "w", encoding="utf-8") as stream:
+            json.dump(scenario, stream)
+        process = subprocess.Popen([support.TOOL, "serve", "--scenario", file, "--port", "0"],
+                                   stdin=subprocess.PIPE, stdout=subprocess.DEVNULL,
+                                   env=support.environment())
+        self.addCleanup(process.kill)
+        self.addCleanup(process.stdin.close)
+        time.sleep(2)  # the provider's start waits by now
+        process.terminate()
+        self.assertEqual(process.wait(timeout=30), 0)
+
     def test_mistakes_end_with_a_line(self):
         taken = self.start().host.rpartition(":")[2]
         file = support.scenario_file("healthy-array")
         for why, arguments, port in (("Address already in use", [], taken),
                                      ("cannot listen on nowhere", ["--listen", "nowhere"], "0"),
+                                     ("--user has no name",
+                                      ["--user", "", "--password-file", file], "0"),
+                                     ("everybody who reaches 0.0.0.0 could ask",
+                                      ["--listen", "0.0.0.0"], "0"),
                                      ("no password in /nonexistent",
                                       ["--user", "a", "--password-file", "/nonexistent"], "0")):
             with self.assertRaisesRegex(RuntimeError, "plexor-testbed: .*" + why):

@@ -69,14 +69,25 @@ constexpr const char* kSampleName =
     R"(</KEYVALUE></KEYBINDING><KEYBINDING NAME="Z"><KEYVALUE VALUETYPE="string">)"
     R"(</KEYVALUE></KEYBINDING></INSTANCENAME>)";
 
+constexpr const char* kTypedName =
+    R"(<INSTANCENAME CLASSNAME="C"><KEYBINDING NAME="S"><KEYVALUE VALUETYPE="string" )"
+    R"(TYPE="string">x</KEYVALUE></KEYBINDING><KEYBINDING NAME="N"><KEYVALUE )"
+    R"(VALUETYPE="numeric" TYPE="uint16">4</KEYVALUE></KEYBINDING><KEYBINDING NAME="B">)"
+    R"(<KEYVALUE VALUETYPE="boolean" TYPE="boolean">TRUE</KEYVALUE></KEYBINDING>)"
+    R"(<KEYBINDING NAME="Z"><KEYVALUE VALUETYPE="string" TYPE="string"></KEYVALUE>)"
+    R"(</KEYBINDING></INSTANCENAME>)";
+
 TEST(Write, Paths) {
     EXPECT_EQ(written([](pugi::xml_node node) { writeInstanceName(node, samplePath()); }),
               kSampleName);
+    EXPECT_EQ(
+        written([](pugi::xml_node node) { writeInstanceName(node, samplePath(), KeyTypes::Told); }),
+        kTypedName);
     EXPECT_EQ(written([](pugi::xml_node node) { writeInstancePath(node, samplePath(), "h"); }),
               std::string(R"(<INSTANCEPATH><NAMESPACEPATH><HOST>h</HOST><LOCALNAMESPACEPATH>)"
                           R"(<NAMESPACE NAME="root"></NAMESPACE><NAMESPACE NAME="a"></NAMESPACE>)"
                           R"(</LOCALNAMESPACEPATH></NAMESPACEPATH>)") +
-                  kSampleName + "</INSTANCEPATH>");
+                  kTypedName + "</INSTANCEPATH>");
     EXPECT_EQ(written([](pugi::xml_node node) {
                   writeInstanceName(node, {"", "C", {}});
               }),
@@ -89,6 +100,10 @@ TEST(Write, References) {
               R"(<LOCALNAMESPACEPATH><NAMESPACE NAME="n"></NAMESPACE></LOCALNAMESPACEPATH>)"
               R"(<INSTANCENAME CLASSNAME="C"></INSTANCENAME></LOCALINSTANCEPATH>)"
               R"(</VALUE.REFERENCE></PROPERTY.REFERENCE>)");
+    EXPECT_EQ(property(CimValue::reference({"", "C", {{"K", CimValue::uint8(1)}}})),
+              R"(<PROPERTY.REFERENCE NAME="P"><VALUE.REFERENCE><INSTANCENAME CLASSNAME="C">)"
+              R"(<KEYBINDING NAME="K"><KEYVALUE VALUETYPE="numeric" TYPE="uint8">1</KEYVALUE>)"
+              R"(</KEYBINDING></INSTANCENAME></VALUE.REFERENCE></PROPERTY.REFERENCE>)");
     ObjectPath association{"", "A", {}};
     association.key("Part", CimValue::reference({"", "C", {}}));
     EXPECT_EQ(written([&](pugi::xml_node node) { writeInstanceName(node, association); }),

@@ -1,0 +1,269 @@
+#include "http_connection.h"
+
+#include <algorithm>
+
+namespace testbed {
+namespace {
+
+namespace asio = boost::asio;
+namespace beast = boost::beast;
+namespace http = beast::http;
+using asio::use_awaitable;
+using asio::ip::tcp;
+using Clock = HttpConnection::Clock;
+using Parser = http::request_parser<http::string_body>;
+
+constexpr std::size_t kReadSize = 16 * 1024;
+
+/// The status that tells a client what is wrong with what it sends; 0 for one that has gone.
+int refusalFor(const beast::error_code& error) {
+    if (error == http::error::end_of_stream || error == http::error::partial_message) return 0;
+    if (error == http::error::header_limit || error == http::error::buffer_overflow) return 431;
+    if (error == http::error::body_limit) return 413;
+    if (error == http::error::bad_version) return 505;
+    return error.category() == make_error_code(http::error::bad_method).category() ? 400 : 0;
+}
+
+/// The status that refuses a request whose headers have arrived; 0 for one that is welcome.
+int refusalFor(const Parser& parser) {
+    const auto& request = parser.get();
+    const auto coding = request.find(http::field::transfer_encoding);
+    const auto expectation = request.find(http::field::expect);
+    if (coding != request.end() && !beast::iequals(coding->value(), "chunked")) return 501;
+    if (expectation != request.end() && !beast::iequals(expectation->value(), "100-continue"))
+        return 417;
+    const bool hasBody = parser.chunked() || parser.content_length();
+    return !hasBody && request.method_string().ends_with("POST") ? 411 : 0;
+}
+
+HttpRequest requestFrom(http::request<http::string_body> message) {
+    HttpRequest request{
+        std::string(message.method_string()), std::string(message.target()), {}, {}};
+    for (const auto& field : message)
+        request.headers.emplace_back(field.name_string(), field.value());
+    request.version = static_cast<int>(message.version());
+    request.body = std::move(message.body());
+    return request;
+}
+
+/// Status and headers, without those that tell how long the body is.
+http::response<http::string_body> headOf(const HttpResponse& response, bool keep) {
+    http::response<http::string_body> message;
+    message.version(11);
+    message.result(static_cast<unsigned>(response.status));
+    for (const auto& [name, value] : response.headers) message.insert(name, value);
+    message.set(http::field::connection, keep ? "keep-alive" : "close");
+    return message;
+}
+
+http::fields fieldsOf(const HttpHeaders& headers) {
+    http::fields fields;
+    for (const auto& [name, value] : headers) fields.insert(name, value);
+    return fields;
+}
+
+std::string namesOf(const HttpHeaders& headers) {
+    std::string names;
+    for (const auto& header : headers) names += (names.empty() ? "" : ", ") + header.first;
+    return names;
+}
+
+using Plain = beast::tcp_stream;
+using Secure = beast::ssl_stream<beast::tcp_stream>;
+
+template <class Stream>
+class Connection : public HttpConnection {
+public:
+    Connection(Stream stream, const HttpServerOptions& options, const HttpServer::Handler& handler,
+               HttpWorkers& workers)
+        : stream_(std::move(stream)),
+          options_(options),
+          handler_(handler),
+          workers_(workers),
+          buffer_(2 * std::max(options.limits.head, kReadSize)) {
+        enter(Phase::Reading, options_.times.request);
+    }
+
+    void close() override { bottom().close(); }
+
+    asio::awaitable<void> serve() override {
+        const Welcome welcome = options_.welcome ? options_.welcome() : Welcome::Serve;
+        if (welcome == Welcome::Reset) co_return reset();
+        if (welcome == Welcome::Stall) co_await swallow();
+        if constexpr (kIsSecure)
+            co_await stream_.async_handshake(asio::ssl::stream_base::server, use_awaitable);
+        for (bool keep = true; keep; enter(Phase::Reading, options_.times.idle)) {
+            if (buffer_.size() == 0) co_await receive();
+            enter(Phase::Reading, options_.times.request);
+            Parser parser;
+            parser.header_limit(static_cast<std::uint32_t>(options_.limits.head));
+            parser.body_limit(options_.limits.body);
+            const int refusal = co_await read(parser);
+            HttpResponse response{refusal, {}, {}};
+            keep = refusal == 0 && parser.keep_alive();
+            if (refusal == 0) response = co_await work(requestFrom(parser.release()));
+            keep = keep && !response.mishap.cutAt;
+            co_await respond(std::move(response), keep);
+        }
+        co_await drain();
+    }
+
+private:
+    static constexpr bool kIsSecure = std::is_same_v<Stream, Secure>;
+
+    beast::tcp_stream& bottom() { return beast::get_lowest_layer(stream_); }
+
+    void enter(Phase phase, std::chrono::milliseconds limit) {
+        note(phase);
+        deadline_ = since() + limit;
+        bottom().expires_at(deadline_);
+    }
+
+    /// The stream's own deadline does not stop a client whose bytes are always there already.
+    void refuseLate() const {
+        if (Clock::now() >= deadline_) throw beast::system_error(beast::error::timeout);
+    }
+
+    void reset() {
+        bottom().socket().set_option(asio::socket_base::linger(true, 0));
+        bottom().close();
+    }
+
+    /// Reads what comes, below TLS, until the client goes or has stayed for long.
+    asio::awaitable<void> swallow() {
+        bottom().expires_after(options_.times.stall);
+        for (;;) {
+            buffer_.clear();
+            co_await bottom().async_read_some(buffer_.prepare(kReadSize), use_awaitable);
+        }
+    }
+
+    asio::awaitable<void> receive() {
+        buffer_.commit(co_await stream_.async_read_some(buffer_.prepare(kReadSize), use_awaitable));
+        refuseLate();
+    }
+
+    /// Reads a request whole: 0, or the status that refuses it.
+    asio::awaitable<int> read(Parser& parser) {
+        int refusal = 0;
+        while (refusal == 0 && !parser.is_header_done()) refusal = co_await readSome(parser);
+        if (refusal == 0) refusal = refusalFor(parser);
+        const bool waits = refusal == 0 && parser.get().count(http::field::expect) > 0 &&
+                           !parser.is_done() && buffer_.size() == 0;
+        if (waits) co_await tellToGoOn();
+        while (refusal == 0 && !parser.is_done()) refusal = co_await readSome(parser);
+        co_return refusal;
+    }
+
+    asio::awaitable<int> readSome(Parser& parser) {
+        refuseLate();
+        beast::error_code error;
+        co_await http::async_read_some(stream_, buffer_, parser,
+                                       asio::redirect_error(use_awaitable, error));
+        if (!error) co_return 0;
+        const int refusal = refusalFor(error);
+        if (refusal == 0) throw beast::system_error(error);
+        co_return refusal;
+    }
+
+    asio::awaitable<void> tellToGoOn() {
+        constexpr std::string_view kContinue = "HTTP/1.1 100 Continue\r\n\r\n";
+        co_await asio::async_write(stream_, asio::buffer(kContinue), use_awaitable);
+    }
+
+    /// Runs `make` on one of the workers.
+    template <class Make>
+    asio::awaitable<HttpOutcome> runOn(asio::thread_pool& workers, const Make& make) {
+        const auto job = [&make]() -> asio::awaitable<HttpOutcome> {
+            try {
+                co_return make();
+            } catch (const std::exception&) {
+            }
+            co_return HttpResponse{500, {}, {}};
+        };
+        co_return co_await asio::co_spawn(workers.get_executor(), job, use_awaitable);
+    }
+
+    /// Has workers answer the request.
+    asio::awaitable<HttpResponse> work(HttpRequest request) {
+        if (!bottom().socket().is_open()) throw beast::system_error(asio::error::operation_aborted);
+        enter(Phase::Working, {});
+        bottom().expires_never();
+        const auto begin = [&]() -> HttpOutcome { return handler_(request); };
+        HttpOutcome outcome = co_await runOn(workers_.quick, begin);
+        if (const auto* slow = std::get_if<SlowWork>(&outcome)) {
+            const SlowWork rest = *slow;
+            const auto finish = [&]() -> HttpOutcome { return rest(); };
+            outcome = co_await runOn(workers_.slow, finish);
+        }
+        co_return std::get<HttpResponse>(std::move(outcome));
+    }
+
+    asio::awaitable<void> respond(HttpResponse response, bool keep) {
+        const HttpMishap& mishap = response.mishap;
+        if (mishap.delay.count() > 0) {
+            asio::steady_timer timer(stream_.get_executor(), mishap.delay);
+            co_await timer.async_wait(use_awaitable);
+        }
+        enter(Phase::Writing, options_.times.response);
+        auto message = headOf(response, keep);
+        if (!mishap.trailers.empty()) {
+            co_await writeWithTrailers(std::move(message), response);
+            co_return;
+        }
+        message.body() = std::move(response.body);
+        message.prepare_payload();
+        if (mishap.cutAt && *mishap.cutAt < message.body().size())
+            message.body().resize(*mishap.cutAt);  // the length stays that of the whole
+        co_await http::async_write(stream_, message, use_awaitable);
+    }
+
+    asio::awaitable<void> writeWithTrailers(http::response<http::string_body> head,
+                                            const HttpResponse& response) {
+        http::response<http::empty_body> message(std::move(head.base()));
+        message.set(http::field::trailer, namesOf(response.mishap.trailers));
+        message.chunked(true);
+        http::response_serializer<http::empty_body> serializer(message);
+        co_await http::async_write_header(stream_, serializer, use_awaitable);
+        if (!response.body.empty())
+            co_await asio::async_write(stream_, http::make_chunk(asio::buffer(response.body)),
+                                       use_awaitable);
+        const http::fields trailers = fieldsOf(response.mishap.trailers);
+        co_await asio::async_write(stream_, http::make_chunk_last(trailers), use_awaitable);
+    }
+
+    /// Closing while the client still sends would reset the connection and lose the response.
+    asio::awaitable<void> drain() {
+        enter(Phase::Draining, options_.times.drain);
+        if constexpr (kIsSecure) {
+            co_await stream_.async_shutdown(use_awaitable);
+            co_return;
+        }
+        bottom().socket().shutdown(tcp::socket::shutdown_send);
+        for (;;) {
+            buffer_.clear();
+            co_await receive();
+        }
+    }
+
+    Stream stream_;
+    const HttpServerOptions& options_;
+    const HttpServer::Handler& handler_;
+    HttpWorkers& workers_;
+    beast::flat_buffer buffer_;
+    Clock::time_point deadline_;
+};
+
+}  // namespace
+
+std::unique_ptr<HttpConnection> makeConnection(tcp::socket socket, const HttpServerOptions& options,
+                                               const HttpServer::Handler& handler,
+                                               HttpWorkers& workers) {
+    if (!options.tls)
+        return std::make_unique<Connection<Plain>>(Plain(std::move(socket)), options, handler,
+                                                   workers);
+    return std::make_unique<Connection<Secure>>(Secure(std::move(socket), *options.tls), options,
+                                                handler, workers);
+}
+
+}  // namespace testbed
