@@ -85,13 +85,14 @@ def joined_literals(text):
 
 
 _DEFINITION = re.compile(
-    r"^(?![#}/ \n])[^;{}()]*?\b(?P<name>\w+)\((?P<parameters>[^;{}]*)\)\s*(?:const\s*)?\{",
+    r"^(?![#}/ \n])[^;{}()]*?(?P<name>(?:\w+::~?)*\b\w+)\((?P<parameters>[^;{}]*)\)\s*(?:const\s*)?\{",
     re.MULTILINE,
 )
 
 
 def functions(text):
-    """The functions defined at the margin: (name, parameters, body's start, body's end)."""
+    """The functions defined at the margin: (name with its class, parameters, body's start, body's
+    end)."""
     blanked = without_strings(text)
     found = []
     for match in _DEFINITION.finditer(blanked):

@@ -270,7 +270,9 @@ TEST_F(Ask, UsageErrorsNameWhatIsWrongAndNoSecrets) {
         const char* arguments;
         const char* text;
     } cases[] = {
-        {"nope", "there is no command nope; commands are show, watch, calls, ask, serve;"},
+        {"nope",
+         "there is no command nope; commands are show, watch, calls, ask, serve, "
+         "managers, tell, scenarios;"},
         {"--bogus", "there is no option --bogus;"},
         {"",
          "a command (ask, calls, managers, scenarios, serve, show, tell or watch) is required;"},

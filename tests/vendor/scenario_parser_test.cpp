@@ -100,15 +100,17 @@ TEST(ScenarioParser, FaultsLatencyShuffleAndManager) {
 }
 
 TEST(ScenarioParser, ManagerByNameOrPieceByPiece) {
-    EXPECT_EQ(parseScenario("{}", "x").manager.flush, FlushOffer::ContextEntry);
-    const BrokerOptions named = parseScenario(R"({"manager": "large"})", "x").manager;
+    EXPECT_EQ(parseScenario(R"({"controllers": []})", "x").manager.flush, FlushOffer::ContextEntry);
+    const BrokerOptions named =
+        parseScenario(R"({"controllers": [], "manager": "large"})", "x").manager;
     EXPECT_EQ(named.flush, FlushOffer::None);
     EXPECT_TRUE(named.strictProperties);
     const BrokerOptions pieces =
-        parseScenario(R"({"manager": {"kind": "large", "noKeys": false, "serialQueries": true,
+        parseScenario(
+            R"({"controllers": [], "manager": {"kind": "large", "noKeys": false, "serialQueries": true,
                          "orderSeed": 9, "staticNamespaces": ["root/interop"],
                          "strictProperties": false}})",
-                      "x")
+            "x")
             .manager;
     EXPECT_TRUE(pieces.randomOrder);
     EXPECT_FALSE(pieces.instancesWithoutKeys);
