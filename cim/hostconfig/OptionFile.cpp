@@ -1,11 +1,13 @@
 #include "OptionFile.h"
 
+#include <fcntl.h>
 #include <stdlib.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <cerrno>
-#include <fstream>
 #include <optional>
+#include <sstream>
 #include <stdexcept>
 
 #include "NodecfgAdvancedIntegerOption.h"
@@ -14,6 +16,7 @@ namespace hostconfig {
 namespace {
 
 constexpr char kBlanks[] = " \t\r";
+constexpr std::size_t kMostBytes = 64 * 1024;
 
 std::string Trim(const std::string& text) {
     const auto first = text.find_first_not_of(kBlanks);
@@ -35,6 +38,47 @@ std::unique_ptr<Kerncfg::Adv::AdvancedOption> MakeOption(const std::string& valu
     return std::make_unique<TextOption>(value);
 }
 
+/// A descriptor that closes itself.
+class Descriptor {
+public:
+    explicit Descriptor(int number) : number_(number) {}
+    ~Descriptor() {
+        if (number_ >= 0) close(number_);
+    }
+    Descriptor(const Descriptor&) = delete;
+    Descriptor& operator=(const Descriptor&) = delete;
+
+    int Number() const { return number_; }
+
+private:
+    int number_;
+};
+
+/// What the file holds; nothing when it does not exist. Whoever reads it must not be held up: a
+/// named pipe is not waited for, and what has no end is not read.
+std::optional<std::string> ReadAll(const std::string& file) {
+    const Descriptor descriptor(open(file.c_str(), O_RDONLY | O_NONBLOCK | O_CLOEXEC));
+    if (descriptor.Number() < 0 && errno == ENOENT) return std::nullopt;
+    struct stat status = {};
+    if (descriptor.Number() < 0 || fstat(descriptor.Number(), &status) != 0 ||
+        !S_ISREG(status.st_mode)) {
+        throw std::runtime_error("cannot read " + file);
+    }
+    std::string text(kMostBytes + 1, '\0');
+    std::size_t size = 0;
+    for (;;) {
+        const ssize_t part = read(descriptor.Number(), text.data() + size, text.size() - size);
+        if (part < 0 && errno == EINTR) continue;
+        if (part < 0) throw std::runtime_error("cannot read " + file);
+        if (part == 0) break;
+        size += static_cast<std::size_t>(part);
+        // Some regular files, those of /proc among them, are longer than they say.
+        if (size > kMostBytes) throw std::runtime_error("cannot read " + file);
+    }
+    text.resize(size);
+    return text;
+}
+
 /// Value of the last line for `path`.
 std::optional<std::string> LastValue(std::istream& lines, const std::string& path) {
     std::optional<std::string> value;
@@ -53,11 +97,10 @@ TextOption::~TextOption() = default;
 
 std::unique_ptr<Kerncfg::Adv::AdvancedOption> FindInFile(const std::string& file,
                                                          const std::string& path) {
-    if (access(file.c_str(), F_OK) != 0 && errno == ENOENT) return nullptr;
-    std::ifstream lines(file);
-    if (!lines) throw std::runtime_error("cannot read " + file);
+    const auto text = ReadAll(file);
+    if (!text) return nullptr;
+    std::istringstream lines(*text);
     const auto value = LastValue(lines, path);
-    if (lines.bad()) throw std::runtime_error("cannot read " + file);
     return value ? MakeOption(*value) : nullptr;
 }
 
@@ -68,7 +111,8 @@ namespace Kerncfg::Adv {
 AdvancedOption::~AdvancedOption() = default;
 
 std::unique_ptr<AdvancedOption> AdvancedOptionImpl::FindOption(const std::string& path) {
-    const char* file = getenv(hostconfig::kFileVariable);
+    // A set-user-id process does not let whoever starts it choose the file.
+    const char* file = secure_getenv(hostconfig::kFileVariable);
     return hostconfig::FindInFile(file != nullptr ? file : hostconfig::kDefaultFile, path);
 }
 

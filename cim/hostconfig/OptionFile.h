@@ -29,7 +29,8 @@ private:
 };
 
 /// The option at `path` in `file`. Throws std::runtime_error when the file exists but cannot be
-/// read, std::out_of_range for a number that is no int.
+/// read, is no regular file, or holds more than 64 KiB; std::out_of_range for a number that is no
+/// int.
 std::unique_ptr<Kerncfg::Adv::AdvancedOption> FindInFile(const std::string& file,
                                                          const std::string& path);
 

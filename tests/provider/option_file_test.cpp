@@ -4,6 +4,7 @@
 
 #include <gtest/gtest.h>
 #include <stdlib.h>
+#include <sys/stat.h>
 #include <unistd.h>
 
 #include <filesystem>
@@ -150,6 +151,29 @@ TEST_F(OptionFile, WithoutTheEnvironmentTheDefaultFileCounts) {
     ASSERT_NE(AdvancedOptionImpl::FindOption("/OnlyInTheTestsFile"), nullptr);
     unsetenv("PLEXOR_HOSTCONFIG_FILE");
     EXPECT_EQ(AdvancedOptionImpl::FindOption("/OnlyInTheTestsFile"), nullptr);
+}
+
+// None of these may hold up the manager that is loading the provider.
+
+TEST_F(OptionFile, ANamedPipeIsNotWaitedFor) {
+    ASSERT_EQ(mkfifo(file.c_str(), 0600), 0);
+    EXPECT_THROW(find("/A"), std::runtime_error);
+}
+
+TEST_F(OptionFile, ADirectoryIsNoFile) {
+    EXPECT_THROW(FindInFile("/", "/A"), std::runtime_error);
+}
+
+TEST_F(OptionFile, WhatHasNoEndIsNotRead) {
+    EXPECT_THROW(FindInFile("/dev/zero", "/A"), std::runtime_error);
+}
+
+TEST_F(OptionFile, HoldsUpTo64Kibibytes) {
+    const std::string line = "/A=5\n";
+    write(line + std::string(65536 - line.size(), '\n'));
+    expectNumber("/A", 5);
+    write(line + std::string(65537 - line.size(), '\n'));
+    EXPECT_THROW(find("/A"), std::runtime_error);
 }
 
 }  // namespace
