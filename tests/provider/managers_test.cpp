@@ -1,0 +1,127 @@
+// What the provider does because managers differ, and what it leaves where they do not.
+#include <memory>
+
+#include "PlexorProviderCfg.h"
+#include "PlexorProviderUtilManager.h"
+#include "entry_fixture.h"
+#include "refresh_fixture.h"
+
+namespace {
+
+using plexortest::CapturedSyslog;
+using plexortest::kContextHasFlush;
+using plexortest::VirtualClock;
+using testbed::BrokerOptions;
+using testbed::Entry;
+using testbed::FaultRule;
+
+constexpr const char* kDriveKeys[] = {"SystemCreationClassName", "SystemName", "CreationClassName",
+                                      "DeviceID"};
+
+/// A manager of the large kind, as far as instances go.
+BrokerOptions withoutKeysAndChars() {
+    BrokerOptions options;
+    options.instancesWithoutKeys = true;
+    options.refusesCharsInArrays = true;
+    options.flush = testbed::FlushOffer::None;
+    return options;
+}
+
+class ManagersTest : public plexortest::EntryTest {
+protected:
+    explicit ManagersTest(BrokerOptions options = {}) : EntryTest(std::move(options)) {}
+
+    void SetUp() override {
+        EntryTest::SetUp();
+        presentVendor();
+        callFactory();
+        ASSERT_TRUE(inventoryTaken());
+        settleWorkers();
+    }
+    testbed::Instance first(const char* className) {
+        const auto answer = testbed::InstanceClient(broker, &mi).enumerateInstances(className);
+        EXPECT_EQ(answer.instances.size(), 1u);
+        return answer.instances.at(0);
+    }
+    static std::string textOf(const testbed::Instance& instance, const char* name) {
+        const testbed::CimValue* value = instance.find(name);
+        return value != nullptr && !value->isNull ? value->text() : "null";
+    }
+};
+
+class LargeManagerTest : public ManagersTest {
+protected:
+    LargeManagerTest() : ManagersTest(withoutKeysAndChars()) {}
+};
+
+TEST_F(LargeManagerTest, KeysAreSetFromThePath) {
+    const testbed::Instance drive = first("Tovexa_PlexorStorageExtent");
+    const char* expected[] = {"OMC_UnitaryComputerSystem", "host-uuid",
+                              "Tovexa_PlexorStorageExtent", "tvxStorageExtC0_d1"};
+    for (int i = 0; i < 4; i++) EXPECT_EQ(textOf(drive, kDriveKeys[i]), expected[i]);
+    EXPECT_EQ(textOf(first("Tovexa_PlexorController"), "Name"), "tvxControllerC0");
+    EXPECT_EQ(textOf(first("Tovexa_PlexorSoftwareIdentity"), "InstanceID"),
+              "tovexa:ControllerSoftwareC0");
+}
+
+TEST_F(LargeManagerTest, ARefusedStringIsSetAsAnObject) {
+    const testbed::Instance controller = first("Tovexa_PlexorController");
+    EXPECT_EQ(textOf(controller, "OtherIdentifyingInfo"), "[C0]");
+    EXPECT_EQ(textOf(controller, "IdentifyingDescriptions"), "[Serial Number]");
+}
+
+TEST_F(LargeManagerTest, TheBuildForAnotherManagerSaysSoOnce) {
+    if (!kContextHasFlush) GTEST_SKIP() << "this is the build for such managers";
+    std::size_t told = 0;
+    for (const std::string& line : CapturedSyslog::linesAt(LOG_ERR)) {
+        told += line ==
+                "PlexorProvider: the manager's context table has no flush: this build of the "
+                "provider is for another manager\n";
+    }
+    EXPECT_LE(told, 1u) << "once for the process";
+}
+
+TEST_F(LargeManagerTest, WhatARefreshObtainsGoesWithIt) {
+    testbed::InstanceClient client(broker, &mi);
+    auto refresh = [&] {
+        VirtualClock::advance(100);
+        client.enumerateInstances("Tovexa_PlexorStorageVolume");
+        EXPECT_TRUE(plexortest::WorkersMeet::untilIdle());
+    };
+    refresh();
+    auto kept = [&] {
+        std::size_t objects = 0;
+        for (const auto& part : broker.kept()) {
+            if (part.thread != std::this_thread::get_id()) objects += part.objects;
+        }
+        return objects;
+    };
+    const std::size_t objects = kept();
+    for (int i = 0; i < 5; i++) refresh();
+    EXPECT_EQ(kept(), objects);
+}
+
+TEST_F(ManagersTest, OneThatCopiesKeysIsAskedNothingMore) {
+    repository.defineClass("root/cimv2", {"Tovexa_PlexorController",
+                                          "",
+                                          {{"CreationClassName", CMPI_string, true, "", {}},
+                                           {"Name", CMPI_string, true, "", {}}}});
+    first("Tovexa_PlexorController");
+    books().clearCalls();
+    FaultRule asked;
+    asked.entry = Entry::InstanceGetProperty;
+    int reads = 0;
+    asked.keepResult = true;
+    asked.hook = [&reads] { reads++; };
+    FaultRule made = asked;
+    made.entry = Entry::NewString;
+    int strings = 0;
+    made.hook = [&strings] { strings++; };
+    faults().add(asked);
+    faults().add(made);
+    EXPECT_EQ(textOf(first("Tovexa_PlexorController"), "Name"), "tvxControllerC0");
+    EXPECT_EQ(reads, 0);
+    EXPECT_EQ(strings, 0);
+}
+
+}  // namespace
