@@ -14,7 +14,8 @@ namespace {
 
 #if defined(PLEXOR_CONTEXT_FLUSH) && PLEXOR_CONTEXT_FLUSH
 
-std::atomic<bool> __FlushMissed = false;
+std::atomic<bool> __MissTold = false;
+std::atomic<unsigned int> __MissedInLife = 0;  // life whose manager has a null entry
 
 /// True after a flush by the context's own entry. The build for a host that has the entry may be
 /// loaded by a manager that has not; that is said once.
@@ -23,7 +24,8 @@ bool FlushByEntry(CMPIContext* ctx) {
         ctx->ft->flush(ctx);
         return true;
     }
-    if (!__FlushMissed.exchange(true)) {
+    __MissedInLife = PresentLife();
+    if (!__MissTold.exchange(true)) {
         syslog(LOG_ERR,
                "%s: the manager's context table has no flush: this build of the provider is for "
                "another manager\n",
@@ -38,7 +40,7 @@ bool HasFlushEntry(const CMPIContext* ctx) {
 
 /// Whether this manager is one of those that the standard build is for.
 bool IsStandardManager() {
-    return __FlushMissed;
+    return __MissedInLife == PresentLife();
 }
 
 #else

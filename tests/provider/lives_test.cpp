@@ -1,4 +1,5 @@
 // A second initialisation in the same mapping, also beside a worker that the first left behind.
+#include <optional>
 #include <thread>
 
 #include "PlexorProviderCfg.h"
@@ -24,6 +25,7 @@ protected:
         // What the stuck worker of a first life keeps is its own.
         gate_.open();
         EXPECT_TRUE(plexortest::WorkersMeet::untilIdle());
+        givenUp_.reset();
         EntryTest::TearDown();
     }
     testbed::Response drives() {
@@ -46,12 +48,14 @@ protected:
         VirtualClock::advance(100);
         testbed::InstanceClient(broker, &mi).enumerateInstances("Tovexa_PlexorBattery");
         ASSERT_TRUE(gate_.awaitArrivals(1));
+        givenUp_.emplace();
         const plexortest::HurriedWaits hurry;
         EXPECT_EQ(cleanUp(), CMPI_RC_OK);
     }
     static std::size_t times(const std::string& line) { return CapturedSyslog::count(line); }
 
     Gate gate_;
+    std::optional<plexortest::GivenUpInventory> givenUp_;
 };
 
 TEST_F(LivesTest, TheSecondServesAndRefreshesCompletely) {
@@ -119,7 +123,6 @@ TEST_F(LivesTest, TheSecondIsCompleteBesideAStuckWorkerOfTheFirst) {
     EXPECT_TRUE(plexortest::soon(
         [&] { return CapturedSyslog::countContaining(" exiting...\n") == exits + 1; }));
     EXPECT_EQ(drives().instances.size(), 1u);
-    expectLeftClones(given);
 }
 
 }  // namespace

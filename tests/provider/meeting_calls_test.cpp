@@ -1,6 +1,9 @@
 // Requests, factory calls and cleanups that meet on several threads.
+#include <stdlib.h>
+
 #include <atomic>
 #include <future>
+#include <iostream>
 #include <thread>
 #include <vector>
 
@@ -100,6 +103,7 @@ TEST_F(MeetingCallsTest, AHangingRequestKeepsWhatItUses) {
     ASSERT_TRUE(gate.awaitArrivals(1));
     const RaidController_t* const used = firstController();
     plexortest::VirtualClock::advance(1000);
+    const plexortest::GivenUpInventory givenUp;
     {
         const HurriedWaits hurry;
         EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(false), CMPI_RC_OK);
@@ -110,10 +114,9 @@ TEST_F(MeetingCallsTest, AHangingRequestKeepsWhatItUses) {
     EXPECT_EQ(controllers(), 0u);
     EXPECT_EQ(GetSystemName(), nullptr);
     EXPECT_STREQ(used->DeviceID, "C0");
-    const std::size_t kept = books().liveClones();
+    EXPECT_GT(books().liveClones(), 0u);
     gate.open();
     EXPECT_EQ(request.get(), 1u);
-    expectLeftClones(kept);
 }
 
 TEST_F(MeetingCallsTest, TerminatingItWaitsThreeSeconds) {
@@ -122,6 +125,7 @@ TEST_F(MeetingCallsTest, TerminatingItWaitsThreeSeconds) {
     faults().add(waitingAt(Entry::NewInstance, gate));
     auto request = requestDrives();
     ASSERT_TRUE(gate.awaitArrivals(1));
+    const plexortest::GivenUpInventory givenUp;
     {
         const HurriedWaits hurry;
         EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
@@ -130,7 +134,6 @@ TEST_F(MeetingCallsTest, TerminatingItWaitsThreeSeconds) {
         EXPECT_LE(waits.front(), std::chrono::seconds(3));
         EXPECT_GE(waits.front(), std::chrono::seconds(2));
     }
-    expectLeftClones(books().liveClones());
     gate.open();
     request.get();
 }
@@ -199,6 +202,7 @@ TEST_F(MeetingCallsTest, AnInitialisationThatHangsIsGivenUp) {
     faults().add(slow);
     auto factory = callFactoryElsewhere();
     ASSERT_TRUE(gate.awaitArrivals(1));
+    const plexortest::GivenUpInventory givenUp;
     {
         const HurriedWaits hurry;
         EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
@@ -237,30 +241,55 @@ TEST_F(MeetingCallsTest, NineCleanupsAtOnceAreOne) {
     EXPECT_EQ(exitWaits, 1);
 }
 
-// For the sanitizers: everything at once, at any moment.
+// For the sanitizers: everything at once, at any moment. With PLEXOR_LONG ten minutes with a vendor
+// that takes up to five seconds for an answer: then cleanups give up what is still used.
 TEST_F(MeetingCallsTest, EverythingAtOnce) {
+    const bool isLong = getenv("PLEXOR_LONG") != nullptr;
+    const auto end = std::chrono::steady_clock::now() +
+                     (isLong ? std::chrono::seconds(600) : std::chrono::seconds(1));
+    faults().setLatency(std::chrono::milliseconds(0), std::chrono::milliseconds(isLong ? 5000 : 3));
     CapturedSyslog::discard(true);
     std::atomic<bool> over = false;
+    std::atomic<std::size_t> requests = 0, factories = 0, cleanups = 0;
     std::vector<std::thread> threads;
-    for (int i = 0; i < 4; i++) {
+    for (int i = 0; i < 8; i++) {
         threads.emplace_back([&] {
-            while (!over) EXPECT_LE(requestDrives().get(), 1u);
+            for (; !over; ++requests) {
+                EXPECT_LE(testbed::InstanceClient(broker, &mi)
+                              .enumerateInstances("Tovexa_PlexorStorageExtent")
+                              .instances.size(),
+                          1u);
+                std::this_thread::sleep_for(std::chrono::milliseconds(1));
+            }
         });
     }
-    for (int i = 0; i < 2; i++) {
+    for (int i = 0; i < 3; i++) {
         threads.emplace_back([&] {
-            while (!over) EXPECT_NE(callFactoryElsewhere().get(), nullptr);
+            for (; !over; ++factories) {
+                const testbed::Broker::CallScope scope(broker);
+                EXPECT_NE(
+                    PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr),
+                    nullptr);
+                std::this_thread::sleep_for(std::chrono::milliseconds(1));
+            }
+        });
+        threads.emplace_back([&, i] {
+            for (; !over; ++cleanups) {
+                EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+                std::this_thread::sleep_for(std::chrono::milliseconds((isLong ? 1500 : 5) * i));
+            }
         });
     }
-    for (int round = 0; round < 30; round++) {
-        auto second = cleanUpElsewhere(true);
-        EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
-        EXPECT_EQ(second.get(), CMPI_RC_OK);
-    }
+    std::this_thread::sleep_until(end);
     over = true;
     for (std::thread& thread : threads) thread.join();
+    faults().setLatency(std::chrono::milliseconds(0), std::chrono::milliseconds(0));
     EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
     EXPECT_EQ(controllers(), 0u);
+    EXPECT_TRUE(plexortest::WorkersMeet::untilIdle());
+    if (isLong) expectLeftClones(books().liveClones());
+    std::cout << requests << " requests, " << factories << " factory calls, " << cleanups
+              << " cleanups, " << books().liveClones() << " clones given up" << std::endl;
 }
 
 }  // namespace

@@ -32,6 +32,23 @@ inline bool quiesceWorkers() {
     return QuiesceWorkers(Deadline::In(30));
 }
 
+/// What a cleanup will give up because somebody still uses it. Made before that cleanup; releases
+/// it at the end of the scope, when that somebody has left.
+class GivenUpInventory {
+public:
+    GivenUpInventory() = default;
+    ~GivenUpInventory() {
+        FreeList(&controllers_, FreeController);
+        for (char* name : names_) free(name);
+    }
+    GivenUpInventory(const GivenUpInventory&) = delete;
+    GivenUpInventory& operator=(const GivenUpInventory&) = delete;
+
+private:
+    List_t controllers_ = *RaidControllerList;
+    char* names_[3] = {__SystemClassName, __HostName, __SystemName};
+};
+
 /// Holds whoever passes until it is opened.
 class Gate {
 public:

@@ -57,7 +57,7 @@ TEST_F(Access, UserHasANameAndAPassword) {
     options.user = "Aladdin";
     EXPECT_EQ(outcome(options), "Aladdin open-sesame");
     options.passwordFile = "/nonexistent";
-    EXPECT_EQ(outcome(options), "no password in /nonexistent");
+    EXPECT_EQ(outcome(options), "no password in /nonexistent: No such file or directory");
 }
 
 }  // namespace
