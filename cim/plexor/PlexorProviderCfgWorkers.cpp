@@ -208,17 +208,16 @@ void DiscardQueuedWork() {
     }
 }
 
-/// Joins the workers that have ended. False when one has not: it is left to itself.
+/// Joins the workers that have ended. False when one has not: it is left to itself, or to the next
+/// cleanup of the same life.
 bool JoinWorkers() {
     bool allEnded = true;
     for (int i = 0; i < kThreadCount; i++) {
         if (!__Started[i]) continue;
-        __Started[i] = false;
         const Deadline deadline = Deadline::In(kJoinLimitSeconds);
-        if (pthread_clockjoin_np(PlexorThreads[i], nullptr, CLOCK_MONOTONIC, &deadline.Moment()) !=
-            0) {
-            allEnded = false;
-        }
+        __Started[i] = pthread_clockjoin_np(PlexorThreads[i], nullptr, CLOCK_MONOTONIC,
+                                            &deadline.Moment()) != 0;
+        if (__Started[i]) allEnded = false;
     }
     return allEnded;
 }

@@ -44,9 +44,7 @@ void GiveUpInventory(const char* user) {
            "PlexorProviderCleanup", user);
     const LifeGuard life;
     *RaidControllerList = {nullptr, nullptr, 0};
-    __SystemClassName = nullptr;
-    __HostName = nullptr;
-    __SystemName = nullptr;
+    GiveUpSystemInfo();
     KeepLibraryMapped();
 }
 

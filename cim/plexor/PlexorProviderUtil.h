@@ -4,6 +4,9 @@
 
 #include "PlexorProvider.h"
 
+/// Forgets the host's names without releasing them: somebody may still read them.
+void GiveUpSystemInfo();
+
 /// The broker of the latest factory call.
 const CMPIBroker* CurrentBroker();
 

@@ -59,10 +59,13 @@ bool IsStandardManager() {
 
 #endif
 
+/// Whether the property is there without a value. One that the instance does not have at all is not
+/// missed: where the manager does not know the class, nobody promises its clients that property.
 bool ReadsNull(const CMPIInstance* inst, const char* property) {
     CMPIStatus status = {CMPI_RC_OK, nullptr};
     const CMPIData data = inst->ft->getProperty(inst, property, &status);
-    return status.rc != CMPI_RC_OK || (data.state & CMPI_nullValue) != 0;
+    return status.rc == CMPI_RC_OK && (data.state & CMPI_nullValue) != 0 &&
+           (data.state & CMPI_notFound) != CMPI_notFound;
 }
 
 /// Sets key number `index` where the instance lacks it. False when it was there already.

@@ -32,14 +32,24 @@ CMPIInstance* FindHostInstance(const CMPIContext* ctx, const CMPIObjectPath* pat
     return nullptr;
 }
 
+// A request that a cleanup could not wait for may still read the names.
+
+char* LoadName(char* const& field) {
+    return __atomic_load_n(&field, __ATOMIC_RELAXED);
+}
+
+void SetName(char*& field, char* name) {
+    __atomic_store_n(&field, name, __ATOMIC_RELAXED);
+}
+
 void StoreName(char*& field, const CMPIInstance* host, const char* property) {
     const char* text = ReadString(host, property);
-    if (text != nullptr) field = StringClone(text);
+    if (text != nullptr) SetName(field, StringClone(text));
 }
 
 void ReleaseName(char*& field) {
     free(field);
-    field = nullptr;
+    SetName(field, nullptr);
 }
 
 /// False after a stop: the names are not this thread's any more.
@@ -82,12 +92,18 @@ void ReleaseSystemInfo() {
     ReleaseName(__SystemName);
 }
 
+void GiveUpSystemInfo() {
+    SetName(__SystemClassName, nullptr);
+    SetName(__HostName, nullptr);
+    SetName(__SystemName, nullptr);
+}
+
 const char* GetHostName() {
-    return __HostName;
+    return LoadName(__HostName);
 }
 const char* GetSystemName() {
-    return __SystemName;
+    return LoadName(__SystemName);
 }
 const char* GetSystemClassName() {
-    return __SystemClassName;
+    return LoadName(__SystemClassName);
 }

@@ -87,7 +87,7 @@ TEST_F(EntryContextTest, RefusedAttachmentStopsNothing) {
     callFactory();
     EXPECT_EQ(initialized(), 1);
     EXPECT_EQ(controllers(), 1u);
-    EXPECT_EQ(countHere(Entry::ContextFlush), 1u);
+    EXPECT_EQ(countHere(Entry::ContextFlush), plexortest::kContextHasFlush ? 1u : 0u);
     EXPECT_EQ(countHere(Entry::DetachThread), 1u);
 
     std::vector<std::string> misuses;

@@ -157,7 +157,8 @@ private:
         auto* noted = static_cast<NotedArray*>(const_cast<CMPIArray*>(array));
         noted->text += formatted("{%u:%s %s}", static_cast<unsigned>(index), typeText(type).c_str(),
                                  valueText(value, type).c_str());
-        return {CMPI_RC_ERR_FAILED, nullptr};
+        // A refused number is nobody's concern; a refused text is set again on some managers.
+        return {type == CMPI_chars ? CMPI_RC_OK : CMPI_RC_ERR_FAILED, nullptr};
     }
     template <class Handle>
     static CMPIStatus releaseNobodyAskedFor(Handle*) {
