@@ -169,6 +169,9 @@ std::vector<Entry> callsThatMakeInstances(const testbed::Books& books) {
             case Entry::PathGetClassName:
             case Entry::PathGetNameSpace:
             case Entry::StringGetCharPtr:
+            // The look whether the manager copies keys, in the build for standard managers.
+            case Entry::InstanceGetProperty:
+            case Entry::OtherObjectCall:
                 break;
             default:
                 // One run of properties is one step.
