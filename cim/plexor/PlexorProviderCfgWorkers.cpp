@@ -181,6 +181,8 @@ bool StartWorker(int i, const CMPIContext* ctx) {
     const CMPIBroker* broker = CurrentBroker();
     auto* args = NewRecord<Thread_Args_t>();
     CMPIContext* prepared = broker->bft->prepareAttachThread(broker, ctx);
+    // One that an earlier life could not join: nobody will any more.
+    if (__Started[i] && PlexorThreads[i] != 0) pthread_detach(PlexorThreads[i]);
     __Started[i] = false;
     if (args != nullptr && prepared != nullptr) {
         args->Arg0 = static_cast<uintptr_t>(i);

@@ -82,6 +82,7 @@ TEST_F(InventoryFactory, ControllersAreThereAtOnceDevicesSoon) {
     testbed::FaultRule hold;
     hold.entry = testbed::Entry::Associators;
     hold.resultClass = "CIM_StoragePool";
+    hold.times = 2;  // a controller each; a refresh may come when the gate is gone
     hold.hook = [&] { gate.pass(); };
     faults().add(hold);
     {
