@@ -13,10 +13,9 @@ namespace {
 /// type.
 bool hasKeys(const BrokerCore& core, const ObjectPath& path) {
     if (!core.options.strictProperties) return true;
-    const auto properties = core.repository.allProperties(path.nameSpace, path.className);
-    return std::all_of(properties.begin(), properties.end(), [&](const PropertyDefinition& known) {
+    const auto keys = core.repository.keys(path.nameSpace, path.className);
+    return std::all_of(keys.begin(), keys.end(), [&](const KeyDefinition& known) {
         const CimValue* key = path.findKey(known.name);
-        if (!known.isKey) return true;
         return key != nullptr && (key->isNull || key->type == CimValue::null(known.type).type);
     });
 }

@@ -69,25 +69,42 @@ std::vector<const ClassDefinition*> Repository::lineageLocked(std::string_view n
     return lineage;
 }
 
-std::vector<PropertyDefinition> Repository::allProperties(std::string_view nameSpace,
-                                                          std::string_view className) const {
-    const std::shared_lock lock(mutex_);
-    std::vector<PropertyDefinition> properties;
+std::vector<const PropertyDefinition*> Repository::propertiesLocked(
+    std::string_view nameSpace, std::string_view className) const {
+    std::vector<const PropertyDefinition*> properties;
     auto lineage = lineageLocked(nameSpace, className);
     std::reverse(lineage.begin(), lineage.end());
     for (const ClassDefinition* definition : lineage) {
         for (const PropertyDefinition& own : definition->properties) {
             const auto inherited = std::find_if(
                 properties.begin(), properties.end(),
-                [&](const auto& property) { return sameName(property.name, own.name); });
+                [&](const auto* property) { return sameName(property->name, own.name); });
             if (inherited != properties.end()) {
-                *inherited = own;
+                *inherited = &own;
             } else {
-                properties.push_back(own);
+                properties.push_back(&own);
             }
         }
     }
     return properties;
+}
+
+std::vector<PropertyDefinition> Repository::allProperties(std::string_view nameSpace,
+                                                          std::string_view className) const {
+    const std::shared_lock lock(mutex_);
+    std::vector<PropertyDefinition> properties;
+    for (const PropertyDefinition* known : propertiesLocked(nameSpace, className))
+        properties.push_back(*known);
+    return properties;
+}
+
+std::vector<KeyDefinition> Repository::keys(std::string_view nameSpace,
+                                            std::string_view className) const {
+    const std::shared_lock lock(mutex_);
+    std::vector<KeyDefinition> keys;
+    for (const PropertyDefinition* known : propertiesLocked(nameSpace, className))
+        if (known->isKey) keys.push_back({known->name, known->type});
+    return keys;
 }
 
 std::optional<PropertyDefinition> Repository::findProperty(std::string_view nameSpace,
@@ -213,6 +230,7 @@ void Repository::clearInstances() {
     instances_.clear();
     index_.clear();
     associations_.clear();
+    ends_.clear();
 }
 
 }  // namespace testbed

@@ -12,6 +12,7 @@
 #include <shared_mutex>
 #include <string>
 #include <string_view>
+#include <unordered_map>
 #include <vector>
 
 #include "cim_object.h"
@@ -36,6 +37,12 @@ struct ParameterDefinition {
     CMPIType type = CMPI_null;
     std::string referenceClass;  ///< of a reference
     Qualifiers qualifiers = {};
+};
+
+/// What a path of a class has to name its object with.
+struct KeyDefinition {
+    std::string name;
+    CMPIType type = CMPI_null;
 };
 
 /// A method is described to clients; none can be called.
@@ -88,6 +95,8 @@ public:
     /// Own and inherited properties, the root class's first.
     std::vector<PropertyDefinition> allProperties(std::string_view nameSpace,
                                                   std::string_view className) const;
+    /// The keys among them, as cheaply as an answer of a thousand paths needs them.
+    std::vector<KeyDefinition> keys(std::string_view nameSpace, std::string_view className) const;
     /// One property of the class, own or inherited.
     std::optional<PropertyDefinition> findProperty(std::string_view nameSpace,
                                                    std::string_view className,
@@ -156,6 +165,9 @@ private:
     /// The class and its ancestors, itself first; empty for an unknown class.
     std::vector<const ClassDefinition*> lineageLocked(std::string_view nameSpace,
                                                       std::string_view className) const;
+    /// Own and inherited properties, the root class's first.
+    std::vector<const PropertyDefinition*> propertiesLocked(std::string_view nameSpace,
+                                                            std::string_view className) const;
     bool isALocked(std::string_view nameSpace, std::string_view className,
                    std::string_view ancestor) const;
     const Instance* instanceLocked(const std::string& identity) const;
@@ -168,14 +180,20 @@ private:
     bool matchesEnd(const Association& association, const AssociationEnd& near,
                     const AssociationEnd& far, const AssociationFilter& filter) const;
 
+    /// Enters the association at that position in ends_. The caller holds mutex_, exclusive.
+    void indexAssociation(std::size_t position);
+
     /// Reorders a walk's result when asked to. Takes mutex_.
     void shuffle(std::vector<Instance>& instances) const;
 
     mutable std::shared_mutex mutex_;
-    std::map<std::string, Space> spaces_;          // guarded by mutex_
-    std::vector<Instance> instances_;              // guarded by mutex_
-    std::map<std::string, std::size_t> index_;     // identity -> position; guarded by mutex_
-    std::vector<Association> associations_;        // guarded by mutex_
+    std::map<std::string, Space> spaces_;       // guarded by mutex_
+    std::vector<Instance> instances_;           // guarded by mutex_
+    std::map<std::string, std::size_t> index_;  // identity -> position; guarded by mutex_
+    std::vector<Association> associations_;     // guarded by mutex_
+    /// Identity of an object -> positions of the associations that it takes part in, in order;
+    /// guarded by mutex_.
+    std::unordered_map<std::string, std::vector<std::size_t>> ends_;
     mutable std::optional<std::mt19937> shuffle_;  // guarded by mutex_ (exclusive)
 };
 

@@ -20,6 +20,14 @@ void Repository::associate(std::string_view assocClass, AssociationEnd left, Ass
     association.rightIdentity = association.right.object.identity();
     const std::unique_lock lock(mutex_);
     associations_.push_back(std::move(association));
+    indexAssociation(associations_.size() - 1);
+}
+
+void Repository::indexAssociation(std::size_t position) {
+    const Association& association = associations_[position];
+    ends_[association.leftIdentity].push_back(position);
+    if (association.rightIdentity != association.leftIdentity)
+        ends_[association.rightIdentity].push_back(position);
 }
 
 std::size_t Repository::dissociate(std::string_view assocClass, const ObjectPath& left,
@@ -27,13 +35,18 @@ std::size_t Repository::dissociate(std::string_view assocClass, const ObjectPath
     const std::string first = left.identity();
     const std::string second = right.identity();
     const std::unique_lock lock(mutex_);
-    return std::erase_if(associations_, [&](const Association& association) {
+    const std::size_t removed = std::erase_if(associations_, [&](const Association& association) {
         const bool joins =
             (association.leftIdentity == first && association.rightIdentity == second) ||
             (association.leftIdentity == second && association.rightIdentity == first);
         return joins && (sameName(association.assocClass, assocClass) ||
                          associationIsA(association, std::string(assocClass)));
     });
+    if (removed == 0) return 0;
+    ends_.clear();
+    for (std::size_t position = 0; position < associations_.size(); position++)
+        indexAssociation(position);
+    return removed;
 }
 
 bool Repository::associationIsA(const Association& association, const std::string& ancestor) const {
@@ -61,7 +74,10 @@ void Repository::walkLocked(const ObjectPath& source, const AssociationFilter& f
         if (!matchesEnd(association, near, far, filter)) return;
         visit(association, farIdentity, instanceLocked(farIdentity));
     };
-    for (const Association& association : associations_) {
+    const auto positions = ends_.find(origin);
+    if (positions == ends_.end()) return;
+    for (const std::size_t position : positions->second) {
+        const Association& association = associations_[position];
         if (association.leftIdentity == origin) {
             tryEnd(association, association.left, association.right, association.rightIdentity);
         }

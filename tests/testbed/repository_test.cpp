@@ -209,6 +209,21 @@ TEST_F(RepositoryTest, DissociateByClassOrSuperclassInAnyOrder) {
     EXPECT_TRUE(repository.associators(fan, {}).empty());
 }
 
+TEST_F(RepositoryTest, WhatIsDissociatedLeavesTheOthersWhereTheyAre) {
+    const ObjectPath second = path("Sample_Drive", "D2");
+    put(drive);
+    put(second);
+    put(fan);
+    cool(fan, drive);
+    cool(fan, second);
+    EXPECT_EQ(repository.dissociate("CIM_Dependency", fan, drive), 1u);
+    EXPECT_TRUE(repository.associators(drive, {}).empty());
+    ASSERT_EQ(repository.associators(fan, {}).size(), 1u);
+    EXPECT_EQ(repository.associators(fan, {})[0].path.identity(), second.identity());
+    ASSERT_EQ(repository.associators(second, {}).size(), 1u);
+    EXPECT_EQ(repository.associators(second, {})[0].path.identity(), fan.identity());
+}
+
 TEST_F(RepositoryTest, ResultsKeepTheirOrderUntilShuffled) {
     Ids inOrder;
     put(fan);

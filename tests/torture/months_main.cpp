@@ -65,7 +65,7 @@ private:
 void refresh(testbed::ProviderSession& session, const Workers& workers) {
     now += kInterval;
     session.client().enumerateInstanceNames("Tovexa_PlexorStorageExtent");
-    while (!workers.areIdle()) std::this_thread::yield();
+    while (!workers.areIdle()) std::this_thread::sleep_for(std::chrono::microseconds(200));
 }
 
 /// Prints what has become of the memory; whether it is flat.
