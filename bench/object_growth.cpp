@@ -1,6 +1,7 @@
 // What the workers keep of the objects that they obtain from the object manager, after the first
-// inventory and after each refresh of the drives. Nothing may pile up where the manager can be
-// asked to flush a thread.
+// inventory and after each refresh of the drives; how often a refresh calls these objects, and how
+// long it takes (to within 20 ms). Nothing may pile up, and with --manager host,random-order the
+// calls may only grow as the drives do.
 //
 //   object-growth [--drives N] [--refreshes N] [--flat] [--library FILE] [--manager KIND]
 //
@@ -32,43 +33,65 @@ constexpr std::chrono::seconds kRefreshLimit{120};
 constexpr std::chrono::milliseconds kLook{20};
 constexpr std::chrono::milliseconds kQuiet{1500};
 
+struct Cost {
+    std::size_t calls = 0;
+    double seconds = 0;
+};
+
 /// Prints how many objects are kept; gives the number of those that are no clones.
-std::size_t print(const char* when, int round, testbed::Books& books) {
+std::size_t print(const char* when, int round, testbed::Books& books, const Cost& cost) {
     const std::size_t clones = books.liveClones();
     const std::size_t others = books.live() - clones;
-    std::printf("%-10s %4d %12zu %12zu\n", when, round, clones, others);
+    std::printf("%-10s %4d %12zu %12zu %12zu %9.2f\n", when, round, clones, others, cost.calls,
+                cost.seconds);
     std::fflush(stdout);
     return others;
+}
+
+/// Calls of objects so far: what an identity that is read again costs.
+std::size_t objectCalls(const testbed::Books& books) {
+    std::size_t calls = 0;
+    for (const Entry entry :
+         {Entry::PathGetKey, Entry::PathGetClassName, Entry::PathGetNameSpace,
+          Entry::StringGetCharPtr, Entry::InstanceGetProperty, Entry::InstanceGetObjectPath,
+          Entry::EnumerationHasNext, Entry::EnumerationGetNext, Entry::Clone, Entry::Release})
+        calls += books.count(entry);
+    return calls;
 }
 
 std::size_t queries(const testbed::Books& books) {
     return books.count(Entry::Associators) + books.count(Entry::AssociatorNames);
 }
 
-/// Waits until the workers ask the vendor nothing any more.
-void settle(const testbed::Books& books) {
+/// Waits until the workers ask nobody anything any more; since when that is so.
+Clock::time_point settle(const testbed::Books& books) {
     const auto limit = Clock::now() + kRefreshLimit;
-    std::size_t last = queries(books);
-    for (auto quietSince = Clock::now(); Clock::now() - quietSince < kQuiet;
-         std::this_thread::sleep_for(kLook)) {
+    auto quietSince = Clock::now();
+    std::size_t last = queries(books) + objectCalls(books);
+    for (; Clock::now() - quietSince < kQuiet; std::this_thread::sleep_for(kLook)) {
         if (Clock::now() > limit) throw BenchError("the workers do not come to rest");
-        const std::size_t now = queries(books);
+        const std::size_t now = queries(books) + objectCalls(books);
         if (now != last) quietSince = Clock::now();
         last = now;
     }
+    return quietSince;
 }
 
 /// Asks for drives until that has the workers ask the vendor, and lets them end it.
-void refresh(testbed::ProviderSession& session) {
+Cost refresh(testbed::ProviderSession& session) {
     const testbed::Books& books = session.broker().books();
     const auto limit = Clock::now() + kRefreshLimit;
     const std::size_t before = queries(books);
+    std::size_t calls = 0;
     while (queries(books) == before) {
         if (Clock::now() > limit) throw BenchError("no refresh takes place");
-        session.client().enumerateInstanceNames("Tovexa_PlexorStorageExtent");
         std::this_thread::sleep_for(kLook);
+        calls = objectCalls(books);
+        session.client().enumerateInstanceNames("Tovexa_PlexorStorageExtent");
     }
-    settle(books);
+    const auto begin = Clock::now();
+    const auto end = settle(books);
+    return {objectCalls(books) - calls, std::chrono::duration<double>(end - begin).count()};
 }
 
 /// How many objects more are kept after the last refresh than after the inventory.
@@ -80,15 +103,16 @@ std::size_t measure(int drives, int refreshes, const std::string& library,
     testbed::ProviderSession session(shelf, library, "PlexorProvider");
     testbed::Books& books = session.broker().books();
     books.keepCalls(false);
+    books.recordObjectCalls(true);
     if (!session.waitForInventory(kInventoryLimit, "root/cimv2"))
         throw BenchError("the inventory does not arrive");
     std::this_thread::sleep_for(kGrace);
     settle(books);
-    const std::size_t first = print("inventory", 0, books);
+    const std::size_t first = print("inventory", 0, books, {});
     std::size_t last = first;
     for (int round = 1; round <= refreshes; round++) {
-        refresh(session);
-        last = print("refresh", round, books);
+        const Cost cost = refresh(session);
+        last = print("refresh", round, books, cost);
     }
     return last - std::min(first, last);
 }
@@ -110,7 +134,8 @@ int main(int argc, char** argv) {
     CLI11_PARSE(app, argc, argv);
 
     setlogmask(LOG_UPTO(LOG_EMERG));
-    std::printf("%-10s %4s %12s %12s\n", "after", "", "clones", "others");
+    std::printf("%-10s %4s %12s %12s %12s %9s\n", "after", "", "clones", "others", "calls",
+                "seconds");
     try {
         const std::size_t growth = bench::measure(drives, refreshes, library, manager);
         if (!flat || growth == 0) return EXIT_SUCCESS;
