@@ -46,6 +46,10 @@ Record* NewRecord() {
     return static_cast<Record*>(calloc(1, sizeof(Record)));
 }
 
+/// Queues a work item of the calling thread's life. RESULT_NOTHING when that life has ended: such
+/// an item would become the next one's. Else the queue's code. The caller keeps what is not queued.
+int QueueItem(Thread_Args_t* item);
+
 /// Frees a work item of ProcessBuildLogicalDeviceInfo with the clones in it.
 void ReleaseDeviceItem(Thread_Args_t* item);
 
@@ -67,9 +71,13 @@ unsigned int ActiveWorkers();
 /// Whether the initial inventory of the present life is done. Takes PlexorThreadMutex.
 bool InventoryDone();
 
-/// Closes the gate for the life that is about to begin.
+/// Closes the gate for the life that is about to begin. The caller holds the life's mutex.
 void CloseInventoryGate();
 
 /// Asks the present life to end and waits until no work function is running. False when one still
-/// is after the deadline: then nothing that it may use can be released.
-bool QuiesceWorkers(const Deadline& deadline);
+/// is after the limit: then nothing that it may use can be released. `limit` is asked again after
+/// WakeQuiesce, with PlexorThreadMutex held.
+bool QuiesceWorkers(Deadline (*limit)());
+
+/// Has QuiesceWorkers look at its limit again. Takes PlexorThreadMutex.
+void WakeQuiesce();

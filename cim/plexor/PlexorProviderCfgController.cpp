@@ -76,6 +76,7 @@ void ReadSoftware(RaidController_t* ctrl, const CMPIContext* ctx) {
     CMPIEnumeration* identities = QueryAssociators(
         {kBuilder, ctx, ctrl->ControllerOp, "CIM_ElementSoftwareIdentity", "CIM_SoftwareIdentity"});
     while (const CMPIInstance* identity = NextInstance(identities)) {
+        if (StopRequested()) return;
         const CMPIUint16 classification = ReadArrayUint16(identity, "Classifications");
         char* version = StringClone(ReadString(identity, "VersionString"));
         syslog(LOG_DEBUG, "%s: ctrl %s, swClass %d, versionStr %s\n", kBuilder, ctrl->DeviceID,

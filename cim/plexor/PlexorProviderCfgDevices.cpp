@@ -83,15 +83,16 @@ Thread_Args_t* MakeItem(const CMPIInstanceMI* mi, RaidController_t* ctrl, const 
 
 /// Offers the item until there is room for it.
 void Enqueue(const CMPIContext* ctx, Thread_Args_t* item, const CMPIObjectPath* op) {
-    int rc = PutItem(&__FIFO, item);
+    int rc = QueueItem(item);
     while (rc == RESULT_FIFO_FULL && !StopRequested()) {
         if (!RunQueuedItemAlone(ctx)) {
             syslog(LOG_ERR, "%s: FIFO full, waiting...\n", kCaller);
             sleep(1);
         }
-        rc = PutItem(&__FIFO, item);
+        rc = QueueItem(item);
     }
     if (rc != RESULT_OK) ReleaseDeviceItem(item);
+    if (rc != RESULT_OK && StopRequested()) return;
     syslog(LOG_DEBUG, "Added to FIFO: %s\n", PathText(LOG_DEBUG, op));
     pthread_cond_broadcast(&PlexorThreadCond);
 }

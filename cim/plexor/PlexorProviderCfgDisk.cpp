@@ -128,6 +128,7 @@ bool JoinAndInsert(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIObjectPa
 int Place(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx) {
     CMPIEnumeration* pools = CandidatePools(disk, ctx);
     while (const CMPIObjectPath* candidate = NextPath(pools)) {
+        if (StopRequested()) break;
         int rc = RESULT_OK;
         if (JoinAndInsert(ctrl, disk, candidate, rc)) return rc;
     }

@@ -28,9 +28,10 @@ void StampAll(RaidController_t* ctrl) {
 /// Opens the gate, unless a later life has closed it for itself.
 void OpenGate() {
     MutexGuard lock(PlexorThreadMutex);
+    const LifeGuard life;
     if (LifeIsOver()) return;
     ThreadActivityDone = 1;
-    __DoneLife = PresentLife();
+    __DoneLife = OwnLife();
     pthread_cond_broadcast(&PlexorThreadCond);
 }
 
@@ -54,7 +55,7 @@ int BuildDeviceInfoAsync(const CMPIInstanceMI* mi, const CMPIContext*) {
     }
     item->Func = DoBuildDeviceInfoAsync;
     item->Arg0 = reinterpret_cast<uintptr_t>(mi);
-    const int rc = PutItem(&__FIFO, item);
+    const int rc = QueueItem(item);
     if (rc == RESULT_FIFO_FULL) {
         free(item);
         syslog(LOG_ERR, "%s, failed to put threadArgs in FIFO\n", __func__);

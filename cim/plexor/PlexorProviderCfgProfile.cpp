@@ -40,7 +40,7 @@ int CollectProfiles(const CMPIContext* ctx, Array_t* profiles) {
             return RESULT_ARRAY_FULL;
         }
         CMPIInstance* inst = NextInstance(found);
-        if (inst == nullptr) break;
+        if (inst == nullptr || StopRequested()) break;
         ExamineProfile(inst, profiles);
     }
     return static_cast<int>(profiles->Count);

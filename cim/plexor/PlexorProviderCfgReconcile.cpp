@@ -171,7 +171,7 @@ int QueueRefresh(const CMPIInstanceMI* mi, RaidController_t* ctrl, int action) {
     item->Arg0 = reinterpret_cast<uintptr_t>(mi);
     item->Arg2 = reinterpret_cast<uintptr_t>(ctrl);
     item->Arg3 = static_cast<uintptr_t>(action);
-    const int rc = PutItem(&__FIFO, item);
+    const int rc = QueueItem(item);
     if (rc != RESULT_OK) free(item);
     if (rc != RESULT_FIFO_FULL) pthread_cond_signal(&PlexorThreadCond);
     return rc;

@@ -175,26 +175,30 @@ void WorkUntilTerminated(CMPIContext* ctx, long index, MutexGuard& lock) {
     }
 }
 
-/// Starts worker `i`. False without memory, a context or a thread, and when the life has been asked
-/// to end meanwhile.
-bool StartWorker(int i, const CMPIContext* ctx) {
+/// Has worker `i` run, unless there is nothing to run it with or its life has been asked to end.
+bool CreateThread(int i, Thread_Args_t* args) {
+    const LifeGuard life;
+    if (life.MemberOfEnded()) return false;
+    // One that an earlier life could not join: nobody will any more.
+    if (__Started[i] && PlexorThreads[i] != 0) pthread_detach(PlexorThreads[i]);
+    __Started[i] = args != nullptr && life.Stands() &&
+                   pthread_create(&PlexorThreads[i], &PlexorThreadAttr, PlexorThread, args) == 0;
+    if (!__Started[i] && __LivingWorkers != 0) __LivingWorkers--;
+    return __Started[i];
+}
+
+/// Starts worker `i`, if there is memory, a context and a thread for it and its life stands.
+void StartWorker(int i, const CMPIContext* ctx) {
     const CMPIBroker* broker = CurrentBroker();
     auto* args = NewRecord<Thread_Args_t>();
     CMPIContext* prepared = broker->bft->prepareAttachThread(broker, ctx);
-    // One that an earlier life could not join: nobody will any more.
-    if (__Started[i] && PlexorThreads[i] != 0) pthread_detach(PlexorThreads[i]);
-    __Started[i] = false;
     if (args != nullptr && prepared != nullptr) {
         args->Arg0 = static_cast<uintptr_t>(i);
         args->Arg1 = reinterpret_cast<uintptr_t>(prepared);
-        const LifeGuard life;
-        __Started[i] = life.Stands() && pthread_create(&PlexorThreads[i], &PlexorThreadAttr,
-                                                       PlexorThread, args) == 0;
-        if (__Started[i]) return true;
     }
+    if (CreateThread(i, prepared != nullptr ? args : nullptr)) return;
     free(args);
     if (prepared != nullptr) EndUnusedContext(prepared);
-    return false;
 }
 
 /// Frees what a stop left in the queue, clones included.
@@ -224,14 +228,34 @@ bool JoinWorkers() {
     return allEnded;
 }
 
-}  // namespace
-
-void BeginWork() {
+/// What earlier lives left behind in the workers' words.
+void ForgetEarlierLives() {
     __LivingWorkers = 0;
     // A word that has been reset is nobody's any more.
     if (__atomic_load_n(&TerminateThread, __ATOMIC_RELAXED) == 0) __TerminatedLife = 0;
     CloseInventoryGate();
-    BeginLife();
+}
+
+/// Before the workers run: one that looks at once must not take itself for the only one. False
+/// when their life has ended.
+bool PrepareThreads() {
+    const LifeGuard life;
+    if (life.MemberOfEnded()) return false;
+    pthread_attr_init(&PlexorThreadAttr);
+    pthread_attr_setdetachstate(&PlexorThreadAttr, PTHREAD_CREATE_JOINABLE);
+    __LivingWorkers = kThreadCount;
+    return true;
+}
+
+}  // namespace
+
+void BeginWork() {
+    BeginLife(ForgetEarlierLives);
+}
+
+int QueueItem(Thread_Args_t* item) {
+    const LifeGuard life;
+    return life.MemberOfEnded() ? RESULT_NOTHING : PutItem(&__FIFO, item);
 }
 
 unsigned int ActiveWorkers() {
@@ -249,27 +273,34 @@ bool RunQueuedItemAlone(const CMPIContext* ctx) {
     return true;
 }
 
-bool QuiesceWorkers(const Deadline& deadline) {
+bool QuiesceWorkers(Deadline (*limit)()) {
     RequestStop();
     MutexGuard lock(PlexorThreadMutex);
     while (ActiveWorker::CountRunning() != 0) {
-        if (!WaitUntil(__ItemEnded, PlexorThreadMutex, deadline)) break;
+        const Deadline deadline = limit();
+        if (!WaitUntil(__ItemEnded, PlexorThreadMutex, deadline) && !limit().IsBefore(deadline)) {
+            break;
+        }
     }
     return ActiveWorker::CountRunning() == 0;
 }
 
+void WakeQuiesce() {
+    MutexGuard lock(PlexorThreadMutex);
+    pthread_cond_broadcast(&__ItemEnded);
+}
+
 void InitPlexorThreads(const CMPIContext* ctx) {
     const int seconds = GetSampelInterval();
+    if (LifeGuard().MemberOfEnded()) return;
     StoreTime(StateUpdateInterval, seconds < 1 ? kDefaultIntervalSeconds : seconds);
     // At error level so that it reaches the log whatever the process masks.
     syslog(LOG_ERR, "%s: Sample interval was set to %lu secs\n", __func__,
            static_cast<unsigned long>(LoadTime(StateUpdateInterval)));
-    pthread_attr_init(&PlexorThreadAttr);
-    pthread_attr_setdetachstate(&PlexorThreadAttr, PTHREAD_CREATE_JOINABLE);
-    // Counted before they run: one that looks at once must not take itself for the only one.
-    __LivingWorkers = kThreadCount;
+    if (!PrepareThreads()) return;
     for (int i = 0; i < kThreadCount; i++) {
-        if (!StartWorker(i, ctx)) __LivingWorkers--;
+        StartWorker(i, ctx);
+        if (LifeGuard().MemberOfEnded()) return;
         syslog(LOG_DEBUG, "%s: thread %d created\n", __func__, i);
     }
 }

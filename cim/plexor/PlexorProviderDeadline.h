@@ -22,10 +22,10 @@ public:
         later.moment_.tv_sec += seconds;
         return later;
     }
-    bool Passed() const {
-        const timespec now = Now().moment_;
-        if (now.tv_sec != moment_.tv_sec) return now.tv_sec > moment_.tv_sec;
-        return now.tv_nsec >= moment_.tv_nsec;
+    bool Passed() const { return !Now().IsBefore(*this); }
+    bool IsBefore(const Deadline& other) const {
+        if (moment_.tv_sec != other.moment_.tv_sec) return moment_.tv_sec < other.moment_.tv_sec;
+        return moment_.tv_nsec < other.moment_.tv_nsec;
     }
     /// Whole seconds since then; negative before it.
     time_t SecondsAgo() const { return Now().moment_.tv_sec - moment_.tv_sec; }

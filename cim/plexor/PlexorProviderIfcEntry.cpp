@@ -27,8 +27,11 @@ CMPIInstanceMIFT instMIFT__ = {100,
 
 namespace {
 
-void SetInitialized(int value) {
-    __atomic_store_n(&_ProviderInitialized, value, __ATOMIC_RELAXED);
+/// After the end of the life the mark is the cleanup's, or a later life's. False then.
+bool MarkInitialized(int value) {
+    const LifeGuard life;
+    if (life.Stands()) __atomic_store_n(&_ProviderInitialized, value, __ATOMIC_RELAXED);
+    return life.Stands();
 }
 
 /// Factory calls on several threads may be here at once.
@@ -55,6 +58,7 @@ void ReleaseIdentity() {
 /// Builds the inventory's controllers and sets the workers going. False when the host has no
 /// identity or no RAID vendor, and, silently, when a cleanup has asked for the end meanwhile.
 bool BuildInventory(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
+    if (StopRequested()) return false;
     Array_t profileArray = {};
     int rc = InitSystemInfo(mi, ctx);
     if (StopRequested()) return false;
@@ -76,11 +80,27 @@ bool BuildInventory(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
     return true;
 }
 
-/// After the end of the life the mark is the cleanup's, or a later life's.
-void MarkFailed() {
-    const LifeGuard life;
-    if (life.Stands()) SetInitialized(0);
-}
+/// Takes back what a thread leaves of its initialisation when it is cancelled in it: otherwise the
+/// provider would count as initialised for good, or the next attempt find the controllers twice.
+class Cancellation {
+public:
+    Cancellation() = default;
+    ~Cancellation() {
+        if (impossible_) return;
+        const LifeGuard life;
+        if (!life.Stands()) return;
+        *RaidControllerList = {nullptr, nullptr, 0};
+        GiveUpSystemInfo();
+        __atomic_store_n(&_ProviderInitialized, 0, __ATOMIC_RELAXED);
+    }
+    Cancellation(const Cancellation&) = delete;
+    Cancellation& operator=(const Cancellation&) = delete;
+
+    void BecomesImpossible() { impossible_ = true; }
+
+private:
+    bool impossible_ = false;
+};
 
 /// Initialises on a context attached for this thread. Where the broker has none to give, the
 /// factory's own context, good for this call, has to do.
@@ -88,11 +108,11 @@ void InitializeAttached(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
     const CMPIBroker* broker = CurrentBroker();
     CMPIContext* ctxLocal = broker->bft->prepareAttachThread(broker, ctx);
     if (ctxLocal == nullptr) {
-        if (!BuildInventory(mi, ctx)) MarkFailed();
+        if (!BuildInventory(mi, ctx)) MarkInitialized(0);
         return;
     }
     broker->bft->attachThread(broker, ctxLocal);
-    if (!BuildInventory(mi, ctxLocal)) MarkFailed();
+    if (!BuildInventory(mi, ctxLocal)) MarkInitialized(0);
     FlushFactoryContext(ctxLocal);
     broker->bft->detachThread(broker, ctxLocal);
 }
@@ -101,9 +121,10 @@ void PlexorInit(const CMPIInstanceMI* mi, const CMPIContext* ctx, FactoryCall& c
     syslog(LOG_DEBUG, "%s: ENTER...\n", __func__);
     WaitDebug();
     if (!call.TakeTurn()) return;
-    const LifeMember member;
-    SetInitialized(1);
+    MarkInitialized(1);
+    Cancellation cancellation;
     InitializeAttached(mi, ctx);
+    cancellation.BecomesImpossible();
     call.EndTurn();
     syslog(LOG_DEBUG, "%s: EXIT\n", __func__);
 }

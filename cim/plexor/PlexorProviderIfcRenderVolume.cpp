@@ -3,6 +3,7 @@
 
 #include "PlexorProviderIfc.h"
 #include "PlexorProviderIfcProperty.h"
+#include "PlexorProviderUtilLife.h"
 
 namespace {
 
@@ -37,10 +38,12 @@ CMPIUint16 NameSpaceOf(CMPIUint16 nameFormat) {
     return nameFormat < kCount ? kNameSpaces[nameFormat] : 0;
 }
 
-/// The member's record. The request waits until there is one: a member is never left out.
+/// The member's record. The request waits until there is one: a member is never left out. It does
+/// not wait for ever: who changes the members changes the records in the same hold of CtrlMutex.
+/// Null when a cleanup has given up waiting for the request.
 const DiskDrive_t* WaitForDisk(const RaidController_t* ctrl, const char* deviceID) {
     const DiskDrive_t* disk = FindDiskByDeviceID(ctrl, deviceID);
-    while (disk == nullptr) {
+    while (disk == nullptr && !LifeGuard().MemberOfEnded()) {
         sched_yield();
         disk = FindDiskByDeviceID(ctrl, deviceID);
     }
@@ -53,6 +56,7 @@ void AppendMembers(VolumeText& text, const RaidController_t* ctrl, const Storage
     const List_Entry_t* entry = pool->Drives->Head;
     for (; entry != nullptr; entry = entry->Next) {
         const DiskDrive_t* disk = WaitForDisk(ctrl, static_cast<char*>(entry->Data));
+        if (disk == nullptr) return;
         const Chassis_t* chassis = FindChassisByTag(ctrl, disk->Chassis);
         if (chassis != nullptr) {
             text.Append("%de%s", disk->SlotNumber, chassis->InternalTag);

@@ -5,7 +5,7 @@
 
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderIfc.h"
-#include "PlexorProviderLock.h"
+#include "PlexorProviderIfcInFlight.h"
 
 namespace {
 
@@ -17,50 +17,79 @@ pthread_cond_t __TurnChanged = PTHREAD_COND_INITIALIZER;  // with __TurnMutex
 // Written under __TurnMutex; requests read them without it.
 std::atomic<bool> __Initialising = false;
 std::atomic<bool> __CleaningUp = false;
-std::atomic<unsigned int> __Requests = 0;  // in flight; counted without the mutex
+
+// Closed under __TurnMutex.
+CallsInFlight __Requests;
+CallsInFlight __FactoryCalls;
 
 // Guarded by __TurnMutex.
-pthread_t __Initialiser;       // meaningful while __Initialising
-unsigned int __InitTurns = 0;  // turns given so far; the latest one's number
-unsigned int __CleanupsBegun = 0;
-unsigned int __CleanupsEnded = 0;
+pthread_t __Initialiser;             // meaningful while __Initialising
+unsigned int __InitTurns = 0;        // turns given so far; the latest one's number
+unsigned int __CleanupsBegun = 0;    // those that took the turn
+unsigned int __CleanupsEnded = 0;    // likewise
 unsigned int __CleanupsWaiting = 0;  // for another one's end
-unsigned int __FactoryCalls = 0;     // in flight, begun after the latest cleanup began
-unsigned int __OldFactoryCalls = 0;  // in flight, begun before it
+Deadline __LeaveBy;                  // meaningful while __CleaningUp
 
 void Announce() {
     pthread_cond_broadcast(&__TurnChanged);
 }
 
-/// Waits until `quiet` or the deadline; the caller holds __TurnMutex.
+/// Waits until `quiet` or the limit, which may be brought forward; the caller holds __TurnMutex.
 template <typename Condition>
-bool Await(const Deadline& deadline, Condition quiet) {
+bool Await(const Deadline& limit, Condition quiet) {
     while (!quiet()) {
-        if (!WaitUntil(__TurnChanged, __TurnMutex, deadline)) return quiet();
+        const Deadline deadline = limit;
+        if (WaitUntil(__TurnChanged, __TurnMutex, deadline)) continue;
+        if (!limit.IsBefore(deadline)) return quiet();
     }
     return true;
 }
 
-bool NoRequests() {
-    return __Requests == 0;
+bool OldRequestsAreGone() {
+    return __Requests.ClosedAreGone();
 }
 
 bool CalledFromTheSearch() {
     return __Initialising && pthread_equal(__Initialiser, pthread_self());
 }
 
-}  // namespace
-
-RequestInFlight::RequestInFlight() {
-    // First counted, then the look whether controllers may be walked; those who close them do it
-    // the other way round, so that one of the two sees the other.
-    __Requests++;
+void Leave(CallsInFlight& calls, unsigned int generation) {
+    if (calls.LeaveOpen(generation)) return;
+    MutexGuard lock(__TurnMutex);
+    calls.LeaveClosed(generation);
+    Announce();
 }
 
+/// One of the cleanups that wait for another one's end, also when the thread is cancelled.
+class WaitingCleanup {
+public:
+    WaitingCleanup() { __CleanupsWaiting++; }
+    ~WaitingCleanup() { Announce(); }
+    WaitingCleanup(const WaitingCleanup&) = delete;
+    WaitingCleanup& operator=(const WaitingCleanup&) = delete;
+};
+
+/// Keeps a cancellation of the thread pending for a scope: a destructor that waits must not be
+/// left.
+class NoCancellation {
+public:
+    NoCancellation() { pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, &before_); }
+    ~NoCancellation() { pthread_setcancelstate(before_, nullptr); }
+    NoCancellation(const NoCancellation&) = delete;
+    NoCancellation& operator=(const NoCancellation&) = delete;
+
+private:
+    int before_;
+};
+
+}  // namespace
+
+// First counted, then the look whether controllers may be walked; those who close them do it the
+// other way round, so that one of the two sees the other.
+RequestInFlight::RequestInFlight() : generation_(__Requests.Enter()) {}
+
 RequestInFlight::~RequestInFlight() {
-    if (--__Requests != 0 || !(__CleaningUp || __Initialising)) return;
-    MutexGuard lock(__TurnMutex);
-    Announce();
+    Leave(__Requests, generation_);
 }
 
 const List_Entry_t* RequestInFlight::FirstController() {
@@ -68,39 +97,37 @@ const List_Entry_t* RequestInFlight::FirstController() {
     return RaidControllerList->Head;
 }
 
-FactoryCall::FactoryCall() {
-    MutexGuard lock(__TurnMutex);
-    cleanupsBefore_ = __CleanupsBegun;
-    __FactoryCalls++;
-}
+FactoryCall::FactoryCall() : generation_(__FactoryCalls.Enter()) {}
 
 FactoryCall::~FactoryCall() {
     EndTurn();
-    MutexGuard lock(__TurnMutex);
-    if (cleanupsBefore_ == __CleanupsBegun) {
-        __FactoryCalls--;
-    } else {
-        __OldFactoryCalls--;
-    }
-    Announce();
+    Leave(__FactoryCalls, generation_);
+}
+
+bool FactoryCall::Overtaken() const {
+    return __FactoryCalls.IsClosed(generation_);
 }
 
 bool FactoryCall::TakeTurn() {
     MutexGuard lock(__TurnMutex);
     if (CalledFromTheSearch()) return false;
     const Deadline deadline = Deadline::In(kTurnLimitSeconds);
-    const bool free = Await(deadline, [this] {
-        return cleanupsBefore_ != __CleanupsBegun || !(__Initialising || __CleaningUp);
-    });
-    if (!free || cleanupsBefore_ != __CleanupsBegun || IsInitialized()) return false;
+    const bool free =
+        Await(deadline, [this] { return Overtaken() || !(__Initialising || __CleaningUp); });
+    if (!free || Overtaken() || IsInitialized()) return false;
     turn_ = ++__InitTurns;
     __Initialiser = pthread_self();
     __Initialising = true;
     // In here, so that a cleanup which begins now ends this life and not the one before.
     BeginWork();
+    member_.emplace();
     // A request that is still walking the list must not see it grow.
-    Await(deadline, NoRequests);
-    return true;
+    __Requests.Close(false);
+    Await(deadline, [this] { return Overtaken() || OldRequestsAreGone(); });
+    if (!Overtaken()) return true;
+    lock.Unlock();
+    EndTurn();
+    return false;
 }
 
 void FactoryCall::EndTurn() {
@@ -108,29 +135,30 @@ void FactoryCall::EndTurn() {
     MutexGuard lock(__TurnMutex);
     if (turn_ == __InitTurns) __Initialising = false;
     turn_ = 0;
+    member_.reset();
     Announce();
 }
 
-CleanupTurn::CleanupTurn() {
+CleanupTurn::CleanupTurn(time_t leaveSeconds, bool (*refuse)()) {
     MutexGuard lock(__TurnMutex);
-    taken_ = !__CleaningUp;
-    if (!taken_) {
-        const unsigned int awaited = __CleanupsBegun;
-        __CleanupsWaiting++;
-        while (__CleanupsEnded < awaited) pthread_cond_wait(&__TurnChanged, &__TurnMutex);
-        __CleanupsWaiting--;
-        Announce();
+    if (__CleaningUp) {
+        outcome_ = Outcome::kDoneByAnother;
+        AwaitOther(lock, leaveSeconds);
         return;
     }
+    outcome_ = refuse != nullptr && refuse() ? Outcome::kRefused : Outcome::kTaken;
+    if (!Taken()) return;
     __CleaningUp = true;
     __CleanupsBegun++;
-    __OldFactoryCalls += __FactoryCalls;
-    __FactoryCalls = 0;
+    __LeaveBy = Deadline::In(leaveSeconds);
+    __FactoryCalls.Close(false);
+    __Requests.Close(__Initialising);
     Announce();
 }
 
 CleanupTurn::~CleanupTurn() {
-    if (!taken_) return;
+    if (!Taken()) return;
+    const NoCancellation uncancelled;
     MutexGuard lock(__TurnMutex);
     __CleaningUp = false;
     __CleanupsEnded++;
@@ -139,22 +167,41 @@ CleanupTurn::~CleanupTurn() {
     while (__CleanupsWaiting != 0) pthread_cond_wait(&__TurnChanged, &__TurnMutex);
 }
 
-bool CleanupTurn::AwaitFactoryCalls(const Deadline& deadline) {
+void CleanupTurn::AwaitOther(MutexGuard& lock, time_t leaveSeconds) {
+    const unsigned int awaited = __CleanupsBegun;
+    const WaitingCleanup waiting;
+    const Deadline own = Deadline::In(leaveSeconds);
+    if (own.IsBefore(__LeaveBy)) {
+        __LeaveBy = own;
+        Announce();
+        lock.Unlock();
+        WakeQuiesce();
+        lock.Lock();
+    }
+    while (__CleanupsEnded < awaited) pthread_cond_wait(&__TurnChanged, &__TurnMutex);
+}
+
+Deadline CleanupTurn::Limit() {
     MutexGuard lock(__TurnMutex);
-    const bool ended = !CalledFromTheSearch() &&
-                       Await(deadline, [] { return !__Initialising && __OldFactoryCalls == 0; });
+    return __LeaveBy;
+}
+
+bool CleanupTurn::AwaitFactoryCalls() {
+    MutexGuard lock(__TurnMutex);
+    const bool ended = !CalledFromTheSearch() && Await(__LeaveBy, [] {
+        return !__Initialising && __FactoryCalls.ClosedAreGone();
+    });
     if (ended || !__Initialising) return ended;
     __InitTurns++;
     __Initialising = false;
     return false;
 }
 
-bool CleanupTurn::AwaitRequests(const Deadline& deadline) {
+bool CleanupTurn::AwaitRequests() {
     MutexGuard lock(__TurnMutex);
-    return Await(deadline, NoRequests);
+    return Await(__LeaveBy, OldRequestsAreGone);
 }
 
-bool CleanupTurn::HasFactoryCallsWaiting() const {
-    MutexGuard lock(__TurnMutex);
-    return __FactoryCalls + __OldFactoryCalls != 0;
+bool CleanupTurn::HasNewcomers() const {
+    return __Requests.HasOpen() || __FactoryCalls.HasOpen();
 }

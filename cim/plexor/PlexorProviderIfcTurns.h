@@ -6,8 +6,12 @@
 // factory call that came before it has left.
 #pragma once
 
+#include <optional>
+
 #include "PlexorProviderDeadline.h"
+#include "PlexorProviderLock.h"
 #include "PlexorProviderUtil.h"
+#include "PlexorProviderUtilLife.h"
 
 /// A request in flight, for a scope.
 class RequestInFlight {
@@ -20,6 +24,11 @@ public:
     /// The first controller's entry. Null without controllers, while they are still being looked
     /// for (such a request comes from the search itself), and while they are being released.
     static const List_Entry_t* FirstController();
+
+private:
+    /// What it queues when a cleanup has given up waiting for it must not become a later life's.
+    const LifeMember member_{LifeMember::When::kUnlessEnded};
+    const unsigned int generation_;
 };
 
 /// A factory call in flight, for a scope.
@@ -30,38 +39,51 @@ public:
     FactoryCall(const FactoryCall&) = delete;
     FactoryCall& operator=(const FactoryCall&) = delete;
 
-    /// Waits for the right to initialise, and begins a life with it. No turn is given when the
-    /// provider is initialised. A vendor that is asked for its controllers may itself ask
-    /// the manager for computer systems, and so have the factory called before it answers: on the
-    /// same thread such a call gets no turn, on another one none after 30 seconds. Nor does a call
-    /// that a cleanup has overtaken: the manager that makes it is stopping.
+    /// Waits for the right to initialise, begins a life with it and makes the thread its member. No
+    /// turn is given when the provider is initialised. A vendor that is asked for its controllers
+    /// may itself ask the manager for computer systems, and so have the factory called before it
+    /// answers: on the same thread such a call gets no turn, on another one none after 30 seconds.
+    /// Nor does a call that a cleanup has overtaken: the manager that makes it is stopping.
     bool TakeTurn();
     /// Gives the right back, if it has not been taken away. Also done by the destructor.
     void EndTurn();
 
 private:
-    unsigned int cleanupsBefore_;
+    bool Overtaken() const;
+
+    unsigned int generation_;
     unsigned int turn_ = 0;  ///< number of the turn that this call has; 0: none
+    std::optional<LifeMember> member_;
 };
 
-/// The right to clean up, for a scope. A cleanup that finds another under way waits for it instead.
+/// The right to clean up, for a scope. A cleanup that finds another under way waits for it instead,
+/// and has it hurry when it must itself.
 class CleanupTurn {
 public:
-    CleanupTurn();
+    /// Whoever is still inside gets `leaveSeconds` to leave. Where no other cleanup is under way
+    /// `refuse` is asked first, if given; a turn that it refuses is not begun.
+    CleanupTurn(time_t leaveSeconds, bool (*refuse)());
     ~CleanupTurn();
     CleanupTurn(const CleanupTurn&) = delete;
     CleanupTurn& operator=(const CleanupTurn&) = delete;
 
-    /// False when another cleanup has done it.
-    bool Taken() const { return taken_; }
+    /// Neither taken nor refused: another cleanup has done it.
+    bool Taken() const { return outcome_ == Outcome::kTaken; }
+    bool Refused() const { return outcome_ == Outcome::kRefused; }
+    /// When everybody must have left, in the turn that is under way.
+    static Deadline Limit();
     /// Waits until the initialisation has ended and every factory call from before has left. False
-    /// at the deadline: then the initialisation's turn is taken away from it.
-    bool AwaitFactoryCalls(const Deadline& deadline);
-    /// Waits until no request is in flight. False at the deadline.
-    bool AwaitRequests(const Deadline& deadline);
-    /// Whether factory calls wait for this cleanup to end; they are inside the library.
-    bool HasFactoryCallsWaiting() const;
+    /// at the limit: then the initialisation's turn is taken away from it.
+    bool AwaitFactoryCalls();
+    /// Waits until no request from before is in flight. False at the limit.
+    bool AwaitRequests();
+    /// Whether requests or factory calls that came after it are inside the library.
+    bool HasNewcomers() const;
 
 private:
-    bool taken_;
+    enum class Outcome { kTaken, kRefused, kDoneByAnother };
+
+    static void AwaitOther(MutexGuard& lock, time_t leaveSeconds);
+
+    Outcome outcome_;
 };

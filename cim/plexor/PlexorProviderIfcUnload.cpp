@@ -26,12 +26,17 @@ bool HasControllers() {
     return !IsListEmpty(RaidControllerList);
 }
 
-/// Who was still inside at the deadline; null when everybody has left.
-const char* AwaitQuiet(CleanupTurn& turn, const Deadline& deadline) {
+/// Whether a cleanup that is none of a stopping manager has to be refused.
+bool IsInUse() {
+    return HasControllers() && !CanUnload();
+}
+
+/// Who was still inside at the limit; null when everybody has left.
+const char* AwaitQuiet(CleanupTurn& turn) {
     RequestStop();
-    const bool factoryCallsLeft = turn.AwaitFactoryCalls(deadline);
-    const bool requestsEnded = turn.AwaitRequests(deadline);
-    const bool workersIdle = QuiesceWorkers(deadline);
+    const bool factoryCallsLeft = turn.AwaitFactoryCalls();
+    const bool requestsEnded = turn.AwaitRequests();
+    const bool workersIdle = QuiesceWorkers(CleanupTurn::Limit);
     if (!workersIdle) return "a worker";
     if (!requestsEnded) return "a request";
     return factoryCallsLeft ? nullptr : "a factory call";
@@ -48,8 +53,8 @@ void GiveUpInventory(const char* user) {
     KeepLibraryMapped();
 }
 
-void Unload(CleanupTurn& turn, time_t leaveSeconds) {
-    const char* user = AwaitQuiet(turn, Deadline::In(leaveSeconds));
+void Unload(CleanupTurn& turn) {
+    const char* user = AwaitQuiet(turn);
     if (user == nullptr) {
         FreeList(RaidControllerList, FreeController);
         ReleaseSystemInfo();
@@ -58,7 +63,16 @@ void Unload(CleanupTurn& turn, time_t leaveSeconds) {
     }
     CleanupPlexorThreads();
     __atomic_store_n(&_ProviderInitialized, 0, __ATOMIC_RELAXED);
-    if (turn.HasFactoryCallsWaiting()) KeepLibraryMapped();
+    if (turn.HasNewcomers()) KeepLibraryMapped();
+}
+
+/// The cleanup's return code.
+CMPIrc TryUnload(CMPIBoolean terminating) {
+    CleanupTurn turn(terminating ? kLeaveSecondsTerminating : kLeaveSeconds,
+                     terminating ? nullptr : IsInUse);
+    if (turn.Refused()) return CMPI_RC_DO_NOT_UNLOAD;
+    if (turn.Taken()) Unload(turn);
+    return CMPI_RC_OK;
 }
 
 }  // namespace
@@ -74,15 +88,12 @@ void ResetNextUnloadTime() {
 
 CMPIStatus PlexorProviderCleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean terminating) {
     syslog(LOG_DEBUG, "%s: ENTER...\n", __func__);
-    if (HasControllers() && !terminating && !CanUnload()) {
+    const CMPIrc rc = TryUnload(terminating);
+    if (rc == CMPI_RC_DO_NOT_UNLOAD) {
         syslog(LOG_DEBUG, "%s: idle timer(%d) has not expired, don't unload\n", __func__,
                static_cast<int>(__atomic_load_n(&IdleTimeBeforeTerminating, __ATOMIC_RELAXED)));
-        return {CMPI_RC_DO_NOT_UNLOAD, nullptr};
-    }
-    {
-        CleanupTurn turn;
-        if (turn.Taken()) Unload(turn, terminating ? kLeaveSecondsTerminating : kLeaveSeconds);
+        return {rc, nullptr};
     }
     syslog(LOG_DEBUG, "%s: EXIT\n", __func__);
-    return {CMPI_RC_OK, nullptr};
+    return {rc, nullptr};
 }

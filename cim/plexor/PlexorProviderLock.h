@@ -4,10 +4,10 @@
 //   1. PlexorThreadMutex            state of the workers
 //   2. a class's *CfgMutex          one refresh or build of a device class at a time
 //   3. a controller's CtrlMutex     its device lists and changing fields
-//   4. Fifo_t::Mutex                the work queue
-//   5. the life's mutex             LifeGuard
+//   4. the life's mutex             LifeGuard
+//   5. Fifo_t::Mutex                the work queue
 // Those of ClassLock (who holds which *CfgMutex) and of the turns (factory, cleanup) guard their
-// own books; no other lock is taken under them, nor are they taken under others but
+// own books; none but the life's is taken under them, nor are they taken under others but
 // PlexorThreadMutex. Work functions run with PlexorThreadMutex released. No broker query is made
 // while CtrlMutex is held.
 #pragma once

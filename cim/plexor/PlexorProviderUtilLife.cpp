@@ -19,8 +19,9 @@ thread_local unsigned int __ThreadLife = 0;
 
 }  // namespace
 
-void BeginLife() {
+void BeginLife(void (*forget)()) {
     pthread_mutex_lock(&__LifeMutex);
+    forget();
     ++__Life;
     pthread_mutex_unlock(&__LifeMutex);
 }
@@ -29,8 +30,9 @@ unsigned int PresentLife() {
     return __Life;
 }
 
-LifeMember::LifeMember() : before_(__ThreadLife) {
-    __ThreadLife = __Life;
+LifeMember::LifeMember(When when) : before_(__ThreadLife) {
+    const unsigned int present = __Life;
+    if (when == When::kAlways || present > __EndedLife) __ThreadLife = present;
 }
 
 LifeMember::~LifeMember() {
@@ -58,6 +60,7 @@ bool LifeIsOver() {
 LifeGuard::LifeGuard() {
     pthread_mutex_lock(&__LifeMutex);
     stands_ = !StopRequested();
+    member_ = __ThreadLife != 0;
 }
 
 LifeGuard::~LifeGuard() {

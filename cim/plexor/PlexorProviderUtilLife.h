@@ -5,8 +5,9 @@
 // to the earlier one: its work comes to an end quietly and leaves no mark on the present life.
 #pragma once
 
-/// Begins a life.
-void BeginLife();
+/// Begins a life. `forget`, run while nobody can ask which life is the present one, resets what
+/// threads of earlier lives may still write.
+void BeginLife(void (*forget)());
 
 /// Number of the present life, from 1 on.
 unsigned int PresentLife();
@@ -15,7 +16,10 @@ unsigned int PresentLife();
 /// that never did so counts as one of the present life.
 class LifeMember {
 public:
-    LifeMember();
+    enum class When { kAlways, kUnlessEnded };
+
+    /// kUnlessEnded: nothing happens when the present life has been asked to end.
+    explicit LifeMember(When when = When::kAlways);
     ~LifeMember();
     LifeMember(const LifeMember&) = delete;
     LifeMember& operator=(const LifeMember&) = delete;
@@ -38,8 +42,8 @@ bool StopRequested();
 bool LifeIsOver();
 
 /// Holds still the question whether the calling thread's life stands, for a scope: what is stored
-/// or started in it is there before a stop begins, or not at all. Taken last, after every other
-/// lock.
+/// or started in it is there before a stop begins, or not at all. Taken after every other
+/// lock but the queue's.
 class LifeGuard {
 public:
     LifeGuard();
@@ -48,9 +52,14 @@ public:
     LifeGuard& operator=(const LifeGuard&) = delete;
 
     bool Stands() const { return stands_; }
+    /// Whether the calling thread was made a member of a life that does not stand any more. Not
+    /// the opposite of Stands(): a thread that is nobody's member does not come from an earlier
+    /// life.
+    bool MemberOfEnded() const { return !stands_ && member_; }
 
 private:
     bool stands_;
+    bool member_;
 };
 
 /// Keeps the library mapped for the rest of the process: a thread that is still inside it would

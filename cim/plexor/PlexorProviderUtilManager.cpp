@@ -17,13 +17,10 @@ namespace {
 std::atomic<bool> __MissTold = false;
 std::atomic<unsigned int> __MissedInLife = 0;  // life whose manager has a null entry
 
-/// True after a flush by the context's own entry. The build for a host that has the entry may be
-/// loaded by a manager that has not; that is said once.
-bool FlushByEntry(CMPIContext* ctx) {
-    if (ctx->ft->flush != nullptr) {
-        ctx->ft->flush(ctx);
-        return true;
-    }
+/// The build for a host that has the entry may be loaded by a manager that has not; that is said
+/// once.
+bool HasFlushEntry(const CMPIContext* ctx) {
+    if (ctx->ft->flush != nullptr) return true;
     __MissedInLife = PresentLife();
     if (!__MissTold.exchange(true)) {
         syslog(LOG_ERR,
@@ -34,8 +31,11 @@ bool FlushByEntry(CMPIContext* ctx) {
     return false;
 }
 
-bool HasFlushEntry(const CMPIContext* ctx) {
-    return ctx->ft->flush != nullptr;
+/// True after a flush by the context's own entry.
+bool FlushByEntry(CMPIContext* ctx) {
+    if (!HasFlushEntry(ctx)) return false;
+    ctx->ft->flush(ctx);
+    return true;
 }
 
 /// Whether this manager is one of those that the standard build is for.
@@ -68,7 +68,7 @@ bool ReadsNull(const CMPIInstance* inst, const char* property) {
            (data.state & CMPI_notFound) != CMPI_notFound;
 }
 
-/// Sets key number `index` where the instance lacks it. False when it was there already.
+/// Sets key number `index` where the instance lacks it. False when nothing was to be set.
 bool CompleteKey(CMPIInstance* inst, const CMPIObjectPath* path, unsigned int index) {
     CMPIString* name = nullptr;
     CMPIStatus status = {CMPI_RC_OK, nullptr};
@@ -76,7 +76,7 @@ bool CompleteKey(CMPIInstance* inst, const CMPIObjectPath* path, unsigned int in
     const char* property = StringText(name);
     if (status.rc != CMPI_RC_OK || property == nullptr || !ReadsNull(inst, property)) return false;
     const char* text = ValueText(key);
-    if (text == nullptr) return true;
+    if (text == nullptr) return false;  // null in the path, too
     // CMPI_chars values are passed as the address of the characters.
     inst->ft->setProperty(inst, property, reinterpret_cast<const CMPIValue*>(text), CMPI_chars);
     return true;

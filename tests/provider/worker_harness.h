@@ -33,7 +33,7 @@ bool comesTrue(Condition condition) {
 
 /// The quiet stop with the limit of a cleanup that does not terminate.
 inline bool quiesceWorkers() {
-    return QuiesceWorkers(Deadline::In(30));
+    return QuiesceWorkers([] { return Deadline::In(30); });
 }
 
 /// What a cleanup will give up because somebody still uses it. Made before that cleanup; releases

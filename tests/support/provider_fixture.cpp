@@ -101,7 +101,7 @@ void ProviderTest::startWorkers() {
 
 void ProviderTest::stopWorkers() {
     if (PlexorThreads[0] == 0 && PlexorThreads[1] == 0) return;
-    EXPECT_TRUE(QuiesceWorkers(Deadline::In(30))) << "a work function does not end";
+    EXPECT_TRUE(QuiesceWorkers([] { return Deadline::In(30); })) << "a work function does not end";
     // A worker that had not begun to wait misses the first call; the second takes it too.
     CleanupPlexorThreads();
     CleanupPlexorThreads();
