@@ -1,0 +1,122 @@
+// Threads that the manager cancels while they are inside the provider.
+#include <pthread.h>
+#include <unistd.h>
+
+#include "meeting_fixture.h"
+
+namespace {
+
+using plexortest::CapturedSyslog;
+using plexortest::Gate;
+using plexortest::GateOpener;
+using testbed::Entry;
+
+class CancelledTest : public plexortest::MeetingTest {
+protected:
+    template <typename Call>
+    static pthread_t start(Call& call) {
+        pthread_t thread = 0;
+        EXPECT_EQ(pthread_create(
+                      &thread, nullptr,
+                      [](void* that) -> void* {
+                          (*static_cast<Call*>(that))();
+                          return nullptr;
+                      },
+                      &call),
+                  0);
+        return thread;
+    }
+    static void cancelAndJoin(pthread_t thread) {
+        EXPECT_EQ(pthread_cancel(thread), 0);
+        void* result = nullptr;
+        EXPECT_EQ(pthread_join(thread, &result), 0);
+        EXPECT_EQ(result, PTHREAD_CANCELED);
+    }
+    static unsigned int active() {
+        const plexortest::WorkersHeld held;
+        return ActiveThreads;
+    }
+    /// Ends the worker as a manager does; the provider joins it.
+    void cancelWorker(int index) { EXPECT_EQ(pthread_cancel(PlexorThreads[index]), 0); }
+};
+
+TEST_F(CancelledTest, AnIdleWorkerLeavesTheOtherAtWork) {
+    load();
+    cancelWorker(0);
+    EXPECT_TRUE(plexortest::soon([this] {
+        plexortest::VirtualClock::advance(100);
+        return requestDrives().get() == 1 &&
+               CapturedSyslog::countContaining("ProcessDeviceConfigChange, EXIT") > 1;
+    }));
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+    EXPECT_EQ(CapturedSyslog::countContaining("still busy"), 0u);
+}
+
+TEST_F(CancelledTest, ABusyWorkerIsCountedNoLonger) {
+    load();
+    static std::atomic<pthread_t> busy;
+    busy = 0;
+    auto* item = plexortest::zeroed<Thread_Args_t>();
+    item->Func = [](CMPIContext*, void* args) {
+        free(args);
+        busy = pthread_self();
+        for (;;) pause();
+    };
+    PutItem(&__FIFO, item);
+    pthread_cond_signal(&PlexorThreadCond);
+    ASSERT_TRUE(plexortest::soon([] { return busy != 0; }));
+    EXPECT_EQ(active(), 1u);
+    EXPECT_EQ(pthread_cancel(busy), 0);
+    EXPECT_TRUE(plexortest::soon([] { return active() == 0; }));
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+    EXPECT_EQ(CapturedSyslog::countContaining("still busy"), 0u);
+}
+
+TEST_F(CancelledTest, ACleanupThatWaitsForAnotherOneIsForgotten) {
+    load();
+    Gate gate;
+    const GateOpener opener(gate);
+    faults().add(waitingAt(Entry::NewInstance, gate));
+    auto request = requestDrives();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto cleanup = cleanUpElsewhere(true);
+    ASSERT_TRUE(cleanupsInside(1));
+    EXPECT_TRUE(stillWaits(cleanup));
+    auto second = [this] { PlexorProviderCleanup(&mi, nullptr, 1); };
+    const pthread_t waiting = start(second);
+    ASSERT_TRUE(cleanupsInside(2));
+    EXPECT_TRUE(stillWaits(cleanup));
+    cancelAndJoin(waiting);
+    gate.open();
+    request.get();
+    EXPECT_EQ(cleanup.get(), CMPI_RC_OK);
+}
+
+TEST_F(CancelledTest, AnInitialisationCanBeTriedAgain) {
+    std::optional<plexortest::GivenUpInventory> givenUp;
+    CapturedSyslog::onLine([&givenUp](const plexortest::LogLine& line) {
+        if (line.text != "BuildControllerInfo, EXIT(0).\n") return;
+        givenUp.emplace();
+        pthread_cancel(pthread_self());
+        pthread_testcancel();
+    });
+    auto factory = [this] {
+        const testbed::Broker::CallScope scope(broker);
+        PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr);
+    };
+    const pthread_t thread = start(factory);
+    void* result = nullptr;
+    EXPECT_EQ(pthread_join(thread, &result), 0);
+    EXPECT_EQ(result, PTHREAD_CANCELED);
+    CapturedSyslog::onLine(nullptr);
+    EXPECT_EQ(initialized(), 0);
+    EXPECT_EQ(controllers(), 0u);
+    givenUp.reset();
+    EXPECT_EQ(books().liveClones(), 0u);
+
+    load();
+    EXPECT_EQ(controllers(), 1u);
+    EXPECT_EQ(requestDrives().get(), 1u);
+}
+
+}  // namespace
