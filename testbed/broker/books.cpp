@@ -10,54 +10,56 @@ namespace {
 
 constexpr std::size_t notKept = std::numeric_limits<std::size_t>::max();
 
+// In the order of Entry.
+constexpr const char* entryNames[] = {
+    "prepareAttachThread",
+    "attachThread",
+    "detachThread",
+    "enumerateInstanceNames",
+    "enumerateInstances",
+    "getInstance",
+    "associators",
+    "associatorNames",
+    "references",
+    "referenceNames",
+    "classPathIsA",
+    "newInstance",
+    "newObjectPath",
+    "newString",
+    "newArray",
+    "toString",
+    "type test",
+    "unsupported entry",
+    "context.flush",
+    "result.returnInstance",
+    "result.returnObjectPath",
+    "result.returnDone",
+    "string.getCharPtr",
+    "array.getSize",
+    "array.getElementAt",
+    "array.setElementAt",
+    "enumeration.hasNext",
+    "enumeration.getNext",
+    "enumeration.toArray",
+    "instance.getProperty",
+    "instance.setProperty",
+    "instance.getObjectPath",
+    "instance.setPropertyFilter",
+    "path.addKey",
+    "path.getKey",
+    "path.getClassName",
+    "path.getNameSpace",
+    "path.toString",
+    "clone",
+    "release",
+    "other object entry",
+};
+
 }  // namespace
 
 const char* entryName(Entry entry) {
-    static constexpr const char* names[] = {
-        "prepareAttachThread",
-        "attachThread",
-        "detachThread",
-        "enumerateInstanceNames",
-        "enumerateInstances",
-        "getInstance",
-        "associators",
-        "associatorNames",
-        "references",
-        "referenceNames",
-        "classPathIsA",
-        "newInstance",
-        "newObjectPath",
-        "newString",
-        "newArray",
-        "toString",
-        "type test",
-        "unsupported entry",
-        "context.flush",
-        "result.returnInstance",
-        "result.returnObjectPath",
-        "result.returnDone",
-        "string.getCharPtr",
-        "array.getSize",
-        "array.getElementAt",
-        "array.setElementAt",
-        "enumeration.hasNext",
-        "enumeration.getNext",
-        "enumeration.toArray",
-        "instance.getProperty",
-        "instance.setProperty",
-        "instance.getObjectPath",
-        "instance.setPropertyFilter",
-        "path.addKey",
-        "path.getKey",
-        "path.getClassName",
-        "path.getNameSpace",
-        "path.toString",
-        "clone",
-        "release",
-        "other object entry",
-    };
-    static_assert(std::size(names) == static_cast<std::size_t>(Entry::OtherObjectCall) + 1);
-    return names[static_cast<std::size_t>(entry)];
+    static_assert(std::size(entryNames) == static_cast<std::size_t>(Entry::OtherObjectCall) + 1);
+    return entryNames[static_cast<std::size_t>(entry)];
 }
 
 bool isQuery(Entry entry) {
@@ -71,7 +73,7 @@ bool isObjectEntry(Entry entry) {
 const char* kindName(ObjectKind kind) {
     static constexpr const char* names[] = {"context",     "result",   "string", "array",
                                             "enumeration", "instance", "path"};
-    return names[static_cast<std::size_t>(kind)];
+    return entryNames[static_cast<std::size_t>(kind)];
 }
 
 void Books::recordObjectCalls(bool on) {

@@ -1,5 +1,5 @@
 #!/usr/bin/env bash
-# Proves that check-schema and messages --check notice a change of either side: each case changes one
+# Proves that check-schema, check-size and messages --check notice a change of either side: each case changes one
 # thing in a copy of the tree and wants a complaint that names it.
 #
 #   checks_fail_test.sh SOURCE_TREE
@@ -18,6 +18,7 @@ fresh_copy() {
 }
 
 check_schema() { "$tree/scripts/check-schema" "$scratch/tree"; }
+check_size() { "$tree/scripts/check-size" "$scratch/tree"; }
 check_messages() { "$tree/scripts/messages" --root "$scratch/tree" --check; }
 
 # CHECK COMPLAINT FILE SED_EXPRESSION
@@ -129,8 +130,17 @@ must_complain check_messages "sources do not have: An old line" docs/messages.me
 must_complain check_messages "twice: malloc failure" docs/messages.meanings \
     's/^List %p is empty/malloc failure/'
 
+# What has grown too long.
+lines=$(printf '    ;\\n%.0s' {1..40})
+must_complain check_size "46 lines, at most 40: void RequestStop() {" \
+    cim/plexor/PlexorProviderUtilLife.cpp "s/^void RequestStop\(\) \{/&\n$lines/"
+must_complain check_size "41 lines, at most 40: CallScope() {" cim/plexor/PlexorProviderLock.h \
+    "s/^class MutexGuard \{/class Scope {\n    CallScope() {\n${lines%    ;\\n}    }\n};\n&/"
+must_complain check_size "PlexorProviderUtilLife.cpp: 4" cim/plexor/PlexorProviderUtilLife.cpp \
+    "1s/^/$(printf '\\n%.0s' {1..400})/"
+
 fresh_copy
-if ! check_schema || ! check_messages; then
+if ! check_schema || ! check_messages || ! check_size; then
     echo "FAIL: the unchanged copy is refused"
     failures=$((failures + 1))
 fi
