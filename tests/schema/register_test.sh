@@ -25,11 +25,15 @@ expect_status() { [ "$status" = "$1" ] || fail "$2: status $status, not $1: $sai
 expect_said() { grep -qF -- "$1" <<<"$said" || fail "$2: did not say \"$1\": $said"; }
 expect_not_said() { ! grep -qF -- "$1" <<<"$said" || fail "$2: said \"$1\": $said"; }
 expect_same() { cmp -s "$1" "$2" || fail "$2 is not $1"; }
-count_files() { find "$root" -type f | wc -l; }
+# Without the notes that the tool keeps.
+count_files() { find "$root" -type f ! -path '*/plexor-provider/registrations' \
+    ! -path '*/plexor-provider/directories' | wc -l; }
 expect_files() { [ "$(count_files)" = "$1" ] || fail "$2: $(count_files) files, not $1"; }
 
-stage=var/lib/plexor-provider/stage
+stage=srv/cim/stage
 mofs=$tree/cim/schema
+# A manager's staging area below $root.
+make_stage() { mkdir -p "$root/$stage/regs" "$root/$stage/mofs/root/cimv2"; }
 staged_classes=$stage/mofs/root/cimv2/Tovexa_Plexor.mof
 
 # All six classes, each once, and nothing to include.
@@ -47,35 +51,36 @@ test_manager() {
     local manager=$1 source=$2 target=$3
     root=$scratch/$manager
     mkdir "$root"
+    make_stage
 
-    register --manager "$manager"
+    register --manager "$manager" --stage /$stage
     expect_status 0 "$manager, first"
-    expect_said "PlexorProvider registered ($manager)" "$manager, first"
-    expect_said "next, for a manager" "$manager, first"
+    expect_said "PlexorProvider files written ($manager)" "$manager, first"
+    expect_said "next, for the manager does not know it yet" "$manager, first"
     expect_files 2 "$manager, first"
     expect_same "$mofs/registration/$source" "$root/$stage/$target"
     expect_classes "$manager"
     [ "$(stat -c %a "$root/$stage/$target")" = 644 ] || fail "$manager: mode of the registration"
 
-    register --manager "$manager"
+    register --manager "$manager" --stage /$stage
     expect_status 0 "$manager, again"
     expect_said "was registered already" "$manager, again"
     expect_not_said "written" "$manager, again"
     expect_not_said "next," "$manager, again"
 
     echo "spoilt" >"$root/$stage/$target"
-    register --manager "$manager"
+    register --manager "$manager" --stage /$stage
     expect_said "written $root/$stage/$target" "$manager, spoilt"
     expect_same "$mofs/registration/$source" "$root/$stage/$target"
 
     touch "$root/$stage/mofs/root/cimv2/Other.mof"
-    register --manager "$manager" --remove
+    register --manager "$manager" --stage /$stage --remove
     expect_status 0 "$manager, remove"
-    expect_said "PlexorProvider removed" "$manager, remove"
+    expect_said "PlexorProvider files removed" "$manager, remove"
     expect_files 1 "$manager, remove (another's file stays)"
     rm "$root/$stage/mofs/root/cimv2/Other.mof"
 
-    register --manager "$manager" --remove
+    register --manager "$manager" --stage /$stage --remove
     expect_status 0 "$manager, remove again"
     expect_said "was not registered" "$manager, remove again"
     expect_not_said "next," "$manager, remove again"
@@ -84,19 +89,21 @@ test_manager() {
 test_two_managers_share_the_classes() {
     root=$scratch/two
     mkdir "$root"
-    register --manager section
-    register --manager module
-    register --manager section --remove
+    make_stage
+    register --manager section --stage /$stage
+    register --manager module --stage /$stage
+    register --manager section --stage /$stage --remove
     expect_said "in use by another registration" "two managers"
     expect_files 2 "two managers, one removed"
     expect_classes "two managers, one removed"
-    register --manager module --remove
+    register --manager module --stage /$stage --remove
     expect_files 0 "two managers, both removed"
 }
 
 test_chosen_places() {
     root=$scratch/chosen
     mkdir "$root"
+    make_stage
     register --manager section --stage /srv/cim/stage --service cimd
     expect_said "systemctl try-restart cimd" "chosen places"
     [ -e "$root/srv/cim/stage/regs/PlexorProvider.reg" ] || fail "chosen places: no registration"
@@ -119,14 +126,20 @@ test_refusals() {
     expect_said "unknown manager carrot" "unknown manager"
     register --manager section --carrot
     expect_status 2 "unknown argument"
-    PLEXOR_SHARE=$scratch register --manager section
+    PLEXOR_SHARE=$scratch register --manager module
     expect_status 1 "no class files"
     expect_files 0 "refusals"
+    register --manager module --check
+    expect_status 2 "two tasks"
+    register --all
+    expect_status 2 "all without remove"
+    register --manager plain --run
+    expect_status 2 "run for a manager without commands"
     # A file stands where the stage's directory should be.
     touch "$root/var"
-    register --manager section
+    register --manager module
     expect_status 1 "stage cannot be made"
-    expect_not_said "registered (section)" "stage cannot be made"
+    expect_not_said "files written" "stage cannot be made"
 }
 
 test_manager section PlexorProvider.section regs/PlexorProvider.reg
