@@ -142,12 +142,131 @@ test_refusals() {
     expect_not_said "files written" "stage cannot be made"
 }
 
+# A stage that nobody reads would take the files without a word.
+test_foreign_stages() {
+    root=$scratch/foreign
+    mkdir -p "$root/srv/only/regs"
+    register --manager section
+    expect_status 2 "section without a stage"
+    register --manager section --stage /srv/none
+    expect_status 1 "a stage that is not there"
+    expect_said "is no manager's staging area" "a stage that is not there"
+    register --manager section --stage /srv/only
+    expect_status 1 "a stage without mofs"
+    [ -z "$(find "$root" -type f)" ] || fail "foreign stages: files written"
+}
+
+test_nothing_is_left() {
+    local before
+    root=$scratch/left
+    mkdir -p "$root/var/lib"
+    make_stage
+    before=$(find "$root" | sort)
+    register --manager section --stage /$stage --service cimd
+    register --manager module
+    register --remove --all
+    expect_status 0 "remove all"
+    expect_said "files removed (section)" "remove all"
+    expect_said "systemctl try-restart cimd" "remove all"
+    expect_said "files removed (module)" "remove all"
+    [ "$(find "$root" | sort)" = "$before" ] || fail "left behind: $(find "$root" | sort)"
+    register --remove --all
+    expect_status 0 "remove all, again"
+}
+
+# What the package's upgrade does: new classes, and a manager whose stage is gone.
+test_again() {
+    root=$scratch/again
+    mkdir "$root"
+    make_stage
+    register --again
+    [ "$status" = 0 ] && [ -z "$said" ] || fail "again, nothing registered: $said"
+    register --manager section --stage /$stage
+    register --manager module
+    register --again
+    expect_said "was registered already (section)" "again, unchanged"
+    expect_said "cimprovider -e -m PlexorProviderModule" "again: the library is another one"
+    expect_not_said "cimmof" "again, unchanged"
+
+    cp -r "$mofs" "$scratch/newer"
+    mkdir -p "$scratch/share" && mv "$scratch/newer" "$scratch/share/mof"
+    ln -s "$mofs/registration" "$scratch/share/registration"
+    sed -i 's/Version("1.0.0")/Version("9.0.0")/' "$scratch/share/mof/Tovexa_PlexorBattery.mof"
+    PLEXOR_SHARE=$scratch/share register --again
+    expect_status 0 "again, newer classes"
+    grep -q 9.0.0 "$root/$staged_classes" || fail "again: the newer classes are not staged"
+    # A class that the manager knows goes before it comes.
+    local deleted compiled
+    deleted=$(grep -n 'cimcli dc -n root/cimv2 Tovexa_PlexorBattery' <<<"$said" | cut -d: -f1)
+    compiled=$(grep -n 'cimmof -n root/cimv2' <<<"$said" | cut -d: -f1)
+    [ -n "$deleted" ] && [ -n "$compiled" ] && [ "$deleted" -lt "$compiled" ] ||
+        fail "again, newer classes: $said"
+
+    rm -r "${root:?}/srv"
+    register --again
+    expect_status 0 "again without the stage"
+    expect_said "is gone, not registered again" "again without the stage"
+    [ ! -e "$root/srv" ] || fail "again: a stage that nobody reads was made"
+}
+
+# Runs a manager's commands: here those that stand on the PATH.
+test_run() {
+    root=$scratch/run
+    mkdir -p "$root" "$scratch/bin"
+    local tool
+    for tool in cimmof cimcli cimprovider; do
+        printf '#!/bin/sh\necho "%s $*" >>%s/called\n[ ! -e %s/down ]\n' \
+            "$tool" "$scratch" "$scratch" >"$scratch/bin/$tool"
+        chmod +x "$scratch/bin/$tool"
+    done
+    PATH=$scratch/bin:$PATH register --manager module --run
+    expect_status 0 "run"
+    [ "$(cat "$scratch/called")" = "cimmof -n root/cimv2 $root/var/lib/plexor-provider/stage/mofs/root/cimv2/Tovexa_Plexor.mof
+cimmof -n root/interop $root/var/lib/plexor-provider/stage/mofs/PlexorProviderModule.mof" ] ||
+        fail "run: called $(cat "$scratch/called")"
+    rm "$scratch/called"
+    PATH=$scratch/bin:$PATH register --remove --all
+    [ "$(wc -l <"$scratch/called")" = 8 ] || fail "run, removed: called $(cat "$scratch/called")"
+    touch "$scratch/down"
+    PATH=$scratch/bin:$PATH register --manager module --run
+    expect_status 1 "run, the manager is down"
+    PATH=$scratch/bin:$PATH register --remove --all
+    expect_status 0 "a manager that is down does not keep the files"
+    expect_files 0 "a manager that is down does not keep the files"
+}
+
+test_builds() {
+    root=$scratch/builds
+    mkdir -p "$root/usr/lib/x86_64-linux-gnu/cmpi"
+    local library=$root/usr/lib/x86_64-linux-gnu/cmpi/libPlexorProvider.so
+    register --manager module
+    expect_said "library: none in the provider directories" "no library"
+    echo "PlexorProvider_Create_InstanceMI" >"$library"
+    register --manager module
+    expect_said "cmpi/libPlexorProvider.so: the build for standard managers" "standard build"
+    echo "the manager's context table has no flush" >>"$library"
+    register --manager module
+    expect_said "the build for managers whose context table has flush" "build with flush"
+}
+
+# One process for all six classes.
+test_one_process() {
+    local section=$mofs/registration/PlexorProvider.section
+    [ "$(grep -c '^   group: PlexorProvider$' "$section")" = 6 ] || fail "not all in one group"
+}
+
 test_manager section PlexorProvider.section regs/PlexorProvider.reg
 test_manager module PlexorProviderModule.mof mofs/PlexorProviderModule.mof
 test_manager plain PlexorProvider.plain regs/PlexorProvider.plain
 test_two_managers_share_the_classes
 test_chosen_places
 test_refusals
+test_foreign_stages
+test_nothing_is_left
+test_again
+test_run
+test_builds
+test_one_process
 
 [ $failures = 0 ] || exit 1
 echo "register: fine"
