@@ -11,7 +11,8 @@ namespace {
 namespace fs = std::filesystem;
 
 constexpr const char* kLibraryName = "libPlexorProvider.so";
-/// Below the directory of the build for the host's manager; there is none where that one is standard.
+/// Below the directory of the build for the host's manager; there is none where that one is
+/// standard.
 constexpr const char* kStandard = "standard";
 constexpr const char* kDirectories[] = {".", BUILT_PROVIDER_DIR, INSTALLED_PROVIDER_DIR};
 
