@@ -116,8 +116,8 @@ check_library() {
         return
     fi
     elsewhere=$(find_library "$(provider_directories)")
-    missing 3 library "no libPlexorProvider.so in ${directories:+${directories//$'\n'/, }, }\
-the provider directories${elsewhere:+; it lies in $(dirname "$elsewhere")}"
+    missing 3 library "no libPlexorProvider.so in the provider directories\
+${directories:+ (${directories//$'\n'/, })}${elsewhere:+; it lies in $(dirname "$elsewhere")}"
 }
 
 check_answering() {

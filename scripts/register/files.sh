@@ -121,22 +121,31 @@ note_registration() {
     install -m 644 "$scratch/registrations" "$notes" || refuse "cannot write $notes"
 }
 
-# With the last registration go the directories that were made for it, as far as they are empty.
 forget_registration() {
-    local notes directory
+    local notes
     notes=$(notes_dir)
     [ -d "$notes" ] || return 0
+    [ -z "$keep_notes" ] || return 0
     other_records >"$scratch/registrations"
     if [ -s "$scratch/registrations" ]; then
         install -m 644 "$scratch/registrations" "$notes/registrations"
         return
     fi
     rm -f "$notes/registrations"
+    remove_directories
+}
+
+# The directories that were made for registrations, as far as they are empty.
+remove_directories() {
+    local notes directory
+    notes=$(notes_dir)
     [ -e "$notes/directories" ] || return 0
     LC_ALL=C sort -ru "$notes/directories" >"$scratch/directories"
     rm -f "$notes/directories"
     while read -r directory; do
         rmdir --ignore-fail-on-non-empty "$directory" 2>/dev/null || true
+        # That of the notes stays with them.
+        [ -z "$keep_notes" ] || [ ! -d "$directory" ] || echo "$directory" >>"$notes/directories"
     done <"$scratch/directories"
 }
 
@@ -169,6 +178,7 @@ for_each_record() {
         IFS='|' read -r manager stage service interop run <<<"$line"
         "$1"
     done
+    [ -z "$keep_notes" ] || remove_directories
 }
 
 # A manager that was taken away has taken its stage with it: that is no reason to fail.

@@ -172,6 +172,19 @@ test_nothing_is_left() {
     [ "$(find "$root" | sort)" = "$before" ] || fail "left behind: $(find "$root" | sort)"
     register --remove --all
     expect_status 0 "remove all, again"
+
+    # As between removal and purge of the package, or from one build to the other.
+    register --manager section --stage /$stage --service cimd
+    register --manager module
+    register --remove --all --keep-notes
+    expect_files 0 "removed, but not forgotten"
+    [ ! -e "$root/var/lib/plexor-provider/stage" ] || fail "removed, but a directory is left"
+    register --again
+    expect_said "files written (section)" "registered again"
+    expect_said "files written (module)" "registered again"
+    expect_files 4 "registered again"
+    register --remove --all
+    [ "$(find "$root" | sort)" = "$before" ] || fail "left behind at last: $(find "$root" | sort)"
 }
 
 # What the package's upgrade does: new classes, and a manager whose stage is gone.
