@@ -32,7 +32,7 @@ expected_provider_files() {
         echo "644 usr/share/plexor-provider/registration/$file"
     done
 }
-provider_documents="copyright messages.md operating.md"
+provider_documents="copyright install.md messages.md operating.md runbook.md"
 
 # SOURCE LIBDIR: the same of the test bed. $with_standard is empty where there is one build only.
 expected_testbed_files() {
@@ -63,7 +63,7 @@ expected_testbed_files() {
         echo "644 usr/share/plexor-testbed/scenarios/$(basename "$file")"
     done
 }
-testbed_documents="copyright managers.md operating.md scenarios.md security.md"
+testbed_documents="copyright managers.md operating.md runbook.md scenarios.md security.md"
 
 # ROOT: mode and path of what is there; of a link, the mode of what it leads to.
 found_files() { (cd "$1" && find -L . -type f -printf '%m %P\n'); }
