@@ -87,6 +87,8 @@ finish_registration() {
     fi
     if [ -n "$remove" ]; then
         echo "next, for the manager still knows it:"
+    elif [ "$changed" = 0 ]; then
+        echo "next, for the manager may still hold the library of before:"
     else
         echo "next, for the manager does not know it yet:"
     fi

@@ -198,6 +198,7 @@ test_again() {
     register --manager module
     register --again
     expect_said "was registered already (section)" "again, unchanged"
+    expect_said "may still hold the library of before" "again: the library is another one"
     expect_said "cimprovider -e -m PlexorProviderModule" "again: the library is another one"
     expect_not_said "cimmof" "again, unchanged"
 
