@@ -78,6 +78,10 @@ require_stage() {
             refuse "--stage is missing: the manager's staging area, which has regs and mofs in it" 2
         stage=$own_stage
     fi
+    # The notes have a line for each registration, with fields that a bar ends.
+    case $stage$service$interop in
+        *'|'* | *$'\n'*) refuse "a bar or line end in --stage, --service or --interop" 2 ;;
+    esac
     stage_dir=${root%/}/${stage#/}
     [ "$manager" = section ] && [ -z "$remove" ] || return 0
     [ -d "$stage_dir/regs" ] && [ -d "$stage_dir/mofs" ] ||

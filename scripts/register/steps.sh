@@ -28,13 +28,13 @@ print_module_steps() {
         echo "cimprovider -e -m PlexorProviderModule"
         return
     fi
-    echo "cimmof -n root/cimv2 $classes"
-    echo "cimmof -n $interop $registration"
+    printf 'cimmof -n root/cimv2 %q\n' "$classes"
+    printf 'cimmof -n %q %q\n' "$interop" "$registration"
 }
 
 print_restart() {
     if [ -n "$service" ]; then
-        echo "systemctl try-restart $service"
+        printf 'systemctl try-restart %q\n' "$service"
     else
         echo "restart the manager (--service NAME prints the command)"
     fi

@@ -133,6 +133,8 @@ test_refusals() {
     expect_status 2 "two tasks"
     register --all
     expect_status 2 "all without remove"
+    register --manager module --stage '/srv/a|b'
+    expect_status 2 "a stage that the notes cannot hold"
     register --manager plain --run
     expect_status 2 "run for a manager without commands"
     # A file stands where the stage's directory should be.
@@ -241,6 +243,11 @@ cimmof -n root/interop $root/var/lib/plexor-provider/stage/mofs/PlexorProviderMo
     rm "$scratch/called"
     PATH=$scratch/bin:$PATH register --remove --all
     [ "$(wc -l <"$scratch/called")" = 8 ] || fail "run, removed: called $(cat "$scratch/called")"
+    PATH=$scratch/bin:$PATH register --manager module --run --stage '/srv/with $(blanks)'
+    expect_status 0 "run, a stage with blanks"
+    grep -qF "root/interop $root/srv/with \$(blanks)/mofs" "$scratch/called" ||
+        fail "run, blanks: called $(cat "$scratch/called")"
+    PATH=$scratch/bin:$PATH register --remove --all
     touch "$scratch/down"
     PATH=$scratch/bin:$PATH register --manager module --run
     expect_status 1 "run, the manager is down"
