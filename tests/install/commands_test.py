@@ -62,7 +62,9 @@ def make_sandbox(root):
     (root / "build").symlink_to(BUILD.parent)
     cmpi = root / "usr/lib/cmpi"
     cmpi.mkdir(parents=True)
-    (cmpi / "libPlexorProvider.so").symlink_to(BUILD / "lib/standard/libPlexorProvider.so")
+    standard = BUILD / "lib/standard/libPlexorProvider.so"
+    library = standard if standard.exists() else BUILD / "lib/libPlexorProvider.so"
+    (cmpi / library.name).symlink_to(library)
     binaries = root / "bin"
     binaries.mkdir()
     for name in ("plexor-testbed", "check_plexor"):

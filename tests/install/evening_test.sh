@@ -105,7 +105,7 @@ serve /root/unregistered.json
 shows 7 "${check[@]}"
 serve /root/empty.json
 shows 8 "${check[@]}"
-serve healthy-array --control /run/array
+serve healthy-array --control /run/array --interval 1
 in_root "$root" plexor-testbed tell /run/array \
     'server status=5 operation=GetClass class=Tovexa_PlexorBattery'
 shows 5 "${check[@]}"
@@ -127,7 +127,7 @@ shows 0 find /var/lib/cim /var/lib/plexor-provider -type f
 echo; echo "# Asking"
 shows 0 /usr/lib/nagios/plugins/check_plexor -H localhost -p $port --expect volumes=2,drives=8
 in_root "$root" plexor-testbed tell /run/array 'fail drive C0 32_1'
-shows 1 /usr/lib/nagios/plugins/check_plexor -H localhost -p $port --refresh 8 \
+shows 1 /usr/lib/nagios/plugins/check_plexor -H localhost -p $port --refresh 5 \
     --level FAILED=warning
 for kind in small large worst; do
     serve degraded-array --manager $kind
