@@ -4,6 +4,12 @@ target_compile_options(plexor_flags INTERFACE
     -Wall -Wextra -Wpedantic -Wshadow -Wformat=2 -fstack-protector-strong)
 target_link_libraries(plexor_flags INTERFACE Threads::Threads)
 
+
+# What is installed runs with rights, and reads what strangers send.
+include(CheckPIESupported)
+check_pie_supported(LANGUAGES C CXX)
+add_link_options(-Wl,-z,relro -Wl,-z,now -Wl,-z,noexecstack)
+
 if(PLEXOR_SANITIZE)
     add_compile_options(-fsanitize=${PLEXOR_SANITIZE} -fno-omit-frame-pointer -fno-sanitize-recover=all)
     add_link_options(-fsanitize=${PLEXOR_SANITIZE})

@@ -11,11 +11,27 @@ set(PLEXOR_HOSTCONFIG "" CACHE STRING
 set(PLEXOR_SANITIZE "" CACHE STRING "Sanitizers for every target, as -fsanitize takes them")
 option(PLEXOR_COVERAGE "Instrument for coverage" OFF)
 
-# The two builds must not be taken for one another, so their packages have names of their own.
+# The two builds must not be taken for one another, so their packages have names of their own. What
+# `cmake --install` installs is the configured one; packages are made of both.
 if(PLEXOR_CONTEXT_FLUSH)
-    set(PLEXOR_PACKAGE plexor-provider)
-    set(PLEXOR_OTHER_PACKAGE plexor-provider-standard)
+    set(PLEXOR_PACKAGE plexor-provider-flush)
+    set(PLEXOR_PROVIDER_COMPONENTS flush provider)
 else()
-    set(PLEXOR_PACKAGE plexor-provider-standard)
-    set(PLEXOR_OTHER_PACKAGE plexor-provider)
+    set(PLEXOR_PACKAGE plexor-provider)
+    set(PLEXOR_PROVIDER_COMPONENTS provider)
 endif()
+
+# Installs for the provider: for the configured build, and for the package of the other one. @DOC@ in
+# an argument is the documentation directory of the package.
+function(plexor_install_provider)
+    set(extra "")
+    foreach(component IN LISTS PLEXOR_PROVIDER_COMPONENTS)
+        set(package plexor-provider)
+        if(component STREQUAL flush)
+            set(package plexor-provider-flush)
+        endif()
+        string(REPLACE "@DOC@" "${CMAKE_INSTALL_DATADIR}/doc/${package}" arguments "${ARGN}")
+        install(${arguments} COMPONENT ${component} ${extra})
+        set(extra EXCLUDE_FROM_ALL)
+    endforeach()
+endfunction()

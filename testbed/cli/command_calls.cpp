@@ -66,8 +66,8 @@ int printCalls(const CallsOptions& options) {
     Scenario scenario = readScenario(options.scenario);
     scenario.manager = chosenManager(scenario, options.manager);
     directProviderLog(LOG_ERR, nullptr);
-    ProviderSession session(scenario, locateLibrary(options.library), options.provider,
-                            options.schema);
+    ProviderSession session(scenario, locateLibrary(options.library, scenario.manager),
+                            options.provider, options.schema);
     if (!session.waitForInventory(std::chrono::seconds(options.timeoutSeconds), "root/cimv2"))
         return kProviderFailed;
     int total = 0;

@@ -76,8 +76,8 @@ Answers ask(const ShowOptions& options) {
     Scenario scenario = readScenario(options.scenario);
     scenario.manager = chosenManager(scenario, options.manager);
     directLog(options.log);
-    ProviderSession session(scenario, locateLibrary(options.library), options.provider,
-                            options.schema, options.nameSpace);
+    ProviderSession session(scenario, locateLibrary(options.library, scenario.manager),
+                            options.provider, options.schema, options.nameSpace);
     Answers answers;
     const Progress progress(
         [](int seconds) { return "waiting for the inventory, " + std::to_string(seconds) + " s"; });

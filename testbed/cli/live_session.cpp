@@ -89,7 +89,9 @@ LiveSession::LiveSession(const LiveOptions& options)
               array_ = std::make_unique<LiveArray>(broker, options.scenario);
               defineChosenClasses(broker.repository(), kServedNamespace, options.schema);
           },
-          locateLibrary(options.library), options.provider) {}
+          locateLibrary(options.library,
+                        chosenManager(readScenario(options.scenario), options.manager)),
+          options.provider) {}
 
 LiveSession::~LiveSession() {
     directProviderLog(LOG_ERR, nullptr);
