@@ -17,6 +17,8 @@ using Clock = HttpConnection::Clock;
 using Parser = http::request_parser<http::string_body>;
 
 constexpr std::size_t kReadSize = 16 * 1024;
+/// However quiet a stream is, it is asked that often.
+constexpr std::chrono::seconds kStreamPause{1};
 
 /// The status that tells a client what is wrong with what it sends; 0 for one that has gone.
 int refusalFor(const beast::error_code& error) {
@@ -263,7 +265,7 @@ private:
             }
             bottom().expires_never();
             beast::error_code error;
-            timer->expires_at(Clock::time_point::max());
+            timer->expires_after(kStreamPause);
             co_await timer->async_wait(asio::redirect_error(use_awaitable, error));
             if (!bottom().socket().is_open())
                 throw beast::system_error(asio::error::operation_aborted);

@@ -42,7 +42,8 @@ public:
     using Text = std::shared_ptr<const std::string>;
 
     virtual ~HttpStream() = default;
-    /// What there is to send now; NULL for nothing. Called on the I/O thread, must not wait.
+    /// What there is to send now; NULL for nothing. Called on the I/O thread when the stream has
+    /// been woken, and once a second; must not wait. A client that has gone is noticed by sending.
     virtual Text next() = 0;
     /// From now on, `wake` is called when there may be something to send; it can be called by any
     /// thread, but not after the stream has been destroyed.
