@@ -80,9 +80,9 @@ class Session:
                 stream.close()
 
 
-def serve(*arguments, scenario="healthy-array", **options):
-    """A server on a free port, when it serves."""
+def serve(*arguments, scenario="healthy-array", port="0", **options):
+    """A server, on a free port unless it is said, when it serves."""
     session = Session("serve", "--scenario", scenario_file(scenario) if "/" not in scenario
-                      else scenario, "--port", "0", *arguments, **options)
+                      else scenario, "--port", port, *arguments, **options)
     session.url = session.await_line("serving ").split(" ")[1]
     return session
