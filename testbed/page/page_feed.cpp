@@ -254,8 +254,8 @@ void PageFeed::publish(PageDocument document) {
     const std::lock_guard lock(mutex_);
     document_ = std::move(document);
     change["base"] = serial_++;
-    change["serial"] = serial_;
-    change_ = eventText("change", jsonLine(change));
+    // Its members stand behind the head, which has the serial.
+    change_ = eventText("change", "{" + headLocked() + "," + jsonLine(change).substr(1));
     body_.clear();
     if (stops_) return;
     for (const Stream* stream : streams_) stream->wake();

@@ -158,7 +158,7 @@ class Steering(Page):
         self.wait(lambda: "stands still" in self.text("#time"), "time stands")
         self.press("play")
         self.press("speed 10")
-        self.wait(lambda: "10 times as fast" in self.text("#time"), "time hurries")
+        self.wait(lambda: "10 times as fast as the clock" in self.text("#time"), "time hurries")
         self.find("summary").click()
         self.press("latency 200 800")
         self.press("latency 0 0")

@@ -19,7 +19,7 @@ expected_files() {
     echo "755 usr/sbin/plexor-register"
     echo "644 usr/$libdir/cmpi/libPlexorProvider.so"
     echo "644 usr/$libdir/plexor-testbed/libplexor-manager-flush.so"
-    for file in copyright messages.md operating.md scenarios.md security.md; do
+    for file in copyright messages.md operating.md page.md scenarios.md security.md; do
         echo "644 usr/share/doc/$package/$file"
     done
     for file in plexor-icinga2.conf plexor-nagios.cfg; do

@@ -18,8 +18,11 @@ export class ArrayView {
 
   /// Draws what has another shape, then everything that was touched (null: all of it).
   update(touched) {
+    const keys = touched ?? [...this.nodes.keys()]; // new ones are filled when they are made
+    const focused = document.activeElement;
     this.drawSections();
-    const keys = touched ?? this.nodes.keys();
+    // A rack that was drawn anew has taken the focus with it.
+    if (focused?.dataset.key && !focused.isConnected) this.nodeOf(focused.dataset.key)?.focus({ preventScroll: true });
     for (const key of keys) for (const node of this.nodes.get(key) ?? []) this.fill(node, key);
     this.highlight();
   }
@@ -35,6 +38,10 @@ export class ArrayView {
       if (node.dataset.key !== key) node.setAttribute('aria-pressed', 'false');
     for (const node of this.nodes.get(key) ?? []) setAttribute(node, 'aria-pressed', true);
     this.highlight();
+  }
+
+  nodeOf(key) {
+    return (this.nodes.get(key) ?? []).find((node) => node.isConnected);
   }
 
   place(key) {
@@ -168,7 +175,7 @@ export class ArrayView {
     return button;
   }
 
-  /// A button that shows an element; `fresh` makes another one.
+  /// A button that shows an element; `fresh` makes another one, which is still empty.
   node(key, className, fresh = false) {
     const nodes = (this.nodes.get(key) ?? []).filter((node) => !fresh || node.isConnected);
     const known = nodes.find((node) => node.classList.contains(className));
@@ -177,7 +184,7 @@ export class ArrayView {
       type: 'button', class: className, 'data-key': key, 'aria-pressed': key === this.selected,
     });
     this.nodes.set(key, [...nodes, node]);
-    this.fill(node, key);
+    if (!fresh) this.fill(node, key);
     return node;
   }
 

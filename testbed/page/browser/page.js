@@ -117,6 +117,7 @@ const feed = new Feed({
       detail.update();
     });
     document.body.dataset.serial = model.serial;
+    noteAge(data);
     return taken !== null;
   },
 

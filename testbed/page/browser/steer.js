@@ -1,5 +1,7 @@
 // Buttons for the live commands. What each of them sends is what it shows.
-import { byId, make, setChildren, setText } from '/page/dom.js';
+import { byId, make, setText } from '/page/dom.js';
+
+const kResultShown = 8000; // what was refused stays until the next command
 
 export class Steering {
   constructor(model) {
@@ -30,7 +32,7 @@ export class Steering {
     const time = this.model.rest.timeline;
     if (!time) return;
     setText(byId('time'), time.paused ? 'The array’s time stands still.'
-      : `The array’s time goes ${time.speed === 1 ? 'with the clock' : `${time.speed} times as fast`}.`);
+      : `The array’s time goes ${time.speed === 1 ? 'with the clock' : `${time.speed} times as fast as the clock`}.`);
     const lines = time.next.map((next) => make('li', {}, `in ${next.in}: `, make('code', {}, next.command)));
     if (time.more > 0) lines.push(make('li', {}, `and ${time.more} more`));
     byId('ahead').replaceChildren(...lines);
@@ -79,6 +81,8 @@ export class Steering {
     const tell = (text, refused) => {
       setText(byId('result'), text);
       byId('result').dataset.refused = refused;
+      clearTimeout(this.fading);
+      if (!refused) this.fading = setTimeout(() => setText(byId('result'), ''), kResultShown);
     };
     tell(`sending: ${command}`, false);
     try {
