@@ -66,7 +66,7 @@ class Control(unittest.TestCase):
         self.assertTrue(wait_until(lambda: "1 drive rebuilding" in self.check(server.url)))
         self.assertIn("1 drive rebuilding", self.check(server.url), "time stands")
         self.assertEqual(self.tell("play")[0], 0)
-        self.assertIn('set drive C0 32_7 state="online"', server.await_line("[60 s]"))
+        self.assertIn('] set drive C0 32_7 state="online"', server.await_line("32_7 state="))
         for wrong, why in (("speed", "speed takes one number"), ("pause 5", "pause takes nothing"),
                            ("speed 0", "a number from 0.001 to 1000000 is needed behind speed"),
                            ("speed fast", "a number from 0.001 to 1000000 is needed behind speed")):
