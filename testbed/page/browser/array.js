@@ -217,11 +217,12 @@ export class ArrayView {
     const { view } = element;
     setAttribute(node, 'data-look', view.look);
     setAttribute(node, 'data-level', view.level);
-    const drives = view.members.length;
+    const count = view.members.length;
+    const drives = count === 0 ? '' : count === 1 ? '1 drive' : `${count} drives`;
     this.parts(node, [['sign', view.sign], ['title', view.label],
                       ['word', view.state],
-                      ['faint', `${view.size ?? ''}${drives ? `${view.size ? ', ' : ''}${drives} drives` : ''}`]]);
-    setAttribute(node, 'aria-label', `volume ${view.label}, ${view.state}, ${view.size ?? 'size unknown'}, ${drives} drives`);
+                      ['faint', [view.size, drives].filter(Boolean).join(', ')]]);
+    setAttribute(node, 'aria-label', ['volume ' + view.label, view.state, view.size, drives].filter(Boolean).join(', '));
   }
 
   fillPart(node, key, element) {
