@@ -30,8 +30,6 @@ void addServerOptions(CLI::App& command, AskOptions& options) {
     command.add_option("--path", options.path, "where the server takes requests; /cimom");
     command.add_option("--namespace", options.nameSpace,
                        "namespace of the requests; the URL's, or root/cimv2");
-    command.add_option("--class", options.className, "ask for this class only")
-        ->check(CLI::IsMember(classesToAsk("")));
 }
 
 void addConnectionOptions(CLI::App& command, AskOptions& options) {
@@ -44,6 +42,9 @@ void addConnectionOptions(CLI::App& command, AskOptions& options) {
     command.add_option("-t,--timeout", options.timeoutSeconds, "seconds that all of it may take")
         ->check(CLI::Range(1, 86400))
         ->capture_default_str();
+}
+
+void addRefreshOptions(CLI::App& command, AskOptions& options) {
     CLI::Option* refresh =
         command
             .add_option("--refresh", options.refreshSeconds,
@@ -55,6 +56,8 @@ void addConnectionOptions(CLI::App& command, AskOptions& options) {
 }
 
 void addViewOptions(CLI::App& command, AskOptions& options, bool isPlugin) {
+    command.add_option("--class", options.className, "ask for this class only")
+        ->check(CLI::IsMember(classesToAsk("")));
     CLI::Option* json = command.add_flag("--json", options.json, "print JSON");
     CLI::Option* check = addCheckOptions(command, options.check, isPlugin);
     if (isPlugin) return;
@@ -109,9 +112,14 @@ std::optional<std::chrono::milliseconds> refreshOf(const AskOptions& options) {
 
 }  // namespace
 
-void addAskOptions(CLI::App& command, AskOptions& options, bool isPlugin) {
+void addTargetOptions(CLI::App& command, AskOptions& options) {
     addServerOptions(command, options);
     addConnectionOptions(command, options);
+}
+
+void addAskOptions(CLI::App& command, AskOptions& options, bool isPlugin) {
+    addTargetOptions(command, options);
+    addRefreshOptions(command, options);
     addViewOptions(command, options, isPlugin);
 }
 

@@ -32,6 +32,9 @@ struct AskOptions {
     ColourChoice colour;
 };
 
+/// Adds those that tell which server to ask, and how. `options` must live until the command runs.
+void addTargetOptions(CLI::App& command, AskOptions& options);
+
 /// Adds all options. A plugin always checks. `options` must live until the command runs.
 void addAskOptions(CLI::App& command, AskOptions& options, bool isPlugin);
 

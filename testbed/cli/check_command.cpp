@@ -36,18 +36,23 @@ void addPolicyOptions(CLI::App& command, CheckPolicy& policy) {
 
 }  // namespace
 
-CLI::Option* addCheckOptions(CLI::App& command, CheckOptions& options, bool isPlugin) {
-    CLI::Option* check =
-        command.add_flag(kFlag, options.check,
-                         "print one line for a monitoring system and exit with 0 (ok), 1 "
-                         "(warning), 2 (critical) or 3 (unknown)");
+CLI::Option* addJudgingOptions(CLI::App& command, CheckOptions& options) {
     CLI::Option* expect = addTexts(
         command, "--expect", "KIND=N",
         "volumes=N, drives=N, ...: critical when there are fewer, a warning when there are more; "
         "drives>=N: more are fine",
         [&options](const std::string& text) { return takeExpected(text, options.expected); });
-    if (!isPlugin) expect->needs(check);
     addPolicyOptions(command, options.policy);
+    return expect;
+}
+
+CLI::Option* addCheckOptions(CLI::App& command, CheckOptions& options, bool isPlugin) {
+    CLI::Option* check =
+        command.add_flag(kFlag, options.check,
+                         "print one line for a monitoring system and exit with 0 (ok), 1 "
+                         "(warning), 2 (critical) or 3 (unknown)");
+    CLI::Option* expect = addJudgingOptions(command, options);
+    if (!isPlugin) expect->needs(check);
     command.add_flag("-v,--verbose", options.verbosity,
                      "behind the line of a check, one for each element that is not ok; twice: for "
                      "each element");

@@ -23,6 +23,9 @@ struct CheckOptions {
 /// but a check, so that --check is taken for granted.
 CLI::Option* addCheckOptions(CLI::App& command, CheckOptions& options, bool isPlugin = false);
 
+/// Adds --expect, which is returned, --level and --ignore.
+CLI::Option* addJudgingOptions(CLI::App& command, CheckOptions& options);
+
 /// The summary that `make` gives, or one that tells what it threw.
 CheckSummary summaryOf(const std::function<CheckSummary()>& make);
 

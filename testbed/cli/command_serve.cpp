@@ -6,16 +6,20 @@
 #include <unistd.h>
 
 #include <CLI/CLI.hpp>
+#include <filesystem>
 #include <iostream>
 #include <memory>
 
 #include "access.h"
 #include "cim_server.h"
+#include "command_queue.h"
 #include "control_socket.h"
 #include "descriptor_limit.h"
 #include "http_server.h"
 #include "input_lines.h"
 #include "live_session.h"
+#include "page_about.h"
+#include "page_server.h"
 #include "provider_log.h"
 #include "server_faults.h"
 #include "stop_signals.h"
@@ -30,6 +34,7 @@ struct ServeOptions {
     HttpServerOptions http;
     std::string control;
     AccessOptions access;
+    std::string page = "steer";
     std::string certificate;
     std::string key;
     bool selfSigned = false;
@@ -59,27 +64,63 @@ public:
         : LiveSession(options.live),
           signals_(signals),
           manager_(session().repository(), registrationOf(session()), hostName()),
-          cim_(manager_, hostName(), std::move(credentials)),
+          cim_(manager_, hostName(), credentials),
+          feed_(pageSource(options)),
+          page_(feed_, {hostName(), isSecure(options), std::move(credentials)}, steering(options)),
           http_(httpOptions(options),
-                [this](const HttpRequest& request) { return cim_.answer(request); }),
+                [this, withPage = options.page != "off"](const HttpRequest& request) {
+                    auto outcome = withPage ? page_.answer(request) : std::nullopt;
+                    return outcome ? std::move(*outcome) : cim_.answer(request);
+                }),
           control_(options.control),
           url_(urlOf(options)) {
         // Nobody asks for the calls, and there is no end to them.
         session().broker().books().keepCalls(false);
         cim_.failBy(faults_);
+        printer().tell([this](const std::string& line) {
+            if (line.starts_with("> ") || line.starts_with("[")) feed_.note(line);
+        });
     }
 
     /// False when a refused command has ended it.
     bool run() {
+        feed_.simulate(simulatedArray(array(), clock()));
         printer().line("serving " + url_);
-        while (!signals_.arrived() && passTime() && takeCommands()) takeNewFile();
+        while (!signals_.arrived() && passTime() && takeCommands()) {
+            takeNewFile();
+            feed_.simulate(simulatedArray(array(), clock()));
+        }
         return !hasFailed();
     }
 
     /// Requests that a fault keeps waiting would keep the server from ending.
-    ~Serve() override { session().broker().faults().endWaits(); }
+    ~Serve() override {
+        session().broker().faults().endWaits();
+        printer().tell(nullptr);
+        pageCommands_.close();
+        feed_.stop();
+    }
 
 private:
+    static bool isSecure(const ServeOptions& options) {
+        return !options.certificate.empty() || options.selfSigned;
+    }
+
+    PageSource pageSource(const ServeOptions& options) {
+        const std::string name = std::filesystem::path(options.live.scenario).stem().string();
+        return {.ask =
+                    [this] {
+                        return Answers{ask(), "", "", 0};
+                    },
+                .about = pageAbout("simulated array " + name, options.page == "steer")};
+    }
+
+    /// Commands of pages wait for the thread that the array belongs to.
+    PageServer::CarryOut steering(const ServeOptions& options) {
+        if (options.page != "steer") return nullptr;
+        return [this](const std::string& line) { return pageCommands_.submit(line); };
+    }
+
     HttpServerOptions httpOptions(const ServeOptions& options) {
         HttpServerOptions http = options.http;
         http.welcome = [this] { return faults_.welcome(); };
@@ -94,9 +135,9 @@ private:
     std::string urlOf(const ServeOptions& options) const {
         const std::string& address = options.http.address;
         const bool isIpv6 = address.find(':') != std::string::npos;
-        const bool isSecure = !options.certificate.empty() || options.selfSigned;
-        return (isSecure ? "https://" : "http://") + (isIpv6 ? "[" + address + "]" : address) +
-               ":" + std::to_string(http_.port()) + "/cimom";
+        return (isSecure(options) ? "https://" : "http://") +
+               (isIpv6 ? "[" + address + "]" : address) + ":" + std::to_string(http_.port()) +
+               "/cimom";
     }
 
     /// "server NAME=VALUE..." and "clear server".
@@ -116,11 +157,13 @@ private:
     bool takeCommands() {
         const bool listens = std::chrono::steady_clock::now() >= inputResumes_;
         std::vector<pollfd> sources = {{listens ? input_.descriptor() : -1, POLLIN, 0},
-                                       {signals_.descriptor(), POLLIN, 0}};
+                                       {signals_.descriptor(), POLLIN, 0},
+                                       {pageCommands_.descriptor(), POLLIN, 0}};
         control_.watch(sources);
         const auto limit = pause(std::chrono::seconds(1));
         poll(sources.data(), sources.size(), static_cast<int>(limit.count()));
         if (sources[0].revents != 0) input_.receive();
+        pageCommands_.attend([this](const auto& line) { return carryOut(line); });
         return takeInput() && control_.attend([this](const auto& line) { return carryOut(line); });
     }
 
@@ -144,6 +187,9 @@ private:
     ServerFaults faults_;
     ObjectManager manager_;
     CimServer cim_;
+    CommandQueue pageCommands_;
+    PageFeed feed_;
+    PageServer page_;
     HttpServer http_;
     ControlSocket control_;
     std::string url_;
@@ -210,6 +256,11 @@ void addServeCommand(CLI::App& app, int& status) {
                         "the provider's polling interval in seconds");
     command->add_option("--control", options->control,
                         "socket on which plexor-testbed tell gives commands");
+    command
+        ->add_option("--page", options->page,
+                     "the page at /: steer, with buttons for the commands; look, without; off")
+        ->check(CLI::IsMember({"steer", "look", "off"}))
+        ->capture_default_str();
     command->add_flag("--log", options->log, "print the provider's log lines on standard error");
     command->callback([options, user, &status] {
         options->access.isUserGiven = user->count() > 0;

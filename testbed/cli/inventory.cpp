@@ -44,6 +44,17 @@ bool belongsTo(const ServedClass& served, const std::string& identity,
     return served.isDevice ? identity.starts_with(controllerId + "_") : identity == controllerId;
 }
 
+std::optional<std::size_t> ownerAmong(std::span<const std::string> controllerIds,
+                                      const ServedClass& served, const Instance& instance) {
+    const auto identity = identityOf(served, instance);
+    std::optional<std::size_t> owner;
+    for (std::size_t i = 0; identity && i < controllerIds.size(); i++) {
+        if (!belongsTo(served, *identity, controllerIds[i])) continue;
+        if (!owner || controllerIds[*owner].size() < controllerIds[i].size()) owner = i;
+    }
+    return owner;
+}
+
 Inventory collectInventory(InstanceClient& client, const std::vector<std::string>& classNames,
                            const std::string& nameSpace) {
     Inventory inventory;

@@ -34,6 +34,11 @@ std::optional<std::string> identityOf(const ServedClass& served, const Instance&
 bool belongsTo(const ServedClass& served, const std::string& identity,
                const std::string& controllerId);
 
+/// Which of the controllers, named by their ids, an instance belongs to: the one with the longest
+/// id that fits. None for a stray.
+std::optional<std::size_t> ownerAmong(std::span<const std::string> controllerIds,
+                                      const ServedClass& served, const Instance& instance);
+
 struct ClassAnswer {
     std::string className;
     Response response;

@@ -4,6 +4,18 @@
 #include "printable.h"
 
 namespace testbed {
+
+std::string propertyChanges(const Instance& before, const Instance& after) {
+    std::string text;
+    for (const auto& [name, value] : after.properties) {
+        const CimValue* old = before.find(name);
+        if (sameName(name, "Caption") || (old != nullptr && *old == value)) continue;
+        text += text.empty() ? "" : ", ";
+        text += name + " " + (old != nullptr ? old->text() : "-") + " -> " + value.text();
+    }
+    return text;
+}
+
 namespace {
 
 std::string nameOf(const Instance& instance) {
@@ -17,18 +29,6 @@ const Instance* findPath(const ClassAnswer& answer, const ObjectPath& path) {
     return nullptr;
 }
 
-/// "HealthState 5 -> 30, …"; names are shown once, so Caption is left out.
-std::string differences(const Instance& before, const Instance& after) {
-    std::string text;
-    for (const auto& [name, value] : after.properties) {
-        const CimValue* old = before.find(name);
-        if (sameName(name, "Caption") || (old != nullptr && *old == value)) continue;
-        text += text.empty() ? "" : ", ";
-        text += name + " " + (old != nullptr ? old->text() : "-") + " -> " + value.text();
-    }
-    return text;
-}
-
 void compareClass(const ClassAnswer& before, const ClassAnswer& after,
                   std::vector<std::string>& lines) {
     for (const Instance& old : before.response.instances)
@@ -37,7 +37,7 @@ void compareClass(const ClassAnswer& before, const ClassAnswer& after,
         const Instance* old = findPath(before, now.path);
         if (old == nullptr) {
             lines.push_back("+ " + nameOf(now));
-        } else if (const std::string text = differences(*old, now); !text.empty()) {
+        } else if (const std::string text = propertyChanges(*old, now); !text.empty()) {
             lines.push_back("~ " + shortName(now) + ": " + text);
         }
     }

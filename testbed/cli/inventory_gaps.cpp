@@ -4,6 +4,8 @@
 #include <map>
 #include <set>
 
+#include "volume_members.h"
+
 namespace testbed {
 namespace {
 
@@ -48,31 +50,6 @@ std::set<std::string> devicesOf(const std::string& controllerId, const ServedCla
             ids.insert(identity->substr(controllerId.size() + 1));
     }
     return ids;
-}
-
-/// The members in "…, Drives(a,b) - OPTIMAL"; without the last one where the text was cut.
-std::vector<std::string> membersIn(const std::string& name) {
-    static const std::string kBegin = ", Drives(";
-    const std::size_t begin = name.rfind(kBegin);
-    if (begin == std::string::npos) return {};
-    const std::size_t end = name.rfind(')');
-    const bool cut = end == std::string::npos || end < begin;
-    std::string list = name.substr(begin + kBegin.size());
-    list.resize(cut ? list.size() : end - begin - kBegin.size());
-    std::vector<std::string> members;
-    for (std::size_t at = 0; at <= list.size();) {
-        const std::size_t comma = std::min(list.find(',', at), list.size());
-        members.push_back(list.substr(at, comma - at));
-        at = comma + 1;
-    }
-    if (cut) members.pop_back();
-    return members;
-}
-
-/// "3e1", slot and enclosure: no drive's id tells whether it is there.
-bool isPlace(const std::string& member) {
-    const std::size_t digits = std::min(member.find_first_not_of("0123456789"), member.size());
-    return digits > 0 && digits < member.size() && member[digits] == 'e';
 }
 
 /// What a volume names that is not there; "" when all is. Ids with a comma in them are let pass.

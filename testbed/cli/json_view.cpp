@@ -64,8 +64,8 @@ ordered_json checkAsJson(const CheckSummary& check) {
 
 }  // namespace
 
-std::string jsonView(const Inventory& inventory, const CheckPolicy& policy,
-                     const CheckSummary* check) {
+ordered_json jsonDocument(const Inventory& inventory, const CheckPolicy& policy,
+                          const CheckSummary* check) {
     ordered_json document = {{"format", kFormat}};
     if (check) document["check"] = checkAsJson(*check);
     document["errors"] = errorsAsJson(inventory);
@@ -77,7 +77,17 @@ std::string jsonView(const Inventory& inventory, const CheckPolicy& policy,
                             {"properties", valuesAsJson(instance.properties)},
                             {"verdict", verdictAsJson(policy.judge(answer.className, instance))}});
     }
-    // A vendor's text need not be valid UTF-8.
+    return document;
+}
+
+// A vendor's text need not be valid UTF-8.
+std::string jsonLine(const ordered_json& document) {
+    return document.dump(-1, ' ', true, ordered_json::error_handler_t::replace);
+}
+
+std::string jsonView(const Inventory& inventory, const CheckPolicy& policy,
+                     const CheckSummary* check) {
+    const ordered_json document = jsonDocument(inventory, policy, check);
     return document.dump(2, ' ', true, ordered_json::error_handler_t::replace) + "\n";
 }
 

@@ -22,6 +22,13 @@
 
 namespace testbed {
 
+namespace {
+
+constexpr double kSlowest = 0.001;
+constexpr double kFastest = 1000000;
+
+}  // namespace
+
 void addLiveOptions(CLI::App& command, LiveOptions& options) {
     addScenarioOption(command, options.scenario);
     command.add_option("--library", options.library, "the provider's shared library")
@@ -33,7 +40,7 @@ void addLiveOptions(CLI::App& command, LiveOptions& options) {
     command
         .add_option("--speed", options.speed,
                     "how much faster than the clock the array's time goes")
-        ->check(CLI::Range(0.001, 1000000.0))
+        ->check(CLI::Range(kSlowest, kFastest))
         ->capture_default_str();
     command.add_flag("--strict", options.strict, "end with status 1 when a command is refused");
 }
@@ -53,6 +60,15 @@ int secondsOf(const CommandWord& word) {
     return seconds;
 }
 
+/// The number of "speed 5".
+double speedOf(const CommandWord& word) {
+    const nlohmann::json value = nlohmann::json::parse(word.text, nullptr, false);
+    const double speed = value.is_number() ? value.get<double>() : 0;
+    if (speed < kSlowest || speed > kFastest)
+        refuseCommand("a number from 0.001 to 1000000 is needed behind speed");
+    return speed;
+}
+
 std::string timeText(double seconds) {
     std::ostringstream text;
     text << std::fixed << std::setprecision(seconds == std::floor(seconds) ? 0 : 1) << seconds;
@@ -63,6 +79,7 @@ std::string timeText(double seconds) {
 
 void Printer::line(const std::string& text) {
     const std::lock_guard lock(mutex_);
+    if (listener_) listener_(text);
     std::cout << text << std::endl;
 }
 
@@ -79,7 +96,7 @@ std::pair<long, long> FileWatch::stamp() const {
 
 LiveSession::LiveSession(const LiveOptions& options)
     : file_(options.scenario),
-      speed_(options.speed),
+      clock_(options.speed),
       strict_(options.strict),
       session_(
           chosenManager(readScenario(options.scenario), options.manager),
@@ -104,15 +121,10 @@ Inventory LiveSession::ask() {
     return collectInventory(client, names, kServedNamespace);
 }
 
-double LiveSession::arrayTime() const {
-    using Seconds = std::chrono::duration<double>;
-    return begin_ ? Seconds(std::chrono::steady_clock::now() - *begin_).count() * speed_ : 0;
-}
-
 bool LiveSession::passTime() {
-    if (!begin_) begin_ = std::chrono::steady_clock::now();
+    clock_.begin();
     bool goesOn = true;
-    for (const LiveArray::Done& done : array_->advance(arrayTime())) {
+    for (const LiveArray::Done& done : array_->advance(clock_.now())) {
         printer_.line("[" + timeText(done.at) + "] " + done.command);
         if (!done.refusal.empty()) goesOn = print({true, false, done.refusal}) && goesOn;
     }
@@ -121,8 +133,8 @@ bool LiveSession::passTime() {
 
 std::chrono::milliseconds LiveSession::pause(std::chrono::milliseconds longest) const {
     const double due = array_->nextDue();
-    if (due < 0) return longest;
-    const double milliseconds = std::ceil((due - arrayTime()) / speed_ * 1000);
+    if (due < 0 || clock_.isPaused()) return longest;
+    const double milliseconds = std::ceil((due - clock_.now()) / clock_.speed() * 1000);
     return std::chrono::milliseconds(
         static_cast<int>(std::clamp(milliseconds, 0.0, double(longest.count()))));
 }
@@ -143,6 +155,20 @@ void LiveSession::takeNewFile() {
     }
 }
 
+/// False for a command that is not about the array's time.
+bool LiveSession::steerTime(const std::vector<CommandWord>& words) {
+    const std::string& verb = words.at(0).text;
+    const bool isSpeed = verb == "speed";
+    if (!isSpeed && verb != "pause" && verb != "play") return false;
+    if (words.size() != (isSpeed ? 2 : 1))
+        refuseCommand(verb + (isSpeed ? " takes one number" : " takes nothing"));
+    if (isSpeed)
+        clock_.setSpeed(speedOf(words[1]));
+    else
+        clock_.pause(verb == "pause");
+    return true;
+}
+
 /// The commands that change the array.
 CommandResult LiveSession::change(const std::string& line) {
     const auto words = commandWords(line);
@@ -152,7 +178,7 @@ CommandResult LiveSession::change(const std::string& line) {
         array_->save(words[1].text);
     } else if (verb == "reset") {
         array_->reset();
-    } else if (!executeOwn(line)) {
+    } else if (!steerTime(words) && !executeOwn(line)) {
         array_->apply(line);
     }
     return {};

@@ -9,7 +9,10 @@
 #include <optional>
 #include <string>
 #include <utility>
+#include <vector>
 
+#include "array_clock.h"
+#include "command_words.h"
 #include "control_socket.h"
 #include "inventory.h"
 #include "live_array.h"
@@ -45,9 +48,15 @@ void addLiveOptions(CLI::App& command, LiveOptions& options);
 class Printer {
 public:
     void line(const std::string& text);
+    /// From now on `listener` is told every line before it is printed.
+    void tell(std::function<void(const std::string&)> listener) {
+        const std::lock_guard lock(mutex_);
+        listener_ = std::move(listener);
+    }
 
 private:
     std::mutex mutex_;
+    std::function<void(const std::string&)> listener_;
 };
 
 /// Tells when a file has been written anew.
@@ -90,6 +99,8 @@ protected:
     bool hasFailed() const { return failed_; }
 
     ProviderSession& session() { return session_; }
+    const LiveArray& array() const { return *array_; }
+    const ArrayClock& clock() const { return clock_; }
     Printer& printer() { return printer_; }
 
     /// The tree as last seen.
@@ -103,16 +114,15 @@ protected:
 private:
     CommandResult change(const std::string& line);
     bool print(const CommandResult& result);
-    double arrayTime() const;
+    bool steerTime(const std::vector<CommandWord>& words);
 
     Printer printer_;
     std::optional<PollingInterval> polling_;
     FileWatch file_;
     std::unique_ptr<LiveArray> array_;
-    double speed_;
+    ArrayClock clock_;
     bool strict_;
     bool failed_ = false;
-    std::optional<std::chrono::steady_clock::time_point> begin_;  // of the array's time
     ProviderSession session_;
 };
 

@@ -8,6 +8,7 @@
 #include "command_ask.h"
 #include "command_calls.h"
 #include "command_managers.h"
+#include "command_page.h"
 #include "command_scenarios.h"
 #include "command_serve.h"
 #include "command_show.h"
@@ -57,6 +58,7 @@ int runTool(int argc, char** argv) {
     testbed::addCallsCommand(app, status);
     testbed::addAskCommand(app, status);
     testbed::addServeCommand(app, status);
+    testbed::addPageCommand(app, status);
     testbed::addManagersCommand(app, status);
     testbed::addTellCommand(app, status);
     testbed::addScenariosCommand(app, status);
@@ -66,7 +68,7 @@ int runTool(int argc, char** argv) {
     app.callback([&app] {
         if (app.get_subcommands().empty())
             throw CLI::RequiredError(
-                "a command (ask, calls, managers, scenarios, serve, show, tell or watch)");
+                "a command (ask, calls, managers, page, scenarios, serve, show, tell or watch)");
     });
     return run(app, status, argc, argv);
 }

@@ -27,9 +27,10 @@ struct Branch {
     std::vector<Branch> children;
 };
 
-struct Root {
-    std::string controllerId;
-    Branch branch;
+/// Controllers, and their ids.
+struct Roots {
+    std::vector<std::string> ids;
+    std::vector<Branch> branches;
 };
 
 /// What the lines of a tree hang on.
@@ -88,17 +89,6 @@ bool isShown(const Instance& instance, const ServedClass& served, const TreeStyl
     if (!style.problemsOnly) return true;
     const auto verdict = style.policy.judge(served.name, instance);
     return verdict && verdict->level != CheckLevel::Ok && !verdict->ignored;
-}
-
-/// The controller with the longest id that fits; NULL without one.
-Root* ownerOf(std::vector<Root>& roots, const Instance& instance, const ServedClass& served) {
-    const auto identity = identityOf(served, instance);
-    Root* owner = nullptr;
-    for (Root& root : roots) {
-        if (!identity || !belongsTo(served, *identity, root.controllerId)) continue;
-        if (!owner || owner->controllerId.size() < root.controllerId.size()) owner = &root;
-    }
-    return owner;
 }
 
 /// The branch of a class beneath a root's, made when it is first needed.
@@ -167,14 +157,15 @@ void countChildren(std::vector<Branch>& sections) {
         branch.line.text += " (" + std::to_string(branch.children.size()) + ")";
 }
 
-std::vector<Root> controllersOf(const Inventory& inventory, const TreeStyle& style) {
-    std::vector<Root> roots;
+Roots controllersOf(const Inventory& inventory, const TreeStyle& style) {
+    Roots roots;
     const ServedClass& controllers = servedClasses().front();
     for (const ClassAnswer& answer : inventory) {
         if (!sameName(answer.className, controllers.name)) continue;
-        for (const Instance& instance : answer.response.instances)
-            roots.push_back({identityOf(controllers, instance).value_or(""),
-                             {lineOf(instance, controllers, style), {}}});
+        for (const Instance& instance : answer.response.instances) {
+            roots.ids.push_back(identityOf(controllers, instance).value_or(""));
+            roots.branches.push_back({lineOf(instance, controllers, style), {}});
+        }
     }
     return roots;
 }
@@ -193,24 +184,24 @@ TreeStyle TreeStyle::ofOutput(bool colours) {
 }
 
 std::string treeView(const Inventory& inventory, const TreeStyle& style) {
-    std::vector<Root> roots = controllersOf(inventory, style);
+    Roots roots = controllersOf(inventory, style);
     std::vector<Branch> strays;
     for (const ClassAnswer& answer : inventory) {
         const ServedClass* served = findServedClass(answer.className);
         if (!served || served == &servedClasses().front()) continue;
         for (const Instance& instance : answer.response.instances) {
             if (!isShown(instance, *served, style)) continue;
-            Root* owner = ownerOf(roots, instance, *served);
-            std::vector<Branch>& parent = owner ? owner->branch.children : strays;
+            const auto owner = ownerAmong(roots.ids, *served, instance);
+            std::vector<Branch>& parent = owner ? roots.branches[*owner].children : strays;
             section(parent, served->heading)
                 .children.push_back({lineOf(instance, *served, style), {}});
         }
     }
     Printer printer(style);
-    for (Root& root : roots) {
-        if (style.problemsOnly && root.branch.children.empty()) continue;
-        countChildren(root.branch.children);
-        printer.printRoot(root.branch);
+    for (Branch& branch : roots.branches) {
+        if (style.problemsOnly && branch.children.empty()) continue;
+        countChildren(branch.children);
+        printer.printRoot(branch);
     }
     countChildren(strays);
     for (const Branch& branch : strays) printer.printRoot(branch);

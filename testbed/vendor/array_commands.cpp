@@ -21,14 +21,6 @@ constexpr Kind kKinds[] = {
     {"drive", "drives"}, {"volume", "volumes"},    {"pool", "pools"},  {"enclosure", "enclosures"},
     {"port", "ports"},   {"battery", "batteries"}, {"other", "others"}};
 
-/// A verb that gives a thing of one kind a state.
-struct StateVerb {
-    const char* verb;
-    const char* kind;
-    const char* member;
-    const char* value;
-};
-
 constexpr StateVerb kStateVerbs[] = {
     {"fail", "drive", "state", "failed"},
     {"fail", "port", "state", "failed"},
@@ -64,6 +56,9 @@ constexpr CommandHelp kHelp[] = {
     {"clear faults", "take all faults away"},
     {"server NAME=VALUE...", "for serve: let the server fail, see plexor-testbed(1)"},
     {"clear server", "for serve: let the server work again"},
+    {"pause", "let the array's time stand still"},
+    {"play", "let the array's time go on"},
+    {"speed N", "let N seconds of the array's time pass in a second"},
     {"reset", "go back to the scenario as the file has it"},
     {"save FILE", "write the present state as a scenario"},
     {"wait SECONDS", "take no command of this input meanwhile"},
@@ -232,6 +227,10 @@ const Verb& verbOf(const Words& words) {
 }
 
 }  // namespace
+
+std::span<const StateVerb> stateVerbs() {
+    return kStateVerbs;
+}
 
 std::span<const CommandHelp> commandHelp() {
     return kHelp;

@@ -15,6 +15,16 @@ struct CommandHelp {
     const char* summary;
 };
 
+/// A verb that gives a thing of one kind a state.
+struct StateVerb {
+    const char* verb;
+    const char* kind;
+    const char* member;
+    const char* value;
+};
+
+std::span<const StateVerb> stateVerbs();
+
 /// The commands of changeArray, then those that a session carries out itself.
 std::span<const CommandHelp> commandHelp();
 /// "syntax  summary" lines.

@@ -99,8 +99,9 @@ private:
     }
 
     void schedule(const std::string& subject, const std::string& state, std::uint32_t seconds) {
-        aftermath_.commands.push_back(
-            {double(seconds), "set " + subject + " state=" + json(state).dump(), subject});
+        aftermath_.commands.push_back({double(seconds),
+                                       "set " + subject + " state=" + json(state).dump(), subject,
+                                       double(seconds)});
     }
 
     void hide(const DriveDescription& hidden) {

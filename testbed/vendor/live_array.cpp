@@ -67,6 +67,7 @@ void LiveArray::begin(json document) {
         throw;
     }
     for (const auto& [fault, id] : old) broker_.faults().remove(id);
+    begun_ = scenario_;
     schedule_.clear();
     for (const TimedCommand& entry : scenario_.timeline)
         schedule_.add({now_ + entry.at, entry.command, ""});

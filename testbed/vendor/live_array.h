@@ -8,6 +8,7 @@
 
 #include "broker.h"
 #include "consequences.h"
+#include "pulled_drives.h"
 #include "scenario.h"
 #include "schedule.h"
 
@@ -45,6 +46,13 @@ public:
     std::vector<Done> advance(double now);
     /// The time of the next command that waits; negative when none does.
     double nextDue() const;
+    /// What waits, in the order of time.
+    const std::vector<ScheduledCommand>& upcoming() const { return schedule_.commands(); }
+
+    /// The scenario as its file has it.
+    const Scenario& original() const { return begun_; }
+    /// What the file has, but not the array as it is now.
+    std::vector<PulledDrive> pulled() const { return pulledDrives(original_, document_); }
 
 private:
     void adopt(nlohmann::json document);
@@ -57,6 +65,7 @@ private:
     nlohmann::json original_;  // as the file was read last
     nlohmann::json document_;
     Scenario scenario_;
+    Scenario begun_;                                     // what original_ describes
     std::vector<std::pair<nlohmann::json, int>> armed_;  // faults and their numbers in the broker
     Schedule schedule_;
     double now_ = 0;

@@ -7,11 +7,13 @@
 
 namespace testbed {
 
-/// A command at its time; `subject` is what it completes, "" for one that stands by itself.
+/// A command at its time; `subject` is what it completes, "" for one that stands by itself, and
+/// `lasts` how long that takes in all.
 struct ScheduledCommand {
     double at = 0;
     std::string command;
     std::string subject;
+    double lasts = 0;
 };
 
 /// For one thread. Times are seconds of the scenario.

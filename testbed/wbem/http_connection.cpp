@@ -1,6 +1,9 @@
 #include "http_connection.h"
 
 #include <algorithm>
+#include <boost/asio/post.hpp>
+
+#include "access.h"
 
 namespace testbed {
 namespace {
@@ -14,6 +17,8 @@ using Clock = HttpConnection::Clock;
 using Parser = http::request_parser<http::string_body>;
 
 constexpr std::size_t kReadSize = 16 * 1024;
+/// However quiet a stream is, it is asked that often.
+constexpr std::chrono::seconds kStreamPause{1};
 
 /// The status that tells a client what is wrong with what it sends; 0 for one that has gone.
 int refusalFor(const beast::error_code& error) {
@@ -101,8 +106,8 @@ public:
             const int refusal = co_await read(parser);
             HttpResponse response{refusal, {}, {}};
             keep = refusal == 0 && parser.keep_alive();
-            if (refusal == 0) response = co_await work(requestFrom(parser.release()));
-            keep = keep && !response.mishap.cutAt;
+            if (refusal == 0) response = co_await work(received(parser));
+            keep = keep && !response.mishap.cutAt && !response.stream;
             co_await respond(std::move(response), keep);
         }
         co_await drain();
@@ -171,6 +176,13 @@ private:
         co_await asio::async_write(stream_, asio::buffer(kContinue), use_awaitable);
     }
 
+    HttpRequest received(Parser& parser) {
+        HttpRequest request = requestFrom(parser.release());
+        request.isFromThisHost =
+            !isPublic(bottom().socket().remote_endpoint().address().to_string());
+        return request;
+    }
+
     /// Runs `make` on one of the workers.
     template <class Make>
     asio::awaitable<HttpOutcome> runOn(asio::thread_pool& workers, const Make& make) {
@@ -207,6 +219,7 @@ private:
         }
         enter(Phase::Writing, options_.times.response);
         auto message = headOf(response, keep);
+        if (response.stream) co_return co_await follow(std::move(message), *response.stream);
         if (!mishap.trailers.empty()) {
             co_await writeWithTrailers(std::move(message), response);
             co_return;
@@ -230,6 +243,33 @@ private:
                                        use_awaitable);
         const http::fields trailers = fieldsOf(response.mishap.trailers);
         co_await asio::async_write(stream_, http::make_chunk_last(trailers), use_awaitable);
+    }
+
+    /// Sends what the stream has until the client goes. The connection ends with it, so that the
+    /// body needs no length.
+    asio::awaitable<void> follow(http::response<http::string_body> head, HttpStream& source) {
+        const auto timer = std::make_shared<asio::steady_timer>(stream_.get_executor());
+        source.onNews([executor = stream_.get_executor(), weak = std::weak_ptr(timer)] {
+            asio::post(executor, [weak] {
+                if (const auto waiting = weak.lock()) waiting->cancel();
+            });
+        });
+        http::response<http::empty_body> message(std::move(head.base()));
+        http::response_serializer<http::empty_body> serializer(message);
+        co_await http::async_write_header(stream_, serializer, use_awaitable);
+        for (;;) {
+            enter(Phase::Streaming, options_.times.response);
+            while (const HttpStream::Text text = source.next()) {
+                co_await asio::async_write(stream_, asio::buffer(*text), use_awaitable);
+                enter(Phase::Streaming, options_.times.response);
+            }
+            bottom().expires_never();
+            beast::error_code error;
+            timer->expires_after(kStreamPause);
+            co_await timer->async_wait(asio::redirect_error(use_awaitable, error));
+            if (!bottom().socket().is_open())
+                throw beast::system_error(asio::error::operation_aborted);
+        }
     }
 
     /// Closing while the client still sends would reset the connection and lose the response.

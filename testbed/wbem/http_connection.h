@@ -32,7 +32,7 @@ class HttpConnection {
 public:
     using Clock = std::chrono::steady_clock;
     /// Before Working a connection may be given up for another one; the first ones are first.
-    enum class Phase { Draining, Reading, Writing, Working };
+    enum class Phase { Draining, Reading, Streaming, Writing, Working };
 
     HttpConnection() = default;
     virtual ~HttpConnection() = default;

@@ -272,10 +272,11 @@ TEST_F(Ask, UsageErrorsNameWhatIsWrongAndNoSecrets) {
     } cases[] = {
         {"nope",
          "there is no command nope; commands are show, watch, calls, ask, serve, "
-         "managers, tell, scenarios;"},
+         "page, managers, tell, scenarios;"},
         {"--bogus", "there is no option --bogus;"},
         {"",
-         "a command (ask, calls, managers, scenarios, serve, show, tell or watch) is required;"},
+         "a command (ask, calls, managers, page, scenarios, serve, show, tell or watch) is "
+         "required;"},
         {"http://me:secret@h", "there is no command of that name;"},
         {"ask", "a URL or --hostname is required;"},
         {"ask http://h -H h", "url excludes --hostname;"},

@@ -63,7 +63,7 @@ expected_testbed_files() {
         echo "644 usr/share/plexor-testbed/scenarios/$(basename "$file")"
     done
 }
-testbed_documents="copyright managers.md operating.md runbook.md scenarios.md security.md"
+testbed_documents="copyright managers.md page.md operating.md runbook.md scenarios.md security.md"
 
 # ROOT: mode and path of what is there; of a link, the mode of what it leads to.
 found_files() { (cd "$1" && find -L . -type f -printf '%m %P\n'); }

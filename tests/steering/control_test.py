@@ -59,6 +59,19 @@ class Control(unittest.TestCase):
         self.assertTrue(wait_until(lambda: self.check(server.url).startswith("PLEXOR OK")))
         self.assertIn('] set drive C0 32_7 state="online"', server.await_line('32_7 state="online"'))
 
+    def test_time_stands_goes_and_hurries(self):
+        server = self.start()  # rebuilding takes a minute
+        self.assertTrue(wait_until(lambda: self.check(server.url).startswith("PLEXOR OK")))
+        self.assertEqual(self.tell("pause", "fail drive C0 32_1", "speed 100000")[0], 0)
+        self.assertTrue(wait_until(lambda: "1 drive rebuilding" in self.check(server.url)))
+        self.assertIn("1 drive rebuilding", self.check(server.url), "time stands")
+        self.assertEqual(self.tell("play")[0], 0)
+        self.assertIn('] set drive C0 32_7 state="online"', server.await_line("32_7 state="))
+        for wrong, why in (("speed", "speed takes one number"), ("pause 5", "pause takes nothing"),
+                           ("speed 0", "a number from 0.001 to 1000000 is needed behind speed"),
+                           ("speed fast", "a number from 0.001 to 1000000 is needed behind speed")):
+            self.assertEqual(self.tell(wrong)[::2], (1, f"plexor-testbed: command: {why}\n"))
+
     def test_saved_state_is_a_scenario(self):
         self.start("--speed", "0.001")
         file = os.path.join(self.directory, "saved.json")

@@ -80,9 +80,10 @@ class Session:
                 stream.close()
 
 
-def serve(*arguments, scenario="healthy-array", **options):
-    """A server on a free port, when it serves."""
+def serve(*arguments, scenario="healthy-array", port="0", **options):
+    """A server, on a free port unless it is said, when it serves."""
     session = Session("serve", "--scenario", scenario_file(scenario) if "/" not in scenario
-                      else scenario, "--port", "0", *arguments, **options)
-    session.url = session.await_line("serving ").split(" ")[1]
+                      else scenario, "--port", port, *arguments, **options)
+    # A line of the log, from another stream, may stand before it.
+    session.url = session.await_line("serving http").rpartition("serving ")[2]
     return session
