@@ -64,7 +64,10 @@ void Leave(CallsInFlight& calls, unsigned int generation) {
 class WaitingCleanup {
 public:
     WaitingCleanup() { __CleanupsWaiting++; }
-    ~WaitingCleanup() { Announce(); }
+    ~WaitingCleanup() {
+        __CleanupsWaiting--;
+        Announce();
+    }
     WaitingCleanup(const WaitingCleanup&) = delete;
     WaitingCleanup& operator=(const WaitingCleanup&) = delete;
 };
