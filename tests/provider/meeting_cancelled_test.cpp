@@ -1,6 +1,6 @@
 // Threads that the manager cancels while they are inside the provider.
 #include <pthread.h>
-#include <unistd.h>
+#include <sched.h>
 
 #include "meeting_fixture.h"
 
@@ -60,7 +60,9 @@ TEST_F(CancelledTest, ABusyWorkerIsCountedNoLonger) {
     item->Func = [](CMPIContext*, void* args) {
         free(args);
         busy = pthread_self();
-        for (;;) pause();
+        // Not in a call that a thread sanitizer watches: it takes no notice of locks after leaving
+        // one in this way.
+        for (;; sched_yield()) pthread_testcancel();
     };
     PutItem(&__FIFO, item);
     pthread_cond_signal(&PlexorThreadCond);
