@@ -10,6 +10,7 @@
 namespace {
 
 constexpr time_t kTurnLimitSeconds = 30;  // what a factory call waits for its turn
+constexpr time_t kNewcomerSeconds = 1;    // what a request that finds nothing gets to leave
 
 pthread_mutex_t __TurnMutex = PTHREAD_MUTEX_INITIALIZER;
 pthread_cond_t __TurnChanged = PTHREAD_COND_INITIALIZER;  // with __TurnMutex
@@ -205,6 +206,9 @@ bool CleanupTurn::AwaitRequests() {
     return Await(__LeaveBy, OldRequestsAreGone);
 }
 
-bool CleanupTurn::HasNewcomers() const {
-    return __Requests.HasOpen() || __FactoryCalls.HasOpen();
+bool CleanupTurn::AwaitNewcomers() {
+    MutexGuard lock(__TurnMutex);
+    __Requests.Close(false);
+    const Deadline deadline = Deadline::In(kNewcomerSeconds);
+    return Await(deadline, OldRequestsAreGone) && !__FactoryCalls.HasOpen();
 }

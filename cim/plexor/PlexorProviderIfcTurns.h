@@ -77,8 +77,9 @@ public:
     bool AwaitFactoryCalls();
     /// Waits until no request from before is in flight. False at the limit.
     bool AwaitRequests();
-    /// Whether requests or factory calls that came after it are inside the library.
-    bool HasNewcomers() const;
+    /// Waits, a second at most, for the requests that came after it. False when one of them, or a
+    /// factory call, which waits for this turn to end, stays inside the library.
+    bool AwaitNewcomers();
 
 private:
     enum class Outcome { kTaken, kRefused, kDoneByAnother };

@@ -63,7 +63,7 @@ void Unload(CleanupTurn& turn) {
     }
     CleanupPlexorThreads();
     __atomic_store_n(&_ProviderInitialized, 0, __ATOMIC_RELAXED);
-    if (turn.HasNewcomers()) KeepLibraryMapped();
+    if (!turn.AwaitNewcomers()) KeepLibraryMapped();
 }
 
 /// The cleanup's return code.

@@ -73,7 +73,7 @@ bool isObjectEntry(Entry entry) {
 const char* kindName(ObjectKind kind) {
     static constexpr const char* names[] = {"context",     "result",   "string", "array",
                                             "enumeration", "instance", "path"};
-    return entryNames[static_cast<std::size_t>(kind)];
+    return names[static_cast<std::size_t>(kind)];
 }
 
 void Books::recordObjectCalls(bool on) {

@@ -46,7 +46,11 @@ public:
     /// Discovery and first inventory, without the provider's own threads.
     bool start() {
         testbed::Broker::CallScope scope(broker_);
-        FakeHost::whileSleeping = [this] { runQueue(); };
+        // The walks' waits take no time: the model has all controllers stamped in one moment.
+        FakeHost::whileSleeping = [this, begin = FakeHost::now] {
+            FakeHost::now = begin;
+            runQueue();
+        };
         Array_t profiles = {};
         if (InitSystemInfo(&mi_, scope.context()) != 0) return false;
         if (GetHHRCProfiles(&mi_, scope.context(), &profiles) != 1) return false;
@@ -54,6 +58,7 @@ public:
         InitCompleteTime = FakeHost::now;
         BuildDeviceInfoAsync(&mi_, scope.context());
         runQueue();
+        FakeHost::whileSleeping = [this] { runQueue(); };
         model_.buildInventory(FakeHost::now);
         FakeHost::takeChangeLines();
         FakeHost::now += 3;

@@ -2,6 +2,7 @@
 #include "live_array.h"
 
 #include <gtest/gtest.h>
+#include <unistd.h>
 
 #include <filesystem>
 #include <fstream>
@@ -36,7 +37,7 @@ protected:
     void TearDown() override { std::filesystem::remove(file_); }
 
     void open(const std::string& text) {
-        file_ = ::testing::TempDir() + "plexor-live-array.json";
+        file_ = ::testing::TempDir() + "plexor-live-array-" + std::to_string(getpid()) + ".json";
         write(text);
         array_.reset();
         broker_.reset();
