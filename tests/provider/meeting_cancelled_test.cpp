@@ -13,6 +13,12 @@ using testbed::Entry;
 
 class CancelledTest : public plexortest::MeetingTest {
 protected:
+#if defined(__SANITIZE_ADDRESS__)
+    void SetUp() override {
+        MeetingTest::SetUp();
+        GTEST_SKIP() << "this sanitizer does not follow a thread out of the frames that it leaves";
+    }
+#endif
     template <typename Call>
     static pthread_t start(Call& call) {
         pthread_t thread = 0;
@@ -37,7 +43,9 @@ protected:
         return ActiveThreads;
     }
     /// Ends the worker as a manager does; the provider joins it.
-    void cancelWorker(int index) { EXPECT_EQ(pthread_cancel(PlexorThreads[index]), 0); }
+    void cancelWorker(int index) {
+        EXPECT_EQ(pthread_cancel(PlexorThreads[index]), 0);
+    }
 };
 
 TEST_F(CancelledTest, AnIdleWorkerLeavesTheOtherAtWork) {
