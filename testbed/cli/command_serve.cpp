@@ -221,6 +221,20 @@ bool serve(const ServeOptions& options) {
     return succeeded;
 }
 
+/// Where the server's certificate comes from.
+void addTlsOptions(CLI::App& command, ServeOptions& options) {
+    CLI::Option* certificate = command.add_option(
+        "--cert", options.certificate, "serve HTTPS with the certificate in this PEM file");
+    CLI::Option* key =
+        command.add_option("--key", options.key, "PEM file with the certificate's key");
+    certificate->needs(key);
+    key->needs(certificate);
+    command
+        .add_flag("--tls-self-signed", options.selfSigned,
+                  "serve HTTPS with a certificate that is made now and thrown away at the end")
+        ->excludes(certificate);
+}
+
 }  // namespace
 
 void addServeCommand(CLI::App& app, int& status) {
@@ -242,16 +256,7 @@ void addServeCommand(CLI::App& app, int& status) {
     file->needs(user);
     command->add_flag("--insecure-public", options->access.insecurePublic,
                       "let everybody ask on an address that other hosts reach");
-    CLI::Option* certificate = command->add_option(
-        "--cert", options->certificate, "serve HTTPS with the certificate in this PEM file");
-    CLI::Option* key =
-        command->add_option("--key", options->key, "PEM file with the certificate's key");
-    certificate->needs(key);
-    key->needs(certificate);
-    command
-        ->add_flag("--tls-self-signed", options->selfSigned,
-                   "serve HTTPS with a certificate that is made now and thrown away at the end")
-        ->excludes(certificate);
+    addTlsOptions(*command, *options);
     command->add_option("--interval", options->live.intervalSeconds,
                         "the provider's polling interval in seconds");
     command->add_option("--control", options->control,
