@@ -180,18 +180,16 @@ private:
     bool matchesEnd(const Association& association, const AssociationEnd& near,
                     const AssociationEnd& far, const AssociationFilter& filter) const;
 
-    /// Enters the association at that position in ends_. The caller holds mutex_, exclusive.
-    void indexAssociation(std::size_t position);
-
     /// Reorders a walk's result when asked to. Takes mutex_.
     void shuffle(std::vector<Instance>& instances) const;
 
     mutable std::shared_mutex mutex_;
-    std::map<std::string, Space> spaces_;       // guarded by mutex_
-    std::vector<Instance> instances_;           // guarded by mutex_
-    std::map<std::string, std::size_t> index_;  // identity -> position; guarded by mutex_
-    std::vector<Association> associations_;     // guarded by mutex_
-    /// Identity of an object -> positions of the associations that it takes part in, in order;
+    std::map<std::string, Space> spaces_;              // guarded by mutex_
+    std::vector<Instance> instances_;                  // guarded by mutex_
+    std::map<std::string, std::size_t> index_;         // identity -> position; guarded by mutex_
+    std::map<std::size_t, Association> associations_;  // by number; guarded by mutex_
+    std::size_t nextAssociation_ = 0;                  // guarded by mutex_
+    /// Identity of an object -> numbers of the associations that it takes part in, in order;
     /// guarded by mutex_.
     std::unordered_map<std::string, std::vector<std::size_t>> ends_;
     mutable std::optional<std::mt19937> shuffle_;  // guarded by mutex_ (exclusive)

@@ -19,15 +19,11 @@ void Repository::associate(std::string_view assocClass, AssociationEnd left, Ass
     association.leftIdentity = association.left.object.identity();
     association.rightIdentity = association.right.object.identity();
     const std::unique_lock lock(mutex_);
-    associations_.push_back(std::move(association));
-    indexAssociation(associations_.size() - 1);
-}
-
-void Repository::indexAssociation(std::size_t position) {
-    const Association& association = associations_[position];
-    ends_[association.leftIdentity].push_back(position);
+    const std::size_t number = nextAssociation_++;
+    ends_[association.leftIdentity].push_back(number);
     if (association.rightIdentity != association.leftIdentity)
-        ends_[association.rightIdentity].push_back(position);
+        ends_[association.rightIdentity].push_back(number);
+    associations_.emplace(number, std::move(association));
 }
 
 std::size_t Repository::dissociate(std::string_view assocClass, const ObjectPath& left,
@@ -35,17 +31,22 @@ std::size_t Repository::dissociate(std::string_view assocClass, const ObjectPath
     const std::string first = left.identity();
     const std::string second = right.identity();
     const std::unique_lock lock(mutex_);
-    const std::size_t removed = std::erase_if(associations_, [&](const Association& association) {
-        const bool joins =
+    const auto joins = [&](const Association& association) {
+        const bool areEnds =
             (association.leftIdentity == first && association.rightIdentity == second) ||
             (association.leftIdentity == second && association.rightIdentity == first);
-        return joins && (sameName(association.assocClass, assocClass) ||
-                         associationIsA(association, std::string(assocClass)));
-    });
-    if (removed == 0) return 0;
-    ends_.clear();
-    for (std::size_t position = 0; position < associations_.size(); position++)
-        indexAssociation(position);
+        return areEnds && (sameName(association.assocClass, assocClass) ||
+                           associationIsA(association, std::string(assocClass)));
+    };
+    const std::vector<std::size_t> candidates = ends_[first];
+    std::size_t removed = 0;
+    for (const std::size_t number : candidates) {
+        if (!joins(associations_.at(number))) continue;
+        std::erase(ends_[first], number);
+        std::erase(ends_[second], number);
+        associations_.erase(number);
+        removed++;
+    }
     return removed;
 }
 
@@ -74,10 +75,10 @@ void Repository::walkLocked(const ObjectPath& source, const AssociationFilter& f
         if (!matchesEnd(association, near, far, filter)) return;
         visit(association, farIdentity, instanceLocked(farIdentity));
     };
-    const auto positions = ends_.find(origin);
-    if (positions == ends_.end()) return;
-    for (const std::size_t position : positions->second) {
-        const Association& association = associations_[position];
+    const auto numbers = ends_.find(origin);
+    if (numbers == ends_.end()) return;
+    for (const std::size_t number : numbers->second) {
+        const Association& association = associations_.at(number);
         if (association.leftIdentity == origin) {
             tryEnd(association, association.left, association.right, association.rightIdentity);
         }
@@ -147,7 +148,7 @@ std::vector<Instance> Repository::associationInstances(std::string_view nameSpac
                                                        std::string_view className) const {
     const std::shared_lock lock(mutex_);
     std::vector<Instance> found;
-    for (const Association& association : associations_) {
+    for (const auto& [number, association] : associations_) {
         const bool isHere = sameName(association.left.object.nameSpace, nameSpace) ||
                             sameName(association.right.object.nameSpace, nameSpace);
         if (!isHere || !isALocked(nameSpace, association.assocClass, className)) continue;
