@@ -27,11 +27,10 @@ CMPIInstanceMIFT instMIFT__ = {100,
 
 namespace {
 
-/// After the end of the life the mark is the cleanup's, or a later life's. False then.
-bool MarkInitialized(int value) {
+/// After the end of the life the mark is the cleanup's, or a later life's.
+void MarkInitialized(int value) {
     const LifeGuard life;
     if (life.Stands()) __atomic_store_n(&_ProviderInitialized, value, __ATOMIC_RELAXED);
-    return life.Stands();
 }
 
 /// Factory calls on several threads may be here at once.

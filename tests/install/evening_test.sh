@@ -9,17 +9,10 @@ source "$(dirname "$0")/common.sh"
 source "$(dirname "$0")/root.sh"
 
 source=$1 build=$2 version=$3
-require_long_form "$source"
-scratch=$(mktemp -d)
-root=$scratch/root
+begin_root_test "$source"
 server=""
 stop_server() { [ -z "$server" ] || { kill "$server" && wait "$server"; } 2>/dev/null || true; }
-leave() {
-    stop_server
-    umount "$root/proc" 2>/dev/null || true
-    rm -rf --one-file-system "$scratch"
-}
-trap leave EXIT
+before_leaving() { stop_server; }
 architecture=$(dpkg --print-architecture)
 said="" status=0 port=47588
 

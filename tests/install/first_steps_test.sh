@@ -9,14 +9,7 @@ source "$(dirname "$0")/common.sh"
 source "$(dirname "$0")/root.sh"
 
 source=$1 build=$2
-require_long_form "$source"
-scratch=$(mktemp -d)
-root=$scratch/root
-leave() {
-    umount "$root/proc" 2>/dev/null || true
-    rm -rf --one-file-system "$scratch"
-}
-trap leave EXIT
+begin_root_test "$source"
 megabytes() { du -smx "$root" | cut -f1; }
 
 make_root "$build" "$root"

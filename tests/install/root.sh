@@ -18,6 +18,20 @@ require_long_form() {
     fi
 }
 
+# SOURCE: begins such a test, with $scratch and $root, which go at its end; before that before_leaving
+# is called, where the test has one.
+begin_root_test() {
+    require_long_form "$1"
+    scratch=$(mktemp -d)
+    root=$scratch/root
+    trap leave_root_test EXIT
+}
+leave_root_test() {
+    if declare -F before_leaving >/dev/null; then before_leaving; fi
+    umount "$root/proc" 2>/dev/null || true
+    rm -rf --one-file-system "$scratch"
+}
+
 # The Debian sources that this system's apt uses, wherever they are.
 mirror_sources() {
     # shellcheck disable=SC2016

@@ -22,12 +22,8 @@ TEST_F(MeetingCallsTest, TheReleaseWaitsForARequest) {
     load();
     Gate gate;
     const GateOpener opener(gate);
-    faults().add(waitingAt(Entry::NewInstance, gate));
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
-    auto cleanup = cleanUpElsewhere(true);
-    ASSERT_TRUE(cleanupsInside(1));
-    EXPECT_TRUE(stillWaits(cleanup));
+    auto request = requestHeldAt(Entry::NewInstance, gate);
+    auto cleanup = cleanupThatWaits(true);
     EXPECT_EQ(CapturedSyslog::countContaining(" deleted\n"), 0u);
     gate.open();
     EXPECT_EQ(request.get(), 1u) << "complete";
@@ -48,9 +44,7 @@ TEST_F(MeetingCallsTest, ARequestThatBeginsDuringACleanupFindsNothing) {
 TEST_F(MeetingCallsTest, AHangingRequestKeepsWhatItUses) {
     load();
     Gate gate;
-    faults().add(waitingAt(Entry::NewInstance, gate));
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto request = requestHeldAt(Entry::NewInstance, gate);
     const RaidController_t* const used = firstController();
     plexortest::VirtualClock::advance(1000);
     const plexortest::GivenUpInventory givenUp;
@@ -72,9 +66,7 @@ TEST_F(MeetingCallsTest, AHangingRequestKeepsWhatItUses) {
 TEST_F(MeetingCallsTest, TerminatingItWaitsThreeSeconds) {
     load();
     Gate gate;
-    faults().add(waitingAt(Entry::NewInstance, gate));
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto request = requestHeldAt(Entry::NewInstance, gate);
     const plexortest::GivenUpInventory givenUp;
     {
         const HurriedWaits hurry;
@@ -96,9 +88,7 @@ TEST_F(MeetingCallsTest, ACleanupEndsTheInitialisationAfterItsVendorCall) {
     faults().add(slow);
     auto factory = callFactoryElsewhere();
     ASSERT_TRUE(gate.awaitArrivals(1));
-    auto cleanup = cleanUpElsewhere(true);
-    ASSERT_TRUE(cleanupsInside(1));
-    EXPECT_TRUE(stillWaits(cleanup));
+    auto cleanup = cleanupThatWaits(true);
     gate.open();
     EXPECT_NE(factory.get(), nullptr);
     EXPECT_EQ(cleanup.get(), CMPI_RC_OK);

@@ -86,12 +86,8 @@ TEST_F(CancelledTest, ACleanupThatWaitsForAnotherOneIsForgotten) {
     load();
     Gate gate;
     const GateOpener opener(gate);
-    faults().add(waitingAt(Entry::NewInstance, gate));
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
-    auto cleanup = cleanUpElsewhere(true);
-    ASSERT_TRUE(cleanupsInside(1));
-    EXPECT_TRUE(stillWaits(cleanup));
+    auto request = requestHeldAt(Entry::NewInstance, gate);
+    auto cleanup = cleanupThatWaits(true);
     auto second = [this] { PlexorProviderCleanup(&mi, nullptr, 1); };
     const pthread_t waiting = start(second);
     ASSERT_TRUE(cleanupsInside(2));

@@ -47,6 +47,21 @@ protected:
             return PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr);
         });
     }
+    /// A request for the drives that has come as far as its first call of `entry`, and waits there.
+    std::future<std::size_t> requestHeldAt(testbed::Entry entry, Gate& gate) {
+        faults().add(waitingAt(entry, gate));
+        auto request = requestDrives();
+        EXPECT_TRUE(gate.awaitArrivals(1));
+        return request;
+    }
+    /// A cleanup that has begun and waits for somebody.
+    std::future<CMPIrc> cleanupThatWaits(bool terminating) {
+        const std::size_t before = CapturedSyslog::count("PlexorProviderCleanup: ENTER...\n");
+        auto cleanup = cleanUpElsewhere(terminating);
+        EXPECT_TRUE(cleanupsInside(before + 1));
+        EXPECT_TRUE(stillWaits(cleanup));
+        return cleanup;
+    }
     static bool cleanupsInside(std::size_t count) {
         return soon([count] {
             return CapturedSyslog::count("PlexorProviderCleanup: ENTER...\n") == count;

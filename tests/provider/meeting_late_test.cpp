@@ -72,9 +72,7 @@ TEST_F(LateCallsTest, AnInitialisationThatHangsBeforeItsWorkersLeavesTheNextLife
 
 TEST_F(LateCallsTest, ACleanupOvertakesAFactoryCallThatWaitsForARequest) {
     Gate gate;
-    faults().add(waitingAt(Entry::ResultReturnDone, gate));
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto request = requestHeldAt(Entry::ResultReturnDone, gate);
     auto overtaken = callFactoryElsewhere();
     ASSERT_TRUE(
         plexortest::soon([] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 1; }));
@@ -95,9 +93,7 @@ TEST_F(LateCallsTest, ACleanupOvertakesAFactoryCallThatWaitsForARequest) {
 TEST_F(LateCallsTest, AHangingRequestCostsItsOwnLifeOnly) {
     load();
     Gate gate;
-    faults().add(waitingAt(Entry::NewInstance, gate));
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto request = requestHeldAt(Entry::NewInstance, gate);
     const GivenUpInventory givenUp;
     cleanUpSoon();
     ASSERT_EQ(givenUpLines(), 1u);
@@ -120,10 +116,8 @@ TEST_F(LateCallsTest, AHangingRequestCostsItsOwnLifeOnly) {
 TEST_F(LateCallsTest, ARequestThatWasGivenUpQueuesNothingForTheNextLife) {
     load();
     Gate gate;
-    faults().add(waitingAt(Entry::NewInstance, gate));
     VirtualClock::advance(1000);
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto request = requestHeldAt(Entry::NewInstance, gate);
     const GivenUpInventory givenUp;
     cleanUpSoon();
     callFactory();
@@ -139,16 +133,10 @@ TEST_F(LateCallsTest, ARequestThatWasGivenUpQueuesNothingForTheNextLife) {
 TEST_F(LateCallsTest, ACleanupDoesNotWaitForRequestsThatComeAfterIt) {
     load();
     Gate before, after;
-    faults().add(waitingAt(Entry::NewInstance, before));
-    auto first = requestDrives();
-    ASSERT_TRUE(before.awaitArrivals(1));
-    auto cleanup = cleanUpElsewhere(true);
-    ASSERT_TRUE(cleanupsInside(1));
-    EXPECT_TRUE(stillWaits(cleanup));
-    faults().add(waitingAt(Entry::ResultReturnDone, after));
+    auto first = requestHeldAt(Entry::NewInstance, before);
+    auto cleanup = cleanupThatWaits(true);
     const GateOpener opener(after);
-    auto second = requestDrives();
-    ASSERT_TRUE(after.awaitArrivals(1));
+    auto second = requestHeldAt(Entry::ResultReturnDone, after);
     const int pinsBefore = pins;
     before.open();
     EXPECT_EQ(first.get(), 1u);
@@ -169,13 +157,9 @@ TEST_F(LateCallsTest, AQuietCleanupLetsTheLibraryGo) {
 TEST_F(LateCallsTest, ATerminatingCleanupHurriesTheOneThatIsUnderWay) {
     load();
     Gate gate;
-    faults().add(waitingAt(Entry::NewInstance, gate));
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto request = requestHeldAt(Entry::NewInstance, gate);
     VirtualClock::advance(1000);
-    auto idle = cleanUpElsewhere(false);
-    ASSERT_TRUE(cleanupsInside(1));
-    EXPECT_TRUE(stillWaits(idle));
+    auto idle = cleanupThatWaits(false);
     const GivenUpInventory givenUp;
     {
         const HurriedWaits hurry;
@@ -199,9 +183,7 @@ TEST_F(LateCallsTest, ATerminatingCleanupHurriesOneThatWaitsForAWorker) {
     requestDrives().get();
     ASSERT_TRUE(gate.awaitArrivals(1));
     VirtualClock::advance(1000);
-    auto idle = cleanUpElsewhere(false);
-    ASSERT_TRUE(cleanupsInside(1));
-    EXPECT_TRUE(stillWaits(idle));
+    auto idle = cleanupThatWaits(false);
     const GivenUpInventory givenUp;
     const auto begin = std::chrono::steady_clock::now();
     cleanUpSoon();
@@ -217,12 +199,8 @@ TEST_F(LateCallsTest, AnIdleCleanupJoinsATerminatingOne) {
     load();
     Gate gate;
     const GateOpener opener(gate);
-    faults().add(waitingAt(Entry::NewInstance, gate));
-    auto request = requestDrives();
-    ASSERT_TRUE(gate.awaitArrivals(1));
-    auto terminating = cleanUpElsewhere(true);
-    ASSERT_TRUE(cleanupsInside(1));
-    EXPECT_TRUE(stillWaits(terminating));
+    auto request = requestHeldAt(Entry::NewInstance, gate);
+    auto terminating = cleanupThatWaits(true);
     auto idle = cleanUpElsewhere(false);
     ASSERT_TRUE(cleanupsInside(2));
     EXPECT_TRUE(stillWaits(idle)) << "it was not refused";
