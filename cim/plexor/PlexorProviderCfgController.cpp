@@ -2,6 +2,7 @@
 #include <stdlib.h>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
 namespace {
@@ -27,18 +28,10 @@ char** VersionField(RaidController_t* ctrl, CMPIUint16 classification) {
 
 void InitLocksAndLists(RaidController_t* ctrl) {
     pthread_mutex_init(&ctrl->CtrlMutex, nullptr);
-    pthread_mutex_init(&ctrl->DiskCfgMutex, nullptr);
-    pthread_mutex_init(&ctrl->VolumeCfgMutex, nullptr);
-    pthread_mutex_init(&ctrl->PortCfgMutex, nullptr);
-    pthread_mutex_init(&ctrl->BatteryCfgMutex, nullptr);
-    pthread_mutex_init(&ctrl->PoolCfgMutex, nullptr);
-    pthread_mutex_init(&ctrl->ChassisCfgMutex, nullptr);
-    ctrl->VolumeList = &ctrl->__VolumeList;
-    ctrl->DiskList = &ctrl->__DiskList;
-    ctrl->PoolList = &ctrl->__PoolList;
-    ctrl->BatteryList = &ctrl->__BatteryList;
-    ctrl->ChassisList = &ctrl->__ChassisList;
-    ctrl->PortList = &ctrl->__PortList;
+    for (const DeviceKind* kind : kDeviceKinds) {
+        pthread_mutex_init(&(ctrl->*kind->classMutex), nullptr);
+        ctrl->*kind->list = &(ctrl->*kind->embeddedList);
+    }
 }
 
 /// The port controller itself. False without DeviceID.

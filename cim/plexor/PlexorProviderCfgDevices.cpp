@@ -5,60 +5,42 @@
 
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderCfgClassLock.h"
+#include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
 namespace {
 
 constexpr const char kCaller[] = "BuildLogicalDeviceInfo";
 
-/// Device class codes, as they travel in Arg5 of a work item.
-enum DeviceCode : int { DEVICE_UNKNOWN = 99 };
-
-/// One kind of logical device; its code is its place in kDeviceKinds, counted from 1.
-struct DeviceKind {
-    const char* className;
-    BuildFunc_t build;
-    pthread_mutex_t RaidController_t::*classMutex;
-};
-
-// The order decides for a class that is several of these.
-constexpr DeviceKind kDeviceKinds[] = {
-    {"CIM_StorageVolume", BuildVolumeInfo, &RaidController_t::VolumeCfgMutex},
-    {"CIM_SASSATAPort", BuildPortInfo, &RaidController_t::PortCfgMutex},
-    {"CIM_DiskDrive", BuildDiskInfo, &RaidController_t::DiskCfgMutex},
-    {"CIM_Battery", BuildBatteryInfo, &RaidController_t::BatteryCfgMutex},
-};
-constexpr int kDeviceKindCount = sizeof kDeviceKinds / sizeof kDeviceKinds[0];
+constexpr int kUnknownCode = 99;  // the device code of a class that is none of ours
 
 /// Spares broker calls: what has been learnt about class names during one walk. The names are the
 /// broker's texts and live as long as the walk's results.
 struct ClassCache {
     const char* previousName = nullptr;
-    int previousCode = DEVICE_UNKNOWN;
-    const char* slots[kDeviceKindCount] = {};
+    int previousCode = kUnknownCode;
+    const char* slots[kDeviceCodes] = {};  ///< by device code, from 1 on
 };
 
 int AskBroker(const CMPIObjectPath* op) {
     const CMPIBroker* broker = CurrentBroker();
-    for (int kind = 0; kind < kDeviceKindCount; kind++) {
-        if (broker->eft->classPathIsA(broker, op, kDeviceKinds[kind].className, nullptr)) {
-            return kind + 1;
-        }
+    for (int code = 1; code <= kDeviceCodes; code++) {
+        const char* className = FindKindByCode(code)->action.AssociatedClassName;
+        if (broker->eft->classPathIsA(broker, op, className, nullptr)) return code;
     }
-    return DEVICE_UNKNOWN;
+    return kUnknownCode;
 }
 
 int Classify(ClassCache& cache, const CMPIObjectPath* op, const char* className) {
     if (cache.previousName != nullptr && strcmp(cache.previousName, className) == 0) {
         return cache.previousCode;
     }
-    for (int kind = 0; kind < kDeviceKindCount; kind++) {
-        if (cache.slots[kind] != nullptr && strcmp(cache.slots[kind], className) == 0) {
-            return kind + 1;
-        }
+    for (int code = 1; code <= kDeviceCodes; code++) {
+        const char* known = cache.slots[code - 1];
+        if (known != nullptr && strcmp(known, className) == 0) return code;
     }
     const int code = AskBroker(op);
-    if (code != DEVICE_UNKNOWN) cache.slots[code - 1] = className;
+    if (code != kUnknownCode) cache.slots[code - 1] = className;
     cache.previousName = className;
     cache.previousCode = code;
     return code;
@@ -104,7 +86,7 @@ void QueueDevice(const CMPIInstanceMI* mi, const CMPIContext* ctx, RaidControlle
     if (className == nullptr) return;
     const int code = Classify(cache, op, className);
     syslog(LOG_DEBUG, "%s: (%d)%s\n", kCaller, code, PathText(LOG_DEBUG, op));
-    if (code == DEVICE_UNKNOWN) return;
+    if (code == kUnknownCode) return;
     Thread_Args_t* item = MakeItem(mi, ctrl, op, inst, code);
     if (item != nullptr) Enqueue(ctx, item, op);
 }
@@ -160,10 +142,10 @@ void ProcessBuildLogicalDeviceInfo(CMPIContext* ctx, void* args) {
     const int code = static_cast<int>(item->Arg5);
     free(item);
 
-    if (code >= 1 && code <= kDeviceKindCount) {
-        const DeviceKind& kind = kDeviceKinds[code - 1];
-        ClassLock lock(ctrl, ctrl->*kind.classMutex, kind.className);
-        if (lock.Locked()) kind.build(mi, ctx, ctrl, inst, op);
+    const DeviceKind* kind = FindKindByCode(code);
+    if (kind != nullptr) {
+        ClassLock lock(ctrl, ctrl->*kind->classMutex, kind->action.AssociatedClassName);
+        if (lock.Locked()) kind->action.BuildFunc(mi, ctx, ctrl, inst, op);
         lock.Unlock();
     } else {
         syslog(LOG_ERR, "%s: invalid type %d\n", __func__, code);

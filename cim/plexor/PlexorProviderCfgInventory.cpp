@@ -5,6 +5,7 @@
 #include <atomic>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
 unsigned int ThreadActivityDone = 0;
@@ -16,12 +17,7 @@ std::atomic<unsigned int> __DoneLife = 0;  // whose inventory set ThreadActivity
 /// One moment for all classes, so that all become due together.
 void StampAll(RaidController_t* ctrl) {
     const time_t now = time(nullptr);
-    StoreTime(ctrl->BatteryUpdateTime, now);
-    StoreTime(ctrl->PortUpdateTime, now);
-    StoreTime(ctrl->DiskUpdateTime, now);
-    StoreTime(ctrl->VolumeUpdateTime, now);
-    StoreTime(ctrl->PoolUpdateTime, now);
-    StoreTime(ctrl->ChassisUpdateTime, now);
+    for (const DeviceKind* kind : kDeviceKinds) StoreTime(ctrl->*kind->updateTime, now);
     StoreTime(ctrl->ControllerUpdateTime, now);
 }
 

@@ -3,32 +3,25 @@
 
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderCfgClassLock.h"
+#include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
 namespace {
 
-/// What differs between the walk over the pools and the walk over the chassis.
-struct Walk {
-    const char* caller;
-    const char* assocClass;
-    const char* resultClass;
-    pthread_mutex_t RaidController_t::*classMutex;
-    BuildFunc_t build;
-};
-
-/// Builds every device of the walk, up to the first that fails. Its code, or 0.
-int BuildAll(const Walk& walk, const CMPIInstanceMI* mi, const CMPIContext* ctx,
-             RaidController_t* ctrl) {
-    CMPIEnumeration* found =
-        QueryAssociators({walk.caller, ctx, ctrl->ControllerOp, walk.assocClass, walk.resultClass});
+/// Builds every device of a kind, up to the first that fails. Its code, or 0.
+int BuildAll(const char* caller, const DeviceKind& kind, const CMPIInstanceMI* mi,
+             const CMPIContext* ctx, RaidController_t* ctrl) {
+    const ConfigAction_t& action = kind.action;
+    CMPIEnumeration* found = QueryAssociators(
+        {caller, ctx, ctrl->ControllerOp, action.AssociationClassName, action.AssociatedClassName});
     if (found == nullptr) return RESULT_OK;
 
-    ClassLock lock(ctrl, ctrl->*walk.classMutex, walk.resultClass);
+    ClassLock lock(ctrl, ctrl->*kind.classMutex, action.AssociatedClassName);
     int rc = RESULT_OK;
     while (rc == RESULT_OK && !StopRequested()) {
         const CMPIInstance* inst = NextInstance(found);
         if (inst == nullptr) break;
-        rc = walk.build(mi, ctx, ctrl, inst, InstancePath(inst));
+        rc = action.BuildFunc(mi, ctx, ctrl, inst, InstancePath(inst));
     }
     lock.Unlock();
     return rc;
@@ -121,19 +114,15 @@ int BuildChassis(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObj
 }  // namespace
 
 int BuildPoolInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx, RaidController_t* ctrl) {
-    constexpr Walk kWalk = {"BuildPoolInfo", "CIM_HostedStoragePool", "CIM_StoragePool",
-                            &RaidController_t::PoolCfgMutex, BuildSinglePoolInfo};
     syslog(LOG_DEBUG, "%s, ENTER...\n", __func__);
-    const int rc = BuildAll(kWalk, mi, ctx, ctrl);
+    const int rc = BuildAll(__func__, kPools, mi, ctx, ctrl);
     syslog(LOG_DEBUG, "%s, EXIT(%d).\n", __func__, rc);
     return rc;
 }
 
 int BuildChassisInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx, RaidController_t* ctrl) {
-    constexpr Walk kWalk = {"BuildChassisInfo", "CIM_SystemPackaging", "CIM_Chassis",
-                            &RaidController_t::ChassisCfgMutex, BuildSingleChassisInfo};
     syslog(LOG_DEBUG, "%s, enter...\n", __func__);
-    const int rc = BuildAll(kWalk, mi, ctx, ctrl);
+    const int rc = BuildAll(__func__, kEnclosures, mi, ctx, ctrl);
     syslog(LOG_DEBUG, "%s, EXIT(%d).\n", __func__, rc);
     return rc;
 }

@@ -3,6 +3,7 @@
 
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderCfgClassLock.h"
+#include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
 namespace {
@@ -11,70 +12,18 @@ constexpr const char kProcess[] = "ProcessDeviceConfigChange";
 constexpr int kMaxChain = 10;
 constexpr time_t kGraceSeconds = 3;
 
-constexpr ConfigAction_t kActions[] = {
-    {ACTION_DISK, ACTION_POOL, "CIM_SystemDevice", "CIM_DiskDrive", "DeviceID", GetDiskOp,
-     BuildDiskInfo, CheckAndUpdateDiskInfo, DeleteDisk},
-    {ACTION_VOLUME, ACTION_DISK, "CIM_SystemDevice", "CIM_StorageVolume", "DeviceID", GetVolumeOp,
-     BuildVolumeInfo, CheckAndUpdateVolumeInfo, DeleteVolume},
-    {ACTION_PORT, ACTION_NONE, "CIM_SystemDevice", "CIM_SASSATAPort", "DeviceID", GetPortOp,
-     BuildPortInfo, CheckAndUpdatePortInfo, DeletePort},
-    {ACTION_BATTERY, ACTION_NONE, "CIM_SystemDevice", "CIM_Battery", "DeviceID", GetBatteryOp,
-     BuildBatteryInfo, CheckAndUpdateBatteryInfo, DeleteBattery},
-    {ACTION_POOL, ACTION_NONE, "CIM_HostedStoragePool", "CIM_StoragePool", "InstanceID", GetPoolOp,
-     BuildSinglePoolInfo, CheckAndUpdatePoolInfo, DeletePool},
-    {ACTION_CHASSIS, ACTION_NONE, "CIM_SystemPackaging", "CIM_Chassis", "Tag", GetChassisOp,
-     BuildSingleChassisInfo, CheckAndUpdateChassisInfo, DeleteChassis},
-};
-
-/// The controller's fields that belong to an action.
-struct ActionFields {
-    int action;
-    pthread_mutex_t RaidController_t::*classMutex;
-    time_t RaidController_t::*updateTime;
-    List_t* RaidController_t::*list;
-};
-
-constexpr ActionFields kFields[] = {
-    {ACTION_DISK, &RaidController_t::DiskCfgMutex, &RaidController_t::DiskUpdateTime,
-     &RaidController_t::DiskList},
-    {ACTION_VOLUME, &RaidController_t::VolumeCfgMutex, &RaidController_t::VolumeUpdateTime,
-     &RaidController_t::VolumeList},
-    {ACTION_PORT, &RaidController_t::PortCfgMutex, &RaidController_t::PortUpdateTime,
-     &RaidController_t::PortList},
-    {ACTION_BATTERY, &RaidController_t::BatteryCfgMutex, &RaidController_t::BatteryUpdateTime,
-     &RaidController_t::BatteryList},
-    {ACTION_POOL, &RaidController_t::PoolCfgMutex, &RaidController_t::PoolUpdateTime,
-     &RaidController_t::PoolList},
-    {ACTION_CHASSIS, &RaidController_t::ChassisCfgMutex, &RaidController_t::ChassisUpdateTime,
-     &RaidController_t::ChassisList},
-};
-
-const ConfigAction_t* FindAction(int action) {
-    for (const ConfigAction_t& row : kActions) {
-        if (row.ConfigAction == action) return &row;
-    }
-    return nullptr;
-}
-
-const ActionFields* FindFields(int action) {
-    for (const ActionFields& fields : kFields) {
-        if (fields.action == action) return &fields;
-    }
-    return nullptr;
-}
-
-/// The rows to reconcile for `action`, itself first, each followed by what it depends on.
+/// The kinds to reconcile for `action`, its own first, each followed by what it depends on.
 struct Chain {
-    const ConfigAction_t* rows[kMaxChain];
+    const DeviceKind* kinds[kMaxChain];
     int length = 0;
 
     explicit Chain(int action) {
         int next = action;
         do {
-            const ConfigAction_t* row = FindAction(next);
-            if (row == nullptr) return;
-            rows[length++] = row;
-            next = row->PreConfigAction;
+            const DeviceKind* kind = FindKindByAction(next);
+            if (kind == nullptr) return;
+            kinds[length++] = kind;
+            next = kind->action.PreConfigAction;
         } while (next != ACTION_STOP && next != ACTION_NONE && next != action &&
                  length < kMaxChain);
     }
@@ -85,8 +34,7 @@ struct Refresh {
     const CMPIInstanceMI* mi;
     const CMPIContext* ctx;
     RaidController_t* ctrl;
-    const ConfigAction_t* row;
-    const ActionFields* fields;
+    const DeviceKind& kind;
 };
 
 /// Updates the cached devices that are still there and deletes the others, in list order. What is
@@ -95,12 +43,12 @@ void UpdateOrDelete(const Refresh& refresh, UpdateInfo_t* devices, int count) {
     for (int i = 0; i < count && !StopRequested(); i++) {
         if (devices[i].Flag) {
             syslog(LOG_DEBUG, "Updating devices[%d]: %p\n", i, devices[i].Device);
-            refresh.row->UpdateFunc(refresh.mi, refresh.ctx, refresh.ctrl, devices[i].Device,
-                                    devices[i].Instance);
+            refresh.kind.action.UpdateFunc(refresh.mi, refresh.ctx, refresh.ctrl, devices[i].Device,
+                                           devices[i].Instance);
             continue;
         }
         syslog(LOG_DEBUG, "Deleting devices[%d]: %p\n", i, devices[i].Device);
-        if (refresh.row->DeleteFunc(refresh.ctrl, devices[i].Device) == RESULT_OK) {
+        if (refresh.kind.action.DeleteFunc(refresh.ctrl, devices[i].Device) == RESULT_OK) {
             devices[i].Device = nullptr;
         }
     }
@@ -111,7 +59,8 @@ void BuildNew(const Refresh& refresh, const NewInfo_t* ops, int count) {
     for (int i = 0; i < count && !StopRequested(); i++) {
         if (ops[i].Op == nullptr) continue;
         syslog(LOG_DEBUG, "Adding device ops[%d]: %p\n", i, static_cast<void*>(ops[i].Op));
-        refresh.row->BuildFunc(refresh.mi, refresh.ctx, refresh.ctrl, ops[i].Instance, ops[i].Op);
+        refresh.kind.action.BuildFunc(refresh.mi, refresh.ctx, refresh.ctrl, ops[i].Instance,
+                                      ops[i].Op);
     }
 }
 
@@ -120,9 +69,9 @@ void ApplyResults(const Refresh& refresh, const CMPIEnumeration* results) {
     NewInfo_t* ops = nullptr;
     int removeCount = 0;
     int addCount = 0;
-    const int rc = CrossoutDuplicatedEntries(refresh.ctrl->*refresh.fields->list, results,
-                                             refresh.row->GetOpFunc, refresh.row->KeyName, &devices,
-                                             &ops, &removeCount, &addCount);
+    const int rc = CrossoutDuplicatedEntries(
+        refresh.ctrl->*refresh.kind.list, results, refresh.kind.action.GetOpFunc,
+        refresh.kind.action.KeyName, &devices, &ops, &removeCount, &addCount);
     if (rc == RESULT_OK) {
         syslog(LOG_DEBUG, "%s, removecount %d, addcount %d\n", kProcess, removeCount, addCount);
         if (devices != nullptr) UpdateOrDelete(refresh, devices, removeCount);
@@ -140,23 +89,24 @@ bool IsDue(const Refresh& refresh, const pthread_mutex_t& classMutex, time_t las
     constexpr const char kGo[] =
         "%s(%p): Action %d, last %lu, now %lu, interval %ld secs, ctrl %s, locker %p";
     syslog(LOG_DEBUG, due ? kGo : kSkip, kProcess, reinterpret_cast<void*>(pthread_self()),
-           refresh.row->ConfigAction, static_cast<unsigned long>(last),
+           refresh.kind.action.ConfigAction, static_cast<unsigned long>(last),
            static_cast<unsigned long>(now), static_cast<long>(now - last), refresh.ctrl->DeviceID,
            static_cast<const void*>(&classMutex));
     return due;
 }
 
-void ReconcileRow(const Refresh& refresh) {
-    pthread_mutex_t& classMutex = refresh.ctrl->*refresh.fields->classMutex;
-    time_t& updateTime = refresh.ctrl->*refresh.fields->updateTime;
-    ClassLock lock(refresh.ctrl, classMutex, refresh.row->AssociatedClassName,
+void Reconcile(const Refresh& refresh) {
+    const ConfigAction_t& action = refresh.kind.action;
+    pthread_mutex_t& classMutex = refresh.ctrl->*refresh.kind.classMutex;
+    time_t& updateTime = refresh.ctrl->*refresh.kind.updateTime;
+    ClassLock lock(refresh.ctrl, classMutex, action.AssociatedClassName,
                    ClassLock::Patience::kLimited);
     if (!lock.Locked()) return;
     if (!IsDue(refresh, classMutex, LoadTime(updateTime), time(nullptr))) return;
 
     CMPIEnumeration* results =
         QueryAssociators({kProcess, refresh.ctx, refresh.ctrl->ControllerOp,
-                          refresh.row->AssociationClassName, refresh.row->AssociatedClassName});
+                          action.AssociationClassName, action.AssociatedClassName});
     if (results != nullptr) ApplyResults(refresh, results);
     // Also after a failure: the vendor is not asked again before the next interval.
     StoreTime(updateTime, time(nullptr));
@@ -188,12 +138,12 @@ int HandleDeviceConfigChange(const CMPIInstanceMI* mi, const CMPIContext*, RaidC
                action);
         return RESULT_OK;
     }
-    const ActionFields* fields = FindFields(action);
-    if (fields == nullptr) {
+    const DeviceKind* kind = FindKindByAction(action);
+    if (kind == nullptr) {
         syslog(LOG_ERR, "%s: wrong action %d, ignored\n", __func__, action);
         return RESULT_OK;
     }
-    const time_t last = LoadTime(ctrl->*fields->updateTime);
+    const time_t last = LoadTime(ctrl->*kind->updateTime);
     if (now - last < LoadTime(StateUpdateInterval)) {
         syslog(LOG_DEBUG, "%s: ctrl %s, action %d, last %lu, now %lu, skip\n", __func__,
                ctrl->DeviceID, action, static_cast<unsigned long>(last),
@@ -220,9 +170,7 @@ int ProcessDeviceConfigChange(const CMPIInstanceMI* mi, const CMPIContext* ctx,
     if (time(nullptr) >= LoadTime(InitCompleteTime) + kGraceSeconds) {
         const Chain chain(action);
         for (int i = chain.length - 1; i >= 0 && !StopRequested(); i--) {
-            const ConfigAction_t* row = chain.rows[i];
-            const ActionFields* fields = FindFields(row->ConfigAction);
-            if (fields != nullptr) ReconcileRow({mi, ctx, ctrl, row, fields});
+            Reconcile({mi, ctx, ctrl, *chain.kinds[i]});
         }
     }
     syslog(LOG_DEBUG, "%s, EXIT\n", __func__);

@@ -3,6 +3,7 @@
 #include <stdlib.h>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
 static List_t __RaidControllerList = {nullptr, nullptr, 0};
@@ -21,6 +22,11 @@ static_assert(offsetof(StoragePool_t, PoolOp) == 0);
 static_assert(offsetof(Battery_t, BatteryOp) == 0);
 static_assert(offsetof(SASSATAPort_t, PortOp) == 0);
 static_assert(offsetof(Chassis_t, ChassisOp) == 0);
+
+// Not the table's order: others match the order in which the records and the locks go.
+constexpr const DeviceKind* kReleaseOrder[] = {&kVolumes, &kDrives,    &kPools,
+                                               &kPorts,   &kBatteries, &kEnclosures};
+static_assert(sizeof kReleaseOrder == sizeof kDeviceKinds);
 
 void Release(char*& text) {
     free(text);
@@ -121,12 +127,7 @@ void FreePool(void* data) {
 void FreeController(void* data) {
     auto* ctrl = static_cast<RaidController_t*>(data);
     if (ctrl == nullptr) return;
-    FreeList(ctrl->VolumeList, FreeVolume);
-    FreeList(ctrl->DiskList, FreeDisk);
-    FreeList(ctrl->PoolList, FreePool);
-    FreeList(ctrl->PortList, FreePort);
-    FreeList(ctrl->BatteryList, FreeBattery);
-    FreeList(ctrl->ChassisList, FreeChassis);
+    for (const DeviceKind* kind : kReleaseOrder) FreeList(ctrl->*kind->list, kind->release);
 
     syslog(LOG_DEBUG, "Controller %s (%s) deleted\n", ctrl->Model, ctrl->DeviceID);
     Release(ctrl->BundleVersion);
@@ -138,12 +139,7 @@ void FreeController(void* data) {
     ReleasePath(ctrl->ControllerOp);
     ReleasePath(ctrl->PortControllerOp);
 
-    pthread_mutex_destroy(&ctrl->DiskCfgMutex);
-    pthread_mutex_destroy(&ctrl->VolumeCfgMutex);
-    pthread_mutex_destroy(&ctrl->PortCfgMutex);
-    pthread_mutex_destroy(&ctrl->BatteryCfgMutex);
-    pthread_mutex_destroy(&ctrl->PoolCfgMutex);
-    pthread_mutex_destroy(&ctrl->ChassisCfgMutex);
+    for (const DeviceKind* kind : kDeviceKinds) pthread_mutex_destroy(&(ctrl->*kind->classMutex));
     pthread_mutex_destroy(&ctrl->CtrlMutex);
     free(ctrl);
 }
@@ -151,16 +147,15 @@ void FreeController(void* data) {
 namespace {
 
 /// Unlinks a record under CtrlMutex. 0, -1 or -3.
-int Unlink(RaidController_t* ctrl, List_t* RaidController_t::*list, void* device) {
+int Unlink(RaidController_t* ctrl, const DeviceKind& kind, void* device) {
     if (ctrl == nullptr) return RESULT_BAD_ARGUMENT;
     MutexGuard lock(ctrl->CtrlMutex);
-    return RemoveEntryFromListByKey(ctrl->*list, device);
+    return RemoveEntryFromListByKey(ctrl->*kind.list, device);
 }
 
-int Delete(RaidController_t* ctrl, List_t* RaidController_t::*list, void* device,
-           ReleaseFunc_t release) {
-    const int rc = Unlink(ctrl, list, device);
-    if (rc == RESULT_OK) release(device);
+int Delete(RaidController_t* ctrl, const DeviceKind& kind, void* device) {
+    const int rc = Unlink(ctrl, kind, device);
+    if (rc == RESULT_OK) kind.release(device);
     return rc;
 }
 
@@ -171,23 +166,23 @@ void LogRemovedFromController(const char* name, const RaidController_t* ctrl) {
 }  // namespace
 
 int DeleteVolume(RaidController_t* ctrl, void* device) {
-    return Delete(ctrl, &RaidController_t::VolumeList, device, FreeVolume);
+    return Delete(ctrl, kVolumes, device);
 }
 
 int DeleteBattery(RaidController_t* ctrl, void* device) {
-    return Delete(ctrl, &RaidController_t::BatteryList, device, FreeBattery);
+    return Delete(ctrl, kBatteries, device);
 }
 
 int DeleteChassis(RaidController_t* ctrl, void* device) {
-    return Delete(ctrl, &RaidController_t::ChassisList, device, FreeChassis);
+    return Delete(ctrl, kEnclosures, device);
 }
 
 int DeletePool(RaidController_t* ctrl, void* device) {
-    return Delete(ctrl, &RaidController_t::PoolList, device, FreePool);
+    return Delete(ctrl, kPools, device);
 }
 
 int DeletePort(RaidController_t* ctrl, void* device) {
-    const int rc = Unlink(ctrl, &RaidController_t::PortList, device);
+    const int rc = Unlink(ctrl, kPorts, device);
     if (rc != RESULT_OK) return rc;
     LogRemovedFromController(static_cast<SASSATAPort_t*>(device)->PortName, ctrl);
     FreePort(device);
