@@ -36,10 +36,6 @@ CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx, const CM
 CMPIEnumeration* RunAssociators(const Query_t& query);
 CMPIEnumeration* RunAssociatorNames(const Query_t& query);
 
-/// Appends `record` to `list` and stamps `updateTime` when that worked. The list's code. The caller
-/// holds CtrlMutex.
-int AppendRecord(List_t* list, void* record, time_t& updateTime);
-
 /// A zero-filled record or work item; null without memory. Released with free().
 template <typename Record>
 Record* NewRecord() {

@@ -164,15 +164,12 @@ int BuildControllerInfo(const CMPIInstanceMI*, const CMPIContext* ctx, Array_t* 
     return rc;
 }
 
-int NeedUpdate(time_t, unsigned char) {
-    return 1;
-}
-
 int CheckAndUpdateControllerInfo(const CMPIInstanceMI*, const CMPIContext*, RaidController_t* ctrl,
                                  void*, CMPIInstance*) {
     syslog(LOG_DEBUG, "%s, enter...\n", __func__);
     if (NeedUpdate(LoadTime(ctrl->ControllerUpdateTime), ctrl->UpdateEnabled)) {
-        StampTime(ctrl->CtrlMutex, ctrl->ControllerUpdateTime);
+        MutexGuard lock(ctrl->CtrlMutex);
+        StoreTime(ctrl->ControllerUpdateTime, time(nullptr));
     }
     syslog(LOG_DEBUG, "%s, exit.\n", __func__);
     return RESULT_OK;

@@ -1,7 +1,7 @@
 // Building a drive's record from the drive, its extent, firmware, place and pool.
 #include <stdlib.h>
 
-#include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgBuild.h"
 #include "PlexorProviderLock.h"
 
 namespace {
@@ -10,11 +10,8 @@ constexpr const char kBuilder[] = "BuildDiskInfo";
 
 /// The drive's own properties. False without DeviceID.
 bool ReadDrive(DiskDrive_t* disk, const CMPIInstance* inst) {
-    disk->DeviceID = StringClone(ReadString(inst, "DeviceID"));
-    if (disk->DeviceID == nullptr) {
-        syslog(LOG_ERR, "NULL DeviceID for disk %s\n", PathText(LOG_ERR, disk->DiskOp));
-        return false;
-    }
+    disk->DeviceID = CloneDeviceID(kDrives, inst, disk->DiskOp);
+    if (disk->DeviceID == nullptr) return false;
     disk->Name = StringClone(ReadString(inst, "Name"));
     disk->EnabledState = ReadUint16(inst, "EnabledState");
     disk->OperationalStatus = GetOperationalStatus(inst);
@@ -88,17 +85,20 @@ CMPIEnumeration* CandidatePools(const DiskDrive_t* disk, const CMPIContext* ctx)
         {kBuilder, ctx, disk->ExtentOp, "CIM_ConcreteComponent", "CIM_StoragePool"});
 }
 
-/// Appends the drive and, when that fails, withdraws it from `pool` again. The caller holds
-/// CtrlMutex.
-int Insert(RaidController_t* ctrl, DiskDrive_t* disk, StoragePool_t* pool) {
-    const int rc = AppendRecord(ctrl->DiskList, disk, ctrl->DiskUpdateTime);
+using DriveOwner = RecordOwner<DiskDrive_t>;
+
+/// Appends the drive and, when that fails, withdraws it from `pool` again. The list's code. The
+/// caller holds CtrlMutex.
+int Append(RaidController_t* ctrl, DriveOwner& disk, StoragePool_t* pool) {
+    void* const list = ctrl->DiskList;
+    const int rc = AppendRecord(ctrl, kDrives, disk.get());
     if (rc == RESULT_OK) {
-        syslog(LOG_DEBUG, "%s: disk %p added to the list %p\n", kBuilder, static_cast<void*>(disk),
-               static_cast<void*>(ctrl->DiskList));
+        void* const published = disk.release();
+        syslog(LOG_DEBUG, "%s: disk %p added to the list %p\n", kBuilder, published, list);
         return rc;
     }
     syslog(LOG_ERR, "%s: failed to add disk %p to list %p, rc %d.\n", kBuilder,
-           static_cast<void*>(disk), static_cast<void*>(ctrl->DiskList), rc);
+           static_cast<void*>(disk.get()), list, rc);
     if (pool == nullptr) return rc;
     syslog(LOG_DEBUG, "%s: remove disk %s from pool %p\n", kBuilder, disk->DeviceID,
            static_cast<void*>(pool));
@@ -106,10 +106,10 @@ int Insert(RaidController_t* ctrl, DiskDrive_t* disk, StoragePool_t* pool) {
     return rc;
 }
 
-/// Takes `candidate` as the drive's pool. When it is cached, joins it and inserts the drive under
+/// Takes `candidate` as the drive's pool. When it is cached, joins it and appends the drive under
 /// one hold of CtrlMutex: a reader that finds the member must find its record. True when that
 /// happened, with the list's code in `rc`.
-bool JoinAndInsert(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIObjectPath* candidate,
+bool JoinAndAppend(RaidController_t* ctrl, DriveOwner& disk, const CMPIObjectPath* candidate,
                    int& rc) {
     free(disk->Pool);
     disk->Pool = StringClone(ReadKey(candidate, "InstanceID"));
@@ -119,18 +119,18 @@ bool JoinAndInsert(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIObjectPa
     syslog(LOG_DEBUG, "%s: found a pool %p with ID %s\n", kBuilder, static_cast<void*>(pool),
            disk->Pool);
     AddDiskToPool(pool, disk->DeviceID);
-    rc = Insert(ctrl, disk, pool);
+    rc = Append(ctrl, disk, pool);
     return true;
 }
 
 /// Finds the drive's pool and puts the drive into the controller's list. 0, -1 without a pool, or
 /// the list's code.
-int Place(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx) {
-    CMPIEnumeration* pools = CandidatePools(disk, ctx);
+int JoinAndPublish(RaidController_t* ctrl, DriveOwner& disk, const CMPIContext* ctx) {
+    CMPIEnumeration* pools = CandidatePools(disk.get(), ctx);
     while (const CMPIObjectPath* candidate = NextPath(pools)) {
         if (StopRequested()) break;
         int rc = RESULT_OK;
-        if (JoinAndInsert(ctrl, disk, candidate, rc)) return rc;
+        if (JoinAndAppend(ctrl, disk, candidate, rc)) return rc;
     }
     if (disk->Pool == nullptr) {
         if (StopRequested()) return RESULT_BAD_ARGUMENT;  // it may not have been asked for
@@ -139,32 +139,28 @@ int Place(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx) {
     }
     // Its pool is not cached yet; the next refresh of the drive joins it.
     MutexGuard lock(ctrl->CtrlMutex);
-    return Insert(ctrl, disk, nullptr);
+    return Append(ctrl, disk, nullptr);
 }
 
-int Fill(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx,
-         const CMPIInstance* devInst, const CMPIObjectPath* devOp) {
+bool ReadParts(DiskDrive_t* disk, const CMPIContext* ctx, const CMPIInstance* devInst,
+               const CMPIObjectPath* devOp) {
     disk->DiskOp = ClonePath(devOp);
-    if (!ReadDrive(disk, devInst)) return RESULT_BAD_ARGUMENT;
-    if (!ReadMedia(disk, ctx, devOp)) return RESULT_BAD_ARGUMENT;
+    if (!ReadDrive(disk, devInst)) return false;
+    if (!ReadMedia(disk, ctx, devOp)) return false;
     ReadFirmware(disk, ctx, devOp);
     ReadLocation(disk, ctx, devOp);
     disk->LastUpdateTime = time(nullptr);
-    DumpDisk(disk);
-    return Place(ctrl, disk, ctx);
+    return true;
 }
 
 int Build(RaidController_t* ctrl, const CMPIContext* ctx, const CMPIInstance* devInst,
           const CMPIObjectPath* devOp) {
     if (devOp == nullptr || devInst == nullptr || ctrl == nullptr) return RESULT_BAD_ARGUMENT;
-    auto* disk = NewRecord<DiskDrive_t>();
-    if (disk == nullptr) {
-        syslog(LOG_ERR, "%s, failed to allocate memory for DiskDrive_t\n", kBuilder);
-        return RESULT_NO_MEMORY;
-    }
-    const int rc = Fill(ctrl, disk, ctx, devInst, devOp);
-    if (rc != RESULT_OK) FreeDisk(disk);
-    return rc;
+    auto disk = NewDevice<DiskDrive_t>(kBuilder, kDrives);
+    if (disk == nullptr) return RESULT_NO_MEMORY;
+    if (!ReadParts(disk.get(), ctx, devInst, devOp)) return RESULT_BAD_ARGUMENT;
+    DumpDisk(disk.get());
+    return JoinAndPublish(ctrl, disk, ctx);
 }
 
 }  // namespace

@@ -1,7 +1,7 @@
 // Bringing a cached drive's status and pool up to date.
 #include <stdlib.h>
 
-#include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgBuild.h"
 #include "PlexorProviderLock.h"
 
 namespace {
@@ -64,7 +64,7 @@ int CheckAndUpdateDiskInfo(const CMPIInstanceMI*, const CMPIContext* ctx, RaidCo
     syslog(LOG_DEBUG, "%s: ENTER. disk - %s\n", __func__, disk->Name);
     if (NeedUpdate(disk->LastUpdateTime, disk->UpdateEnabled)) {
         Update(ctrl, disk, ctx, devInst);
-        StampTime(ctrl->CtrlMutex, ctrl->DiskUpdateTime);
+        StampTime(ctrl, kDrives);
     }
     syslog(LOG_DEBUG, "%s, exit\n", __func__);
     return RESULT_OK;

@@ -18,58 +18,46 @@ List_Entry_t* FindMember(const StoragePool_t* pool, const char* disk) {
     return entry;
 }
 
-/// How one kind of record is looked up and what that leaves in the log.
+/// What identifies a record in a look-up.
 template <typename Record>
 struct Lookup {
     const char* caller;
+    const char* noun;
+    const char* label;  ///< the key's, in the log
     char* Record::*key;
-    const char* checking;  ///< caller, record, its key
-    const char* found;     ///< caller, record, wanted key, list
-    const char* missing;   ///< caller, wanted key, list
-    bool alwaysMissing;    ///< deny the record after having found it
 };
 
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wformat-nonliteral"
 template <typename Record>
-Record* Find(const Lookup<Record>& lookup, List_t* list, const char* key) {
+void LogMissing(const Lookup<Record>& lookup, const List_t* list, const char* key) {
+    syslog(LOG_INFO, "%s: can not find %s %s in list %p\n", lookup.caller, lookup.noun, key,
+           static_cast<const void*>(list));
+}
+
+/// First record of the list with that key; null, which is logged, when there is none. A null key is
+/// nobody's.
+template <typename Record>
+Record* Find(const Lookup<Record>& lookup, const List_t* list, const char* key) {
     if (key == nullptr) return nullptr;
-    List_Entry_t* entry = list != nullptr ? list->Head : nullptr;
+    const List_Entry_t* entry = list != nullptr ? list->Head : nullptr;
     for (; entry != nullptr; entry = entry->Next) {
         auto* record = static_cast<Record*>(entry->Data);
-        syslog(LOG_DEBUG, lookup.checking, lookup.caller, static_cast<void*>(record),
-               record->*lookup.key);
+        syslog(LOG_DEBUG, "%s: checking %s %p (%s: %s)\n", lookup.caller, lookup.noun,
+               static_cast<void*>(record), lookup.label, OrNull(record->*lookup.key));
         if (!SameText(record->*lookup.key, key)) continue;
-        syslog(LOG_DEBUG, lookup.found, lookup.caller, static_cast<void*>(record), key,
-               static_cast<void*>(list));
-        if (lookup.alwaysMissing) break;
+        syslog(LOG_DEBUG, "%s: found %s %p with %s in list %p\n", lookup.caller, lookup.noun,
+               static_cast<void*>(record), key, static_cast<const void*>(list));
         return record;
     }
-    syslog(LOG_INFO, lookup.missing, lookup.caller, key, static_cast<void*>(list));
+    LogMissing(lookup, list, key);
     return nullptr;
 }
-#pragma GCC diagnostic pop
 
-constexpr Lookup<StoragePool_t> kPoolLookup = {"FindStoragePoolByID",
-                                               &StoragePool_t::InstanceID,
-                                               "%s: checking pool %p (ID: %s)\n",
-                                               "%s: found pool %p with %s in list %p\n",
-                                               "%s: can not find pool %s in list %p\n",
-                                               false};
-constexpr Lookup<DiskDrive_t> kDiskLookup = {"FindDiskByDeviceID",
-                                             &DiskDrive_t::DeviceID,
-                                             "%s: checking disk %p (ID: %s)\n",
-                                             "%s: found disk %p with %s in list %p\n",
-                                             "%s: can not find disk %s in list %p\n",
-                                             false};
-// Callers never obtain a chassis, on purpose: drives are shown by their DeviceID, not by slot and
-// enclosure.
-constexpr Lookup<Chassis_t> kChassisLookup = {"FindChassisByTag",
-                                              &Chassis_t::Tag,
-                                              "%s: checking chassis %p (tag: %s)\n",
-                                              "%s: found chassis %p with %s in list %p\n",
-                                              "%s: can not find chassis %s in list %p\n",
-                                              true};
+constexpr Lookup<StoragePool_t> kPoolLookup = {"FindStoragePoolByID", "pool", "ID",
+                                               &StoragePool_t::InstanceID};
+constexpr Lookup<DiskDrive_t> kDiskLookup = {"FindDiskByDeviceID", "disk", "ID",
+                                             &DiskDrive_t::DeviceID};
+constexpr Lookup<Chassis_t> kChassisLookup = {"FindChassisByTag", "chassis", "tag",
+                                              &Chassis_t::Tag};
 
 }  // namespace
 
@@ -82,7 +70,11 @@ DiskDrive_t* FindDiskByDeviceID(const RaidController_t* ctrl, const char* device
 }
 
 Chassis_t* FindChassisByTag(const RaidController_t* ctrl, const char* tag) {
-    return Find(kChassisLookup, ctrl->ChassisList, tag);
+    // A chassis is denied after it has been found: clients know the drives by their DeviceID, and
+    // with a chassis they would be shown by slot and enclosure.
+    const Chassis_t* found = Find(kChassisLookup, ctrl->ChassisList, tag);
+    if (found != nullptr) LogMissing(kChassisLookup, ctrl->ChassisList, tag);
+    return nullptr;
 }
 
 void AddDiskToPool(StoragePool_t* pool, const char* disk) {

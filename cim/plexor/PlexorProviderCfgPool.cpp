@@ -1,12 +1,11 @@
 // Storage pools and enclosures: the two walks that a worker does inline, and their builders.
-#include <stdlib.h>
-
-#include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgBuild.h"
 #include "PlexorProviderCfgClassLock.h"
-#include "PlexorProviderCfgKinds.h"
-#include "PlexorProviderLock.h"
 
 namespace {
+
+constexpr const char kPoolBuilder[] = "BuildSinglePoolInfo";
+constexpr const char kChassisBuilder[] = "BuildSingleChassisInfo";
 
 /// Builds every device of a kind, up to the first that fails. Its code, or 0.
 int BuildAll(const char* caller, const DeviceKind& kind, const CMPIInstanceMI* mi,
@@ -36,79 +35,68 @@ const char* InternalTagOf(const char* tag, const char* controllerId) {
     return *rest != '\0' ? rest : nullptr;
 }
 
-int BuildPool(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObjectPath* op) {
-    constexpr const char kCaller[] = "BuildSinglePoolInfo";
-    auto* pool = NewRecord<StoragePool_t>();
-    if (pool == nullptr) {
-        syslog(LOG_ERR, "%s, failed to allocate memory for StoragePool_t\n", kCaller);
-        return RESULT_NO_MEMORY;
-    }
+bool ReadPool(StoragePool_t* pool, const CMPIInstance* inst, const CMPIObjectPath* op) {
     pool->Drives = &pool->_Drives;
     pool->PoolOp = ClonePath(op);
     pool->InstanceID = StringClone(ReadString(inst, "InstanceID"));
     pool->PoolID = StringClone(ReadString(inst, "PoolID"));
     if (pool->InstanceID == nullptr || pool->PoolID == nullptr) {
         syslog(LOG_ERR, "NULL InstanceID or PoolID for pool %s\n", PathText(LOG_ERR, pool->PoolOp));
-        FreePool(pool);
-        return RESULT_BAD_ARGUMENT;
+        return false;
     }
     pool->TotalManagedSpace = ReadUint64(inst, "TotalManagedSpace");
     pool->RemainingManagedSpace = ReadUint64(inst, "RemainingManagedSpace");
     pool->Primordial = ReadBoolean(inst, "Primordial");
     pool->OperationalStatus = GetOperationalStatus(inst);
     pool->LastUpdateTime = time(nullptr);
+    return true;
+}
+
+void DumpPool(const StoragePool_t* pool) {
     syslog(LOG_INFO,
            "\nPoolOp: %s\n\tInstanceID            - %s\n\tPoolId                - %s\n"
            "\tPrimordial            - %d\n\tTotalManagedSpace     - %llu\n"
            "\tRemainingManagedSpace - %llu\n\tOperationalStatus     - %d\n",
            PathText(LOG_INFO, pool->PoolOp), pool->InstanceID, pool->PoolID, pool->Primordial,
            pool->TotalManagedSpace, pool->RemainingManagedSpace, pool->OperationalStatus);
-
-    MutexGuard lock(ctrl->CtrlMutex);
-    const int rc = AppendRecord(ctrl->PoolList, pool, ctrl->PoolUpdateTime);
-    lock.Unlock();
-    if (rc != RESULT_OK) {
-        syslog(LOG_ERR, "%s: failed to add pool to list, rc %d.\n", kCaller, rc);
-        FreePool(pool);
-        return rc;
-    }
-    syslog(LOG_DEBUG, "%s: pool %p added to the list\n", kCaller, static_cast<void*>(pool));
-    return RESULT_OK;
 }
 
-int BuildChassis(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObjectPath* op) {
-    constexpr const char kCaller[] = "BuildSingleChassisInfo";
-    auto* chassis = NewRecord<Chassis_t>();
-    if (chassis == nullptr) {
-        syslog(LOG_ERR, "%s, failed to allocate memory for Chassis_t\n", kCaller);
-        return RESULT_NO_MEMORY;
-    }
+int BuildPool(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObjectPath* op) {
+    auto pool = NewDevice<StoragePool_t>(kPoolBuilder, kPools);
+    if (pool == nullptr) return RESULT_NO_MEMORY;
+    if (!ReadPool(pool.get(), inst, op)) return RESULT_BAD_ARGUMENT;
+    DumpPool(pool.get());
+    return Publish(kPoolBuilder, ctrl, kPools, pool);
+}
+
+bool ReadChassis(Chassis_t* chassis, const RaidController_t* ctrl, const CMPIInstance* inst,
+                 const CMPIObjectPath* op) {
     chassis->ChassisOp = ClonePath(op);
     chassis->Tag = StringClone(ReadString(inst, "Tag"));
     if (chassis->Tag == nullptr) {
         syslog(LOG_ERR, "NULL tag for chassis %s\n", PathText(LOG_ERR, chassis->ChassisOp));
-        FreeChassis(chassis);
-        return RESULT_BAD_ARGUMENT;
+        return false;
     }
     chassis->OperationalStatus = GetOperationalStatus(inst);
     chassis->InternalTag = StringClone(InternalTagOf(chassis->Tag, ctrl->DeviceID));
     chassis->LastUpdateTime = time(nullptr);
+    return true;
+}
+
+void DumpChassis(const Chassis_t* chassis) {
     syslog(LOG_DEBUG,
            "\nChassisOp: %s\n\tTag               - %s\n\tInternalTag       - %s\n"
            "\tOperationalStatus - %d\n",
            PathText(LOG_DEBUG, chassis->ChassisOp), chassis->Tag, OrNull(chassis->InternalTag),
            chassis->OperationalStatus);
+}
 
-    MutexGuard lock(ctrl->CtrlMutex);
-    const int rc = AppendRecord(ctrl->ChassisList, chassis, ctrl->ChassisUpdateTime);
-    lock.Unlock();
-    if (rc != RESULT_OK) {
-        syslog(LOG_ERR, "%s: failed to add chassis to list, rc %d.\n", kCaller, rc);
-        FreeChassis(chassis);
-        return rc;
-    }
-    syslog(LOG_DEBUG, "%s: chassis %p added to the list\n", kCaller, static_cast<void*>(chassis));
-    return RESULT_OK;
+int BuildChassis(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObjectPath* op) {
+    auto chassis = NewDevice<Chassis_t>(kChassisBuilder, kEnclosures);
+    if (chassis == nullptr) return RESULT_NO_MEMORY;
+    if (!ReadChassis(chassis.get(), ctrl, inst, op)) return RESULT_BAD_ARGUMENT;
+    DumpChassis(chassis.get());
+    return Publish(kChassisBuilder, ctrl, kEnclosures, chassis);
 }
 
 }  // namespace
@@ -148,7 +136,7 @@ int CheckAndUpdatePoolInfo(const CMPIInstanceMI*, const CMPIContext*, RaidContro
     const auto* pool = static_cast<StoragePool_t*>(device);
     syslog(LOG_DEBUG, "%s: ENTER. pool - %s\n", __func__, pool->InstanceID);
     if (NeedUpdate(pool->LastUpdateTime, pool->UpdateEnabled)) {
-        StampTime(ctrl->CtrlMutex, ctrl->PoolUpdateTime);
+        StampTime(ctrl, kPools);
     }
     syslog(LOG_DEBUG, "%s, exit.\n", __func__);
     return RESULT_OK;
@@ -159,7 +147,7 @@ int CheckAndUpdateChassisInfo(const CMPIInstanceMI*, const CMPIContext*, RaidCon
     const auto* chassis = static_cast<Chassis_t*>(device);
     syslog(LOG_DEBUG, "%s, enter...\n", __func__);
     if (NeedUpdate(chassis->LastUpdateTime, chassis->UpdateEnabled)) {
-        StampTime(ctrl->CtrlMutex, ctrl->ChassisUpdateTime);
+        StampTime(ctrl, kEnclosures);
     }
     syslog(LOG_DEBUG, "%s, exit.\n", __func__);
     return RESULT_OK;

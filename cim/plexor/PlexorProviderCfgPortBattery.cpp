@@ -1,28 +1,19 @@
 // SAS/SATA ports and batteries: plain records, built by the same steps.
-#include <stdlib.h>
-
-#include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgBuild.h"
 #include "PlexorProviderLock.h"
 
 namespace {
 
 constexpr const char kBatteryUpdater[] = "CheckAndUpdateBatteryInfo";
 
-/// What differs between the two builders. The message texts take the function's name first, but for
-/// `nullDeviceId`, which takes the path.
+/// What differs between the two builders.
 template <typename Record>
 struct Builder {
     const char* caller;
+    const DeviceKind& kind;
     CMPIObjectPath* Record::*op;
-    List_t* RaidController_t::*list;
-    time_t RaidController_t::*updateTime;
     void (*read)(Record* record, const CMPIInstance* inst);
     void (*dump)(const Record* record);
-    ReleaseFunc_t release;
-    const char* noMemory;
-    const char* nullDeviceId;
-    const char* added;
-    const char* notAdded;
 };
 
 void ReadPort(SASSATAPort_t* port, const CMPIInstance* inst) {
@@ -53,71 +44,31 @@ void DumpBattery(const Battery_t* battery) {
            battery->OperationalStatus);
 }
 
-constexpr Builder<SASSATAPort_t> kPortBuilder = {
-    "BuildPortInfo",
-    &SASSATAPort_t::PortOp,
-    &RaidController_t::PortList,
-    &RaidController_t::PortUpdateTime,
-    ReadPort,
-    DumpPort,
-    FreePort,
-    "%s, failed to allocate memory for SASSATAPort_t\n",
-    "NULL DeviceID for port %s\n",
-    "%s: port %p added to the list\n",
-    "%s: failed to add port to list, rc %d.\n"};
-
-constexpr Builder<Battery_t> kBatteryBuilder = {"BuildBatteryInfo",
-                                                &Battery_t::BatteryOp,
-                                                &RaidController_t::BatteryList,
-                                                &RaidController_t::BatteryUpdateTime,
-                                                ReadBattery,
-                                                DumpBattery,
-                                                FreeBattery,
-                                                "%s, failed to allocate memory for Battery_t\n",
-                                                "NULL DeviceID for battery %s\n",
-                                                "%s: battery %p added to the list\n",
-                                                "%s: failed to add battery to list, rc %d.\n"};
-
-// The formats are the constants of the tables above.
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wformat-nonliteral"
+constexpr Builder<SASSATAPort_t> kPortBuilder = {"BuildPortInfo", kPorts, &SASSATAPort_t::PortOp,
+                                                 ReadPort, DumpPort};
+constexpr Builder<Battery_t> kBatteryBuilder = {"BuildBatteryInfo", kBatteries,
+                                                &Battery_t::BatteryOp, ReadBattery, DumpBattery};
 
 template <typename Record>
-int Insert(const Builder<Record>& builder, RaidController_t* ctrl, Record* record) {
-    MutexGuard lock(ctrl->CtrlMutex);
-    const int rc = AppendRecord(ctrl->*builder.list, record, ctrl->*builder.updateTime);
-    lock.Unlock();
-    if (rc == RESULT_OK) {
-        syslog(LOG_DEBUG, builder.added, builder.caller, static_cast<void*>(record));
-        return rc;
-    }
-    syslog(LOG_ERR, builder.notAdded, builder.caller, rc);
-    builder.release(record);
-    return rc;
+bool ReadParts(const Builder<Record>& builder, Record* record, const CMPIInstance* devInst,
+               const CMPIObjectPath* devOp) {
+    record->*builder.op = ClonePath(devOp);
+    record->DeviceID = CloneDeviceID(builder.kind, devInst, record->*builder.op);
+    if (record->DeviceID == nullptr) return false;
+    builder.read(record, devInst);
+    record->LastUpdateTime = time(nullptr);
+    return true;
 }
 
 template <typename Record>
 int Build(const Builder<Record>& builder, RaidController_t* ctrl, const CMPIInstance* devInst,
           const CMPIObjectPath* devOp) {
-    auto* record = NewRecord<Record>();
-    if (record == nullptr) {
-        syslog(LOG_ERR, builder.noMemory, builder.caller);
-        return RESULT_NO_MEMORY;
-    }
-    record->*builder.op = ClonePath(devOp);
-    record->DeviceID = StringClone(ReadString(devInst, "DeviceID"));
-    if (record->DeviceID == nullptr) {
-        syslog(LOG_ERR, builder.nullDeviceId, PathText(LOG_ERR, record->*builder.op));
-        builder.release(record);
-        return RESULT_BAD_ARGUMENT;
-    }
-    builder.read(record, devInst);
-    record->LastUpdateTime = time(nullptr);
-    builder.dump(record);
-    return Insert(builder, ctrl, record);
+    auto record = NewDevice<Record>(builder.caller, builder.kind);
+    if (record == nullptr) return RESULT_NO_MEMORY;
+    if (!ReadParts(builder, record.get(), devInst, devOp)) return RESULT_BAD_ARGUMENT;
+    builder.dump(record.get());
+    return Publish(builder.caller, ctrl, builder.kind, record);
 }
-
-#pragma GCC diagnostic pop
 
 template <typename Record>
 int TracedBuild(const Builder<Record>& builder, RaidController_t* ctrl, const CMPIInstance* devInst,
@@ -164,7 +115,7 @@ int CheckAndUpdatePortInfo(const CMPIInstanceMI*, const CMPIContext*, RaidContro
     const auto* port = static_cast<SASSATAPort_t*>(device);
     syslog(LOG_DEBUG, "%s: ENTER. port - %s\n", __func__, port->PortName);
     if (NeedUpdate(port->LastUpdateTime, port->UpdateEnabled)) {
-        StampTime(ctrl->CtrlMutex, ctrl->PortUpdateTime);
+        StampTime(ctrl, kPorts);
     }
     syslog(LOG_DEBUG, "%s, exit.\n", __func__);
     return RESULT_OK;
@@ -176,7 +127,7 @@ int CheckAndUpdateBatteryInfo(const CMPIInstanceMI*, const CMPIContext* ctx, Rai
     syslog(LOG_DEBUG, "%s: ENTER. battery - %s\n", __func__, battery->DeviceID);
     if (NeedUpdate(battery->LastUpdateTime, battery->UpdateEnabled)) {
         UpdateBattery(ctrl, battery, ctx, devInst);
-        StampTime(ctrl->CtrlMutex, ctrl->BatteryUpdateTime);
+        StampTime(ctrl, kBatteries);
     }
     syslog(LOG_DEBUG, "%s, exit.\n", __func__);
     return RESULT_OK;

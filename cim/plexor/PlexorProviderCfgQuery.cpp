@@ -1,6 +1,5 @@
 // The one place that asks the broker, and logs what it asks and what failed.
 #include "PlexorProviderCfg.h"
-#include "PlexorProviderLock.h"
 
 namespace {
 
@@ -88,10 +87,4 @@ CMPIInstance* QueryInstance(const char* caller, const CMPIContext* ctx, const CM
     syslog(LOG_ERR, "GetInstance %s failed, status: rc %d, msg %s", PathText(LOG_ERR, path),
            status.rc, StatusText(status));
     return found;
-}
-
-int AppendRecord(List_t* list, void* record, time_t& updateTime) {
-    const int rc = AddEntryAtListTail(list, record);
-    if (rc == RESULT_OK) StoreTime(updateTime, time(nullptr));
-    return rc;
 }

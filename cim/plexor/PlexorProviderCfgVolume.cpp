@@ -1,21 +1,13 @@
 // Logical volumes: their records and what is watched on them.
 #include <stdlib.h>
 
-#include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgBuild.h"
 #include "PlexorProviderLock.h"
 
 namespace {
 
 constexpr const char kBuilder[] = "BuildVolumeInfo";
 constexpr const char kUpdater[] = "CheckAndUpdateVolumeInfo";
-
-/// DeviceID. False without one.
-bool ReadIdentity(StorageVolume_t* volume, const CMPIInstance* inst) {
-    volume->DeviceID = StringClone(ReadString(inst, "DeviceID"));
-    if (volume->DeviceID != nullptr) return true;
-    syslog(LOG_ERR, "NULL DeviceID for volume %s\n", PathText(LOG_ERR, volume->VolumeOp));
-    return false;
-}
 
 void ReadProperties(StorageVolume_t* volume, const CMPIInstance* inst) {
     volume->ElementName = StringClone(ReadString(inst, "ElementName"));
@@ -62,51 +54,42 @@ void ReadPool(StorageVolume_t* volume, const CMPIContext* ctx) {
     volume->FromPool = StringClone(ReadKey(NextPath(pools), "InstanceID"));
 }
 
+/// Path, identity, properties and RAID level. False without DeviceID.
+bool ReadParts(StorageVolume_t* volume, const CMPIContext* ctx, const CMPIInstance* devInst,
+               const CMPIObjectPath* devOp) {
+    volume->VolumeOp = ClonePath(devOp);
+    volume->DeviceID = CloneDeviceID(kVolumes, devInst, volume->VolumeOp);
+    if (volume->DeviceID == nullptr) return false;
+    ReadProperties(volume, devInst);
+    ReadRaidLevel(volume, ctx, devOp);
+    volume->LastUpdateTime = time(nullptr);
+    return true;
+}
+
 /// Puts the volume into the controller's list. 0, -1 without a pool, or the list's code.
-int Insert(RaidController_t* ctrl, StorageVolume_t* volume) {
+int PublishWithPool(RaidController_t* ctrl, StorageVolume_t* volume) {
     if (volume->FromPool == nullptr) {
         syslog(LOG_ERR, "No pool associated with volume %s\n", PathText(LOG_ERR, volume->VolumeOp));
         return RESULT_BAD_ARGUMENT;
     }
-    MutexGuard lock(ctrl->CtrlMutex);
-    const int rc = AppendRecord(ctrl->VolumeList, volume, ctrl->VolumeUpdateTime);
-    lock.Unlock();
-    if (rc == RESULT_OK) {
-        syslog(LOG_DEBUG, "%s: volume %p added to the list\n", kBuilder,
-               static_cast<void*>(volume));
-    } else {
-        syslog(LOG_ERR, "%s: failed to add volume to list, rc %d.\n", kBuilder, rc);
-    }
-    return rc;
+    return PublishRecord(kBuilder, ctrl, kVolumes, volume);
 }
 
 int Build(RaidController_t* ctrl, const CMPIContext* ctx, const CMPIInstance* devInst,
           const CMPIObjectPath* devOp) {
-    auto* volume = NewRecord<StorageVolume_t>();
-    if (volume == nullptr) {
-        syslog(LOG_ERR, "%s, failed to allocate memory for StorageVolume_t\n", kBuilder);
-        return RESULT_NO_MEMORY;
-    }
-    volume->VolumeOp = ClonePath(devOp);
-    if (!ReadIdentity(volume, devInst)) {
-        FreeVolume(volume);
-        return RESULT_BAD_ARGUMENT;
-    }
-    ReadProperties(volume, devInst);
-    ReadRaidLevel(volume, ctx, devOp);
-    volume->LastUpdateTime = time(nullptr);
-    DumpVolume(volume);
-    ReadPool(volume, ctx);
-    if (volume->FromPool == nullptr && StopRequested()) {
-        // The pool may not have been asked for.
-        FreeVolume(volume);
-        return RESULT_BAD_ARGUMENT;
-    }
+    auto volume = NewDevice<StorageVolume_t>(kBuilder, kVolumes);
+    if (volume == nullptr) return RESULT_NO_MEMORY;
+    if (!ReadParts(volume.get(), ctx, devInst, devOp)) return RESULT_BAD_ARGUMENT;
+    DumpVolume(volume.get());
+    ReadPool(volume.get(), ctx);
+    // After a stop the pool may not have been asked for.
+    if (volume->FromPool == nullptr && StopRequested()) return RESULT_BAD_ARGUMENT;
 
-    const int rc = Insert(ctrl, volume);
-    // Only the block: the copies and the clone of a volume turned away here stay behind, on
-    // purpose. Releasing them would add broker calls and log lines to this path.
-    if (rc != RESULT_OK) free(volume);
+    StorageVolume_t* const block = volume.release();
+    const int rc = PublishWithPool(ctrl, block);
+    // Only the block: what a volume that is turned away here holds stays behind. To release it
+    // would add broker calls and log lines that others do not expect here.
+    if (rc != RESULT_OK) free(block);
     return rc;
 }
 
@@ -180,7 +163,7 @@ int CheckAndUpdateVolumeInfo(const CMPIInstanceMI*, const CMPIContext* ctx, Raid
     syslog(LOG_DEBUG, "%s: ENTER. volume - %s\n", __func__, volume->ElementName);
     if (NeedUpdate(volume->LastUpdateTime, volume->UpdateEnabled)) {
         Update(ctrl, volume, ctx, devInst);
-        StampTime(ctrl->CtrlMutex, ctrl->VolumeUpdateTime);
+        StampTime(ctrl, kVolumes);
     }
     syslog(LOG_DEBUG, "%s, exit\n", __func__);
     return RESULT_OK;

@@ -43,9 +43,3 @@ inline time_t LoadTime(const time_t& time) {
 inline void StoreTime(time_t& time, time_t value) {
     __atomic_store_n(&time, value, __ATOMIC_RELAXED);
 }
-
-/// Stamps `field`, an update time of the controller that owns `ctrlMutex`, under that mutex.
-inline void StampTime(pthread_mutex_t& ctrlMutex, time_t& field) {
-    MutexGuard lock(ctrlMutex);
-    StoreTime(field, time(nullptr));
-}
