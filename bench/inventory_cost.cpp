@@ -6,6 +6,7 @@
 
 #include <CLI/CLI.hpp>
 #include <atomic>
+#include <cstdarg>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -25,18 +26,20 @@ using Clock = std::chrono::steady_clock;
 constexpr std::chrono::minutes kLimit{10};
 constexpr milliseconds kLook{5};
 
-/// Lines of the provider's log, counted by what they are made from.
+/// A line of the provider's log, and how often it came.
 struct CountedLine {
-    const char* format;
+    const char* text;
     std::atomic<int> count = 0;
 };
-CountedLine queueFull{"%s: FIFO full, waiting...\n"};
-CountedLine notEmpty{"%s: FIFO not empty, waiting...\n"};
-CountedLine walkDone{"%s, DONE...\n"};
+CountedLine queueFull{"BuildLogicalDeviceInfo: FIFO full, waiting...\n"};
+CountedLine notEmpty{"BuildLogicalDeviceInfo: FIFO not empty, waiting...\n"};
+CountedLine walkDone{"BuildLogicalDeviceInfo, DONE...\n"};
 
-void countLine(const char* format) {
+[[gnu::format(printf, 1, 0)]] void countLine(const char* format, va_list args) {
+    char text[256];
+    std::vsnprintf(text, sizeof text, format, args);
     for (CountedLine* line : {&queueFull, &notEmpty, &walkDone})
-        if (std::strcmp(format, line->format) == 0) ++line->count;
+        if (std::strcmp(text, line->text) == 0) ++line->count;
 }
 
 void waitFor(const std::function<bool()>& condition) {
@@ -73,10 +76,16 @@ void measure(int drives, milliseconds answerTime, const std::string& library) {
 
 // The provider's log is counted, not written. Which name it calls depends on how it was compiled.
 extern "C" void syslog(int, const char* format, ...) {
-    bench::countLine(format);
+    va_list args;
+    va_start(args, format);
+    bench::countLine(format, args);
+    va_end(args);
 }
 extern "C" void __syslog_chk(int, int, const char* format, ...) {
-    bench::countLine(format);
+    va_list args;
+    va_start(args, format);
+    bench::countLine(format, args);
+    va_end(args);
 }
 
 int main(int argc, char** argv) {

@@ -12,9 +12,7 @@ namespace {
 std::mutex sinkMutex;
 std::function<void(int, const std::string&)> currentSink;  // guarded by sinkMutex
 
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wformat-nonliteral"
-void deliver(int priority, const char* format, va_list args) {
+[[gnu::format(printf, 2, 0)]] void deliver(int priority, const char* format, va_list args) {
     if ((setlogmask(0) & LOG_MASK(LOG_PRI(priority))) == 0) return;
     char line[4096];
     vsnprintf(line, sizeof line, format, args);
@@ -23,7 +21,6 @@ void deliver(int priority, const char* format, va_list args) {
     const std::lock_guard lock(sinkMutex);
     if (currentSink) currentSink(LOG_PRI(priority), text);
 }
-#pragma GCC diagnostic pop
 
 }  // namespace
 

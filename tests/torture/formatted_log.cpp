@@ -11,15 +11,14 @@ namespace {
 std::atomic<std::uint64_t> lineCount = 0;
 std::atomic<std::uint64_t> turnedAwayCount = 0;
 
-#pragma GCC diagnostic push
-#pragma GCC diagnostic ignored "-Wformat-nonliteral"
-void format(const char* format, va_list args) {
+constexpr char kTurnedAway[] = "No pool associated with volume ";
+
+[[gnu::format(printf, 1, 0)]] void format(const char* format, va_list args) {
     char line[2048];
     vsnprintf(line, sizeof line, format, args);
     lineCount++;
-    if (strcmp(format, "No pool associated with volume %s\n") == 0) turnedAwayCount++;
+    if (strncmp(line, kTurnedAway, sizeof kTurnedAway - 1) == 0) turnedAwayCount++;
 }
-#pragma GCC diagnostic pop
 
 }  // namespace
 
