@@ -195,8 +195,8 @@ struct Chassis_t {
 };
 
 /// One RAID controller. Strings, paths and scalars are constant once the record is in
-/// RaidControllerList. The update times are read and written as relaxed atomics (LoadTime,
-/// StoreTime); those who stamp them after a build or update hold CtrlMutex.
+/// RaidControllerList. The update times are read and written as relaxed atomics (LoadShared,
+/// StoreShared); those who stamp them after a build or update hold CtrlMutex.
 struct RaidController_t {
     pthread_mutex_t CtrlMutex;  ///< guards membership and changing fields of all device lists
     CMPIObjectPath* PortControllerOp;

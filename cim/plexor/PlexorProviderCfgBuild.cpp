@@ -13,7 +13,7 @@ char* CloneDeviceID(const DeviceKind& kind, const CMPIInstance* inst, const CMPI
 
 int AppendRecord(RaidController_t* ctrl, const DeviceKind& kind, void* record) {
     const int rc = AddEntryAtListTail(ctrl->*kind.list, record);
-    if (rc == RESULT_OK) StoreTime(ctrl->*kind.updateTime, time(nullptr));
+    if (rc == RESULT_OK) StoreShared(ctrl->*kind.updateTime, time(nullptr));
     return rc;
 }
 
@@ -32,7 +32,7 @@ int PublishRecord(const char* builder, RaidController_t* ctrl, const DeviceKind&
 
 void StampTime(RaidController_t* ctrl, const DeviceKind& kind) {
     MutexGuard lock(ctrl->CtrlMutex);
-    StoreTime(ctrl->*kind.updateTime, time(nullptr));
+    StoreShared(ctrl->*kind.updateTime, time(nullptr));
 }
 
 int NeedUpdate(time_t, unsigned char) {

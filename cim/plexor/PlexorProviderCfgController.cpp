@@ -119,7 +119,7 @@ int BuildController(const CMPIContext* ctx, const CMPIInstance* inst) {
     }
     ReadPackage(ctrl, ctx);
     ReadSoftware(ctrl, ctx);
-    StoreTime(ctrl->ControllerUpdateTime, time(nullptr));
+    StoreShared(ctrl->ControllerUpdateTime, time(nullptr));
     DumpController(ctrl);
 
     int rc = RESULT_OK;
@@ -167,9 +167,9 @@ int BuildControllerInfo(const CMPIInstanceMI*, const CMPIContext* ctx, Array_t* 
 int CheckAndUpdateControllerInfo(const CMPIInstanceMI*, const CMPIContext*, RaidController_t* ctrl,
                                  void*, CMPIInstance*) {
     syslog(LOG_DEBUG, "%s, enter...\n", __func__);
-    if (NeedUpdate(LoadTime(ctrl->ControllerUpdateTime), ctrl->UpdateEnabled)) {
+    if (NeedUpdate(LoadShared(ctrl->ControllerUpdateTime), ctrl->UpdateEnabled)) {
         MutexGuard lock(ctrl->CtrlMutex);
-        StoreTime(ctrl->ControllerUpdateTime, time(nullptr));
+        StoreShared(ctrl->ControllerUpdateTime, time(nullptr));
     }
     syslog(LOG_DEBUG, "%s, exit.\n", __func__);
     return RESULT_OK;

@@ -17,8 +17,8 @@ std::atomic<unsigned int> __DoneLife = 0;  // whose inventory set ThreadActivity
 /// One moment for all classes, so that all become due together.
 void StampAll(RaidController_t* ctrl) {
     const time_t now = time(nullptr);
-    for (const DeviceKind* kind : kDeviceKinds) StoreTime(ctrl->*kind->updateTime, now);
-    StoreTime(ctrl->ControllerUpdateTime, now);
+    for (const DeviceKind* kind : kDeviceKinds) StoreShared(ctrl->*kind->updateTime, now);
+    StoreShared(ctrl->ControllerUpdateTime, now);
 }
 
 /// Opens the gate, unless a later life has closed it for itself.
@@ -35,7 +35,7 @@ void OpenGate() {
 
 void CloseInventoryGate() {
     // A word that has been reset is nobody's any more.
-    if (__atomic_load_n(&ThreadActivityDone, __ATOMIC_RELAXED) == 0) __DoneLife = 0;
+    if (LoadShared(ThreadActivityDone) == 0) __DoneLife = 0;
 }
 
 bool InventoryDone() {

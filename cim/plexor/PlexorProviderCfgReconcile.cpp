@@ -83,7 +83,7 @@ void ApplyResults(const Refresh& refresh, const CMPIEnumeration* results) {
 
 /// Logs the due test's outcome and gives it.
 bool IsDue(const Refresh& refresh, const pthread_mutex_t& classMutex, time_t last, time_t now) {
-    const bool due = now >= last + LoadTime(StateUpdateInterval);
+    const bool due = now >= last + LoadShared(StateUpdateInterval);
     constexpr const char kSkip[] =
         "%s(%p): Action %d, last %lu, now %lu, interval %ld secs, ctrl %s, locker %p, skip";
     constexpr const char kGo[] =
@@ -102,14 +102,14 @@ void Reconcile(const Refresh& refresh) {
     ClassLock lock(refresh.ctrl, classMutex, action.AssociatedClassName,
                    ClassLock::Patience::kLimited);
     if (!lock.Locked()) return;
-    if (!IsDue(refresh, classMutex, LoadTime(updateTime), time(nullptr))) return;
+    if (!IsDue(refresh, classMutex, LoadShared(updateTime), time(nullptr))) return;
 
     CMPIEnumeration* results =
         QueryAssociators({kProcess, refresh.ctx, refresh.ctrl->ControllerOp,
                           action.AssociationClassName, action.AssociatedClassName});
     if (results != nullptr) ApplyResults(refresh, results);
     // Also after a failure: the vendor is not asked again before the next interval.
-    StoreTime(updateTime, time(nullptr));
+    StoreShared(updateTime, time(nullptr));
     lock.Unlock();
 }
 
@@ -143,8 +143,8 @@ int HandleDeviceConfigChange(const CMPIInstanceMI* mi, const CMPIContext*, RaidC
         syslog(LOG_ERR, "%s: wrong action %d, ignored\n", __func__, action);
         return RESULT_OK;
     }
-    const time_t last = LoadTime(ctrl->*kind->updateTime);
-    if (now - last < LoadTime(StateUpdateInterval)) {
+    const time_t last = LoadShared(ctrl->*kind->updateTime);
+    if (now - last < LoadShared(StateUpdateInterval)) {
         syslog(LOG_DEBUG, "%s: ctrl %s, action %d, last %lu, now %lu, skip\n", __func__,
                ctrl->DeviceID, action, static_cast<unsigned long>(last),
                static_cast<unsigned long>(now));
@@ -167,7 +167,7 @@ void DoDeviceConfigChange(CMPIContext* ctx, void* args) {
 int ProcessDeviceConfigChange(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                               RaidController_t* ctrl, int action) {
     syslog(LOG_DEBUG, "%s, ENTER(%d)...\n", __func__, action);
-    if (time(nullptr) >= LoadTime(InitCompleteTime) + kGraceSeconds) {
+    if (time(nullptr) >= LoadShared(InitCompleteTime) + kGraceSeconds) {
         const Chain chain(action);
         for (int i = chain.length - 1; i >= 0 && !StopRequested(); i--) {
             Reconcile({mi, ctx, ctrl, *chain.kinds[i]});

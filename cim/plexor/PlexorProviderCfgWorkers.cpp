@@ -16,12 +16,11 @@ pthread_mutex_t PlexorThreadMutex = PTHREAD_MUTEX_INITIALIZER;
 pthread_cond_t PlexorThreadCond = PTHREAD_COND_INITIALIZER;
 unsigned int ActiveThreads = 0;
 unsigned int TerminateThread = 0;
-time_t StateUpdateInterval = 20;
+time_t StateUpdateInterval = kDefaultIntervalSeconds;
 
 namespace {
 
 constexpr int kThreadCount = sizeof PlexorThreads / sizeof PlexorThreads[0];
-constexpr int kDefaultIntervalSeconds = 20;
 constexpr unsigned int kExitSeconds = 3;  // what the workers get to leave
 constexpr time_t kJoinLimitSeconds = 1;
 constexpr time_t kMissedSignalSeconds = 1;
@@ -232,7 +231,7 @@ bool JoinWorkers() {
 void ForgetEarlierLives() {
     __LivingWorkers = 0;
     // A word that has been reset is nobody's any more.
-    if (__atomic_load_n(&TerminateThread, __ATOMIC_RELAXED) == 0) __TerminatedLife = 0;
+    if (LoadShared(TerminateThread) == 0) __TerminatedLife = 0;
     CloseInventoryGate();
 }
 
@@ -293,10 +292,10 @@ void WakeQuiesce() {
 void InitPlexorThreads(const CMPIContext* ctx) {
     const int seconds = GetSampelInterval();
     if (LifeGuard().MemberOfEnded()) return;
-    StoreTime(StateUpdateInterval, seconds < 1 ? kDefaultIntervalSeconds : seconds);
+    StoreShared(StateUpdateInterval, seconds < 1 ? kDefaultIntervalSeconds : seconds);
     // At error level so that it reaches the log whatever the process masks.
     syslog(LOG_ERR, "%s: Sample interval was set to %lu secs\n", __func__,
-           static_cast<unsigned long>(LoadTime(StateUpdateInterval)));
+           static_cast<unsigned long>(LoadShared(StateUpdateInterval)));
     if (!PrepareThreads()) return;
     for (int i = 0; i < kThreadCount; i++) {
         StartWorker(i, ctx);

@@ -30,14 +30,14 @@ namespace {
 /// After the end of the life the mark is the cleanup's, or a later life's.
 void MarkInitialized(int value) {
     const LifeGuard life;
-    if (life.Stands()) __atomic_store_n(&_ProviderInitialized, value, __ATOMIC_RELAXED);
+    if (life.Stands()) StoreShared(_ProviderInitialized, value);
 }
 
 /// Factory calls on several threads may be here at once.
 void WaitDebug() {
     // Nobody who starts a set-user-id process may make it wait.
     const int wait = secure_getenv("WAIT_PROC") != nullptr ? 1 : 0;
-    __atomic_store_n(&waitDebug, wait, __ATOMIC_RELAXED);
+    StoreShared(waitDebug, wait);
     if (!wait) {
         syslog(LOG_DEBUG, "Current process:pid=%d, ppid=%d\n", getpid(), getppid());
         return;
@@ -46,7 +46,7 @@ void WaitDebug() {
     do {
         sleep(1);
         syslog(LOG_DEBUG, "Waiting for hostdbgd attach:pid=%d, ppid=%d\n", getpid(), getppid());
-    } while (__atomic_load_n(&waitDebug, __ATOMIC_RELAXED));
+    } while (LoadShared(waitDebug));
 }
 
 void ReleaseIdentity() {
@@ -90,7 +90,7 @@ public:
         if (!life.Stands()) return;
         *RaidControllerList = {nullptr, nullptr, 0};
         GiveUpSystemInfo();
-        __atomic_store_n(&_ProviderInitialized, 0, __ATOMIC_RELAXED);
+        StoreShared(_ProviderInitialized, 0);
     }
     Cancellation(const Cancellation&) = delete;
     Cancellation& operator=(const Cancellation&) = delete;
@@ -139,16 +139,16 @@ constexpr CMPIStatus kNotSupported = {CMPI_RC_ERR_NOT_SUPPORTED, nullptr};
 }  // namespace
 
 bool IsInitialized() {
-    return __atomic_load_n(&_ProviderInitialized, __ATOMIC_RELAXED) != 0;
+    return LoadShared(_ProviderInitialized) != 0;
 }
 
 CMPIInstanceMI* PlexorProvider_Create_InstanceMI(const CMPIBroker* brkr, const CMPIContext* ctx,
                                                  CMPIStatus*) {
     static CMPIInstanceMI mi = {nullptr, &instMIFT__};
     FactoryCall call;
-    __atomic_store_n(&Broker, brkr, __ATOMIC_RELAXED);
+    StoreShared(Broker, brkr);
     PlexorProviderInit(&mi, ctx, call);
-    StoreTime(InitCompleteTime, time(nullptr));
+    StoreShared(InitCompleteTime, time(nullptr));
     return &mi;
 }
 

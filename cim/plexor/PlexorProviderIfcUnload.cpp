@@ -18,7 +18,7 @@ constexpr time_t kLeaveSecondsTerminating = 3;
 
 /// Whether the provider has been idle for long enough.
 int CanUnload() {
-    return time(nullptr) >= LoadTime(NextUnloadTime) ? 1 : 0;
+    return time(nullptr) >= LoadShared(NextUnloadTime) ? 1 : 0;
 }
 
 bool HasControllers() {
@@ -62,7 +62,7 @@ void Unload(CleanupTurn& turn) {
         GiveUpInventory(user);
     }
     CleanupPlexorThreads();
-    __atomic_store_n(&_ProviderInitialized, 0, __ATOMIC_RELAXED);
+    StoreShared(_ProviderInitialized, 0);
     if (!turn.AwaitNewcomers()) KeepLibraryMapped();
 }
 
@@ -78,12 +78,12 @@ CMPIrc TryUnload(CMPIBoolean terminating) {
 }  // namespace
 
 void ResetNextUnloadTime() {
-    unsigned int minutes = __atomic_load_n(&IdleTimeBeforeTerminating, __ATOMIC_RELAXED);
+    unsigned int minutes = LoadShared(IdleTimeBeforeTerminating);
     if (minutes > kMaxIdleMinutes) {
         minutes = kMaxIdleMinutes;
-        __atomic_store_n(&IdleTimeBeforeTerminating, minutes, __ATOMIC_RELAXED);
+        StoreShared(IdleTimeBeforeTerminating, minutes);
     }
-    StoreTime(NextUnloadTime, time(nullptr) + static_cast<time_t>(minutes) * kSecondsPerMinute);
+    StoreShared(NextUnloadTime, time(nullptr) + static_cast<time_t>(minutes) * kSecondsPerMinute);
 }
 
 CMPIStatus PlexorProviderCleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolean terminating) {
@@ -91,7 +91,7 @@ CMPIStatus PlexorProviderCleanup(CMPIInstanceMI*, const CMPIContext*, CMPIBoolea
     const CMPIrc rc = TryUnload(terminating);
     if (rc == CMPI_RC_DO_NOT_UNLOAD) {
         syslog(LOG_DEBUG, "%s: idle timer(%d) has not expired, don't unload\n", __func__,
-               static_cast<int>(__atomic_load_n(&IdleTimeBeforeTerminating, __ATOMIC_RELAXED)));
+               static_cast<int>(LoadShared(IdleTimeBeforeTerminating)));
         return {rc, nullptr};
     }
     syslog(LOG_DEBUG, "%s: EXIT\n", __func__);

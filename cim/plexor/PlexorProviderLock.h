@@ -15,6 +15,8 @@
 #include <pthread.h>
 #include <time.h>
 
+#include <type_traits>
+
 /// Holds a mutex for a scope, or until Unlock. A thread that is cancelled gives it back, too.
 class MutexGuard {
 public:
@@ -36,10 +38,13 @@ private:
     bool locked_;
 };
 
-// Times that are read on request threads without a lock. Only their own value matters, so relaxed.
-inline time_t LoadTime(const time_t& time) {
-    return __atomic_load_n(&time, __ATOMIC_RELAXED);
+// Exported words that one thread writes while another reads them without a lock. They keep their
+// plain types for whoever looks at them; only their own value matters, so relaxed.
+template <typename Word>
+std::remove_cv_t<Word> LoadShared(const Word& word) {
+    return __atomic_load_n(&word, __ATOMIC_RELAXED);
 }
-inline void StoreTime(time_t& time, time_t value) {
-    __atomic_store_n(&time, value, __ATOMIC_RELAXED);
+template <typename Word>
+void StoreShared(Word& word, std::type_identity_t<std::remove_cv_t<Word>> value) {
+    __atomic_store_n(&word, value, __ATOMIC_RELAXED);
 }

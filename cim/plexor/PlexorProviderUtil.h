@@ -4,6 +4,9 @@
 
 #include "PlexorProvider.h"
 
+/// How often the vendor is asked about a class when the host does not say otherwise.
+constexpr int kDefaultIntervalSeconds = 20;
+
 /// Forgets the host's names without releasing them: somebody may still read them.
 void GiveUpSystemInfo();
 

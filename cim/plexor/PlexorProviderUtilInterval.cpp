@@ -7,7 +7,6 @@
 
 namespace {
 
-constexpr int kDefaultIntervalSeconds = 20;
 constexpr const char kIntervalOption[] = "/UserVars/CIMtvx_plexorProviderPollingInterval";
 
 }  // namespace

@@ -1,8 +1,6 @@
 // What differs between object managers, in one place.
 #include "PlexorProviderUtilManager.h"
 
-#include <atomic>
-
 #include "PlexorProviderUtil.h"
 #include "PlexorProviderUtilLife.h"
 
@@ -116,13 +114,13 @@ void EndUnusedContext(CMPIContext* prepared) {
 void CompleteKeys(CMPIInstance* inst, const CMPIObjectPath* path, KeyCopying& copying) {
     if (!IsStandardManager()) return;
     const unsigned int life = PresentLife();
-    if (__atomic_load_n(&copying.copiedInLife, __ATOMIC_RELAXED) == life) return;
+    if (copying.copiedInLife == life) return;
     bool copied = true;
     const unsigned int count = path->ft->getKeyCount(path, nullptr);
     for (unsigned int i = 0; i < count; i++) {
         if (CompleteKey(inst, path, i)) copied = false;
     }
-    if (copied) __atomic_store_n(&copying.copiedInLife, life, __ATOMIC_RELAXED);
+    if (copied) copying.copiedInLife = life;
 }
 
 void SetFirstString(CMPIArray* array, const char* text) {

@@ -3,6 +3,8 @@
 // the provider's own host nothing.
 #pragma once
 
+#include <atomic>
+
 #include "PlexorProvider.h"
 
 /// The span of one work item on a worker's thread. What the item obtains from the broker is given
@@ -38,7 +40,7 @@ void EndUnusedContext(CMPIContext* prepared);
 
 /// What the instances of one class have shown about the manager's `newInstance`.
 struct KeyCopying {
-    unsigned int copiedInLife = 0;  ///< life in which it was seen to copy the keys; atomic
+    std::atomic<unsigned int> copiedInLife = 0;  ///< life in which it was seen to copy the keys
 };
 
 /// Sets the instance's key properties from its path, on managers whose `newInstance` left them

@@ -1,8 +1,9 @@
 // Reading the broker's objects without trusting them.
+#include "PlexorProviderLock.h"
 #include "PlexorProviderUtil.h"
 
 const CMPIBroker* CurrentBroker() {
-    return __atomic_load_n(&Broker, __ATOMIC_RELAXED);
+    return LoadShared(Broker);
 }
 
 bool LogEnabled(int priority) {

@@ -1,6 +1,7 @@
 // The identity of the host that contains everything the provider serves.
 #include <stdlib.h>
 
+#include "PlexorProviderLock.h"
 #include "PlexorProviderUtil.h"
 #include "PlexorProviderUtilLife.h"
 
@@ -32,24 +33,17 @@ CMPIInstance* FindHostInstance(const CMPIContext* ctx, const CMPIObjectPath* pat
     return nullptr;
 }
 
-// A request that a cleanup could not wait for may still read the names.
-
-char* LoadName(char* const& field) {
-    return __atomic_load_n(&field, __ATOMIC_RELAXED);
-}
-
-void SetName(char*& field, char* name) {
-    __atomic_store_n(&field, name, __ATOMIC_RELAXED);
-}
+// A request that a cleanup could not wait for may still read the names, hence LoadShared and
+// StoreShared.
 
 void StoreName(char*& field, const CMPIInstance* host, const char* property) {
     const char* text = ReadString(host, property);
-    if (text != nullptr) SetName(field, StringClone(text));
+    if (text != nullptr) StoreShared(field, StringClone(text));
 }
 
 void ReleaseName(char*& field) {
     free(field);
-    SetName(field, nullptr);
+    StoreShared(field, nullptr);
 }
 
 /// False after a stop: the names are not this thread's any more.
@@ -93,17 +87,17 @@ void ReleaseSystemInfo() {
 }
 
 void GiveUpSystemInfo() {
-    SetName(__SystemClassName, nullptr);
-    SetName(__HostName, nullptr);
-    SetName(__SystemName, nullptr);
+    StoreShared(__SystemClassName, nullptr);
+    StoreShared(__HostName, nullptr);
+    StoreShared(__SystemName, nullptr);
 }
 
 const char* GetHostName() {
-    return LoadName(__HostName);
+    return LoadShared(__HostName);
 }
 const char* GetSystemName() {
-    return LoadName(__SystemName);
+    return LoadShared(__SystemName);
 }
 const char* GetSystemClassName() {
-    return LoadName(__SystemClassName);
+    return LoadShared(__SystemClassName);
 }

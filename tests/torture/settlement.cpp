@@ -21,9 +21,9 @@ bool workersIdle() {
 }
 
 bool refreshedSince(const RaidController_t& ctrl, time_t mark) {
-    return LoadTime(ctrl.PoolUpdateTime) > mark && LoadTime(ctrl.DiskUpdateTime) > mark &&
-           LoadTime(ctrl.VolumeUpdateTime) > mark && LoadTime(ctrl.PortUpdateTime) > mark &&
-           LoadTime(ctrl.BatteryUpdateTime) > mark;
+    return LoadShared(ctrl.PoolUpdateTime) > mark && LoadShared(ctrl.DiskUpdateTime) > mark &&
+           LoadShared(ctrl.VolumeUpdateTime) > mark && LoadShared(ctrl.PortUpdateTime) > mark &&
+           LoadShared(ctrl.BatteryUpdateTime) > mark;
 }
 
 bool allRefreshedSince(time_t mark) {
