@@ -5,6 +5,7 @@
 
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderCfgClassLock.h"
+#include "PlexorProviderCfgItems.h"
 #include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
@@ -52,13 +53,9 @@ Thread_Args_t* MakeItem(const CMPIInstanceMI* mi, RaidController_t* ctrl, const 
                         const CMPIInstance* inst, int code) {
     auto* item = NewRecord<Thread_Args_t>();
     if (item == nullptr) return nullptr;
-    item->Func = ProcessBuildLogicalDeviceInfo;
-    item->Arg0 = reinterpret_cast<uintptr_t>(ctrl);
-    item->Arg1 = reinterpret_cast<uintptr_t>(mi);
-    item->Arg3 = reinterpret_cast<uintptr_t>(ClonePath(op));
-    item->Arg4 = reinterpret_cast<uintptr_t>(CloneInstance(inst));
-    item->Arg5 = static_cast<uintptr_t>(code);
-    if (item->Arg3 != 0 && item->Arg4 != 0) return item;
+    const DeviceWork work = {ctrl, mi, ClonePath(op), CloneInstance(inst), code};
+    Pack(item, work);
+    if (work.op != nullptr && work.inst != nullptr) return item;
     ReleaseDeviceItem(item);
     return nullptr;
 }
@@ -126,30 +123,22 @@ int BuildLogicalDeviceInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
 }
 
 void ReleaseDeviceItem(Thread_Args_t* item) {
-    auto* op = reinterpret_cast<CMPIObjectPath*>(item->Arg3);
-    auto* inst = reinterpret_cast<CMPIInstance*>(item->Arg4);
-    free(item);
-    ReleasePath(op);
-    ReleaseInstance(inst);
+    auto work = TakeWork<DeviceWork>(item);
+    ReleasePath(work.op);
+    ReleaseInstance(work.inst);
 }
 
 void ProcessBuildLogicalDeviceInfo(CMPIContext* ctx, void* args) {
-    auto* item = static_cast<Thread_Args_t*>(args);
-    auto* ctrl = reinterpret_cast<RaidController_t*>(item->Arg0);
-    auto* mi = reinterpret_cast<const CMPIInstanceMI*>(item->Arg1);
-    auto* op = reinterpret_cast<CMPIObjectPath*>(item->Arg3);
-    auto* inst = reinterpret_cast<CMPIInstance*>(item->Arg4);
-    const int code = static_cast<int>(item->Arg5);
-    free(item);
-
-    const DeviceKind* kind = FindKindByCode(code);
+    auto work = TakeWork<DeviceWork>(args);
+    const DeviceKind* kind = FindKindByCode(work.deviceCode);
     if (kind != nullptr) {
-        ClassLock lock(ctrl, ctrl->*kind->classMutex, kind->action.AssociatedClassName);
-        if (lock.Locked()) kind->action.BuildFunc(mi, ctx, ctrl, inst, op);
+        const ConfigAction_t& action = kind->action;
+        ClassLock lock(work.ctrl, work.ctrl->*kind->classMutex, action.AssociatedClassName);
+        if (lock.Locked()) action.BuildFunc(work.mi, ctx, work.ctrl, work.inst, work.op);
         lock.Unlock();
     } else {
-        syslog(LOG_ERR, "%s: invalid type %d\n", __func__, code);
+        syslog(LOG_ERR, "%s: invalid type %d\n", __func__, work.deviceCode);
     }
-    ReleasePath(op);
-    ReleaseInstance(inst);
+    ReleasePath(work.op);
+    ReleaseInstance(work.inst);
 }

@@ -5,6 +5,7 @@
 #include <atomic>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgItems.h"
 #include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
@@ -49,8 +50,7 @@ int BuildDeviceInfoAsync(const CMPIInstanceMI* mi, const CMPIContext*) {
         syslog(LOG_ERR, "%s, failed to allocate threadArgs\n", __func__);
         return RESULT_NO_MEMORY;
     }
-    item->Func = DoBuildDeviceInfoAsync;
-    item->Arg0 = reinterpret_cast<uintptr_t>(mi);
+    Pack(item, InventoryWork{mi});
     const int rc = QueueItem(item);
     if (rc == RESULT_FIFO_FULL) {
         free(item);
@@ -63,10 +63,7 @@ int BuildDeviceInfoAsync(const CMPIInstanceMI* mi, const CMPIContext*) {
 }
 
 void DoBuildDeviceInfoAsync(CMPIContext* ctx, void* args) {
-    auto* item = static_cast<Thread_Args_t*>(args);
-    auto* mi = reinterpret_cast<const CMPIInstanceMI*>(item->Arg0);
-    free(item);
-
+    const CMPIInstanceMI* mi = TakeWork<InventoryWork>(args).mi;
     const List_Entry_t* entry = StopRequested() ? nullptr : RaidControllerList->Head;
     for (; entry != nullptr && !StopRequested(); entry = entry->Next) {
         auto* ctrl = static_cast<RaidController_t*>(entry->Data);

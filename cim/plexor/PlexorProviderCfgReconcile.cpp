@@ -3,6 +3,7 @@
 
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderCfgClassLock.h"
+#include "PlexorProviderCfgItems.h"
 #include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
@@ -117,10 +118,7 @@ void Reconcile(const Refresh& refresh) {
 int QueueRefresh(const CMPIInstanceMI* mi, RaidController_t* ctrl, int action) {
     auto* item = NewRecord<Thread_Args_t>();
     if (item == nullptr) return RESULT_OK;
-    item->Func = DoDeviceConfigChange;
-    item->Arg0 = reinterpret_cast<uintptr_t>(mi);
-    item->Arg2 = reinterpret_cast<uintptr_t>(ctrl);
-    item->Arg3 = static_cast<uintptr_t>(action);
+    Pack(item, RefreshWork{mi, ctrl, action});
     const int rc = QueueItem(item);
     if (rc != RESULT_OK) free(item);
     if (rc != RESULT_FIFO_FULL) pthread_cond_signal(&PlexorThreadCond);
@@ -156,12 +154,8 @@ int HandleDeviceConfigChange(const CMPIInstanceMI* mi, const CMPIContext*, RaidC
 }
 
 void DoDeviceConfigChange(CMPIContext* ctx, void* args) {
-    auto* item = static_cast<Thread_Args_t*>(args);
-    auto* mi = reinterpret_cast<const CMPIInstanceMI*>(item->Arg0);
-    auto* ctrl = reinterpret_cast<RaidController_t*>(item->Arg2);
-    const int action = static_cast<int>(item->Arg3);
-    free(item);
-    ProcessDeviceConfigChange(mi, ctx, ctrl, action);
+    const auto work = TakeWork<RefreshWork>(args);
+    ProcessDeviceConfigChange(work.mi, ctx, work.ctrl, work.action);
 }
 
 int ProcessDeviceConfigChange(const CMPIInstanceMI* mi, const CMPIContext* ctx,

@@ -6,6 +6,7 @@
 #include <atomic>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgItems.h"
 #include "PlexorProviderLock.h"
 #include "PlexorProviderUtilManager.h"
 
@@ -191,10 +192,7 @@ void StartWorker(int i, const CMPIContext* ctx) {
     const CMPIBroker* broker = CurrentBroker();
     auto* args = NewRecord<Thread_Args_t>();
     CMPIContext* prepared = broker->bft->prepareAttachThread(broker, ctx);
-    if (args != nullptr && prepared != nullptr) {
-        args->Arg0 = static_cast<uintptr_t>(i);
-        args->Arg1 = reinterpret_cast<uintptr_t>(prepared);
-    }
+    if (args != nullptr) Pack(args, WorkerStart{i, prepared});
     if (CreateThread(i, prepared != nullptr ? args : nullptr)) return;
     free(args);
     if (prepared != nullptr) EndUnusedContext(prepared);
@@ -305,11 +303,7 @@ void InitPlexorThreads(const CMPIContext* ctx) {
 }
 
 void* PlexorThread(void* args) {
-    auto* start = static_cast<Thread_Args_t*>(args);
-    const long index = static_cast<long>(start->Arg0);
-    auto* ctx = reinterpret_cast<CMPIContext*>(start->Arg1);
-    free(start);
-
+    const auto [index, ctx] = TakeWork<WorkerStart>(args);
     const CMPIBroker* broker = CurrentBroker();
     const LifeMember member;
     const LivingWorker living;
