@@ -6,6 +6,15 @@
 /// Whether an initialisation has been started and did not fail.
 bool IsInitialized();
 
+// Class names, and what the keys of their instances are made of.
+constexpr char kControllerClass[] = "Tovexa_PlexorController";
+constexpr char kControllerKey[] = "Name";
+constexpr char kControllerPrefix[] = "tvxController";
+constexpr char kSoftwareClass[] = "Tovexa_PlexorSoftwareIdentity";
+constexpr char kSoftwareKey[] = "InstanceID";
+constexpr char kSoftwarePrefix[] = "tovexa:ControllerSoftware";
+constexpr char kDeviceKey[] = "DeviceID";  // of all device classes
+
 // Keys. The caller frees the strings; null after a failed copy (logged) or, for the retrieval
 // functions, a negative code with nothing stored.
 

@@ -25,6 +25,12 @@ char* CopyChars(const char* text, size_t length) {
     return copy;
 }
 
+/// A key as the client gave it.
+struct ClientKey {
+    const char* text;
+    const char* rest;  ///< what follows the prefix; null for a key that is refused
+};
+
 /// What follows the prefix in a key; null (silently) for another prefix, and null (logged) when
 /// nothing follows.
 const char* AfterPrefix(const char* key, const char* prefix) {
@@ -33,6 +39,19 @@ const char* AfterPrefix(const char* key, const char* prefix) {
     if (key[length] != '\0') return key + length;
     syslog(LOG_ERR, "No valid info in key key %s\n", key);
     return nullptr;
+}
+
+/// Reads a key of the path; an absent one is logged and refused.
+ClientKey ReadClientKey(const CMPIObjectPath* cop, const char* keyProperty, const char* prefix) {
+    CMPIStatus status = {CMPI_RC_OK, nullptr};
+    const CMPIData data = cop->ft->getKey(cop, keyProperty, &status);
+    if (status.rc != CMPI_RC_OK) {
+        syslog(LOG_ERR, "%s key not found in object path %s\n", keyProperty,
+               PathText(LOG_ERR, cop));
+        return {nullptr, nullptr};
+    }
+    const char* text = ValueText(data);
+    return {text, AfterPrefix(text, prefix)};
 }
 
 /// The underscore between the controller's and the device's identifier; null (logged) when the text
@@ -71,16 +90,16 @@ char* MakeLogicalDeviceID(const char* ctrlID, const char* devID, const char* pre
 
 void FillControllerObjectPath(CMPIObjectPath* cop, RaidController_t* ctrl) {
     syslog(LOG_DEBUG, "%s: DeviceID - %s\n", __func__, ctrl->DeviceID);
-    AddKey(cop, "CreationClassName", "Tovexa_PlexorController");
-    char* name = MakeDeviceID(ctrl->DeviceID, "tvxController");
-    AddKey(cop, "Name", name);
+    AddKey(cop, "CreationClassName", kControllerClass);
+    char* name = MakeDeviceID(ctrl->DeviceID, kControllerPrefix);
+    AddKey(cop, kControllerKey, name);
     free(name);
 }
 
 void FillSoftwareIdentityObjectPath(CMPIObjectPath* cop, RaidController_t* ctrl) {
     syslog(LOG_DEBUG, "%s: DeviceID - %s\n", __func__, ctrl->DeviceID);
-    char* id = MakeDeviceID(ctrl->DeviceID, "tovexa:ControllerSoftware");
-    AddKey(cop, "InstanceID", id);
+    char* id = MakeDeviceID(ctrl->DeviceID, kSoftwarePrefix);
+    AddKey(cop, kSoftwareKey, id);
     free(id);
 }
 
@@ -90,21 +109,14 @@ void FillLogicalDeviceObjectPath(CMPIObjectPath* cop, const char* deviceID,
     AddKey(cop, "SystemCreationClassName", GetSystemClassName());
     AddKey(cop, "SystemName", GetSystemName());
     AddKey(cop, "CreationClassName", creationClassName);
-    AddKey(cop, "DeviceID", deviceID);
+    AddKey(cop, kDeviceKey, deviceID);
 }
 
 int RetrieveDeviceID(const CMPIObjectPath* cop, const char* keyProperty, const char* prefix,
                      char** deviceID) {
-    CMPIStatus status = {CMPI_RC_OK, nullptr};
-    const CMPIData data = cop->ft->getKey(cop, keyProperty, &status);
-    if (status.rc != CMPI_RC_OK) {
-        syslog(LOG_ERR, "%s key not found in object path %s\n", keyProperty,
-               PathText(LOG_ERR, cop));
-        return RESULT_NOT_FOUND;
-    }
-    const char* rest = AfterPrefix(ValueText(data), prefix);
-    if (rest == nullptr) return RESULT_NOT_FOUND;
-    char* copy = CopyChars(rest, strlen(rest));
+    const ClientKey key = ReadClientKey(cop, keyProperty, prefix);
+    if (key.rest == nullptr) return RESULT_NOT_FOUND;
+    char* copy = CopyChars(key.rest, strlen(key.rest));
     if (copy == nullptr) return RESULT_NO_MEMORY;
     syslog(LOG_DEBUG, "%s: s1 - %s\n", __func__, copy);
     *deviceID = copy;
@@ -113,19 +125,11 @@ int RetrieveDeviceID(const CMPIObjectPath* cop, const char* keyProperty, const c
 
 int RetrieveControllerAndDeviceIDs(const CMPIObjectPath* cop, const char* prefix, char** ctrlID,
                                    char** deviceID) {
-    CMPIStatus status = {CMPI_RC_OK, nullptr};
-    const CMPIData data = cop->ft->getKey(cop, "DeviceID", &status);
-    if (status.rc != CMPI_RC_OK) {
-        syslog(LOG_ERR, "DeviceID key not found in object path %s\n", PathText(LOG_ERR, cop));
-        return RESULT_NOT_FOUND;
-    }
-    const char* key = ValueText(data);
-    const char* rest = AfterPrefix(key, prefix);
-    if (rest == nullptr) return RESULT_NOT_FOUND;
-    const char* separator = FindSeparator(key, rest);
+    const ClientKey key = ReadClientKey(cop, kDeviceKey, prefix);
+    const char* separator = key.rest != nullptr ? FindSeparator(key.text, key.rest) : nullptr;
     if (separator == nullptr) return RESULT_NOT_FOUND;
 
-    char* controller = CopyChars(rest, static_cast<size_t>(separator - rest));
+    char* controller = CopyChars(key.rest, static_cast<size_t>(separator - key.rest));
     if (controller == nullptr) return RESULT_NO_MEMORY;
     char* device = CopyChars(separator + 1, strlen(separator + 1));
     if (device == nullptr) {

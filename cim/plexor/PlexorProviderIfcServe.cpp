@@ -2,6 +2,7 @@
 // answered from the cache; a refresh that a request causes shows in later answers.
 #include <stdlib.h>
 
+#include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderIfc.h"
 #include "PlexorProviderIfcTurns.h"
 #include "PlexorProviderLock.h"
@@ -9,17 +10,15 @@
 
 namespace {
 
-/// A class that clients can ask for. A class with a `list` is a logical device, one without shows
-/// the controllers themselves.
+/// A class that clients can ask for: the devices of a kind, or the controllers themselves.
 struct ServedClass {
     const char* name;
     const char* keyPrefix;
-    const char* keyName;  ///< key that names the instance
-    void (*fillControllerPath)(CMPIObjectPath* cop, RaidController_t* ctrl);
-    List_t* RaidController_t::*list;
-    const char* (*deviceId)(const void* record);
+    const char* keyName;     ///< key that names the instance
+    const DeviceKind* kind;  ///< null: the controllers
+    void (*fillControllerPath)(CMPIObjectPath* cop, RaidController_t* ctrl);  ///< controllers only
+    const char* (*deviceId)(const void* record);                              ///< devices only
     void (*render)(CMPIInstance* inst, RaidController_t* ctrl, void* record);
-    int action;
 };
 
 // The table's view of the typed functions.
@@ -44,21 +43,48 @@ void RenderDevice(CMPIInstance* inst, RaidController_t* ctrl, void* record) {
 
 // In the order in which a request's class is tested.
 constexpr ServedClass kServedClasses[] = {
-    {"Tovexa_PlexorController", "tvxController", "Name", FillControllerObjectPath, nullptr, nullptr,
-     RenderController, ACTION_NONE},
-    {"Tovexa_PlexorSoftwareIdentity", "tovexa:ControllerSoftware", "InstanceID",
-     FillSoftwareIdentityObjectPath, nullptr, nullptr, RenderSoftwareIdentity, ACTION_NONE},
-    {"Tovexa_PlexorStorageVolume", "tvxStorageVolume", "DeviceID", nullptr,
-     &RaidController_t::VolumeList, DeviceIdOf<StorageVolume_t>,
-     RenderDevice<StorageVolume_t, FillVolumeInstance>, ACTION_VOLUME},
-    {"Tovexa_PlexorStorageExtent", "tvxStorageExt", "DeviceID", nullptr,
-     &RaidController_t::DiskList, DeviceIdOf<DiskDrive_t>,
-     RenderDevice<DiskDrive_t, FillExtentInstance>, ACTION_DISK},
-    {"Tovexa_PlexorSASSATAPort", "tvxPort", "DeviceID", nullptr, &RaidController_t::PortList,
-     DeviceIdOf<SASSATAPort_t>, RenderDevice<SASSATAPort_t, FillPortInstance>, ACTION_PORT},
-    {"Tovexa_PlexorBattery", "tvxControllerBattery", "DeviceID", nullptr,
-     &RaidController_t::BatteryList, DeviceIdOf<Battery_t>,
-     RenderDevice<Battery_t, FillBatteryInstance>, ACTION_BATTERY},
+    {.name = kControllerClass,
+     .keyPrefix = kControllerPrefix,
+     .keyName = kControllerKey,
+     .kind = nullptr,
+     .fillControllerPath = FillControllerObjectPath,
+     .deviceId = nullptr,
+     .render = RenderController},
+    {.name = kSoftwareClass,
+     .keyPrefix = kSoftwarePrefix,
+     .keyName = kSoftwareKey,
+     .kind = nullptr,
+     .fillControllerPath = FillSoftwareIdentityObjectPath,
+     .deviceId = nullptr,
+     .render = RenderSoftwareIdentity},
+    {.name = "Tovexa_PlexorStorageVolume",
+     .keyPrefix = "tvxStorageVolume",
+     .keyName = kDeviceKey,
+     .kind = &kVolumes,
+     .fillControllerPath = nullptr,
+     .deviceId = DeviceIdOf<StorageVolume_t>,
+     .render = RenderDevice<StorageVolume_t, FillVolumeInstance>},
+    {.name = "Tovexa_PlexorStorageExtent",
+     .keyPrefix = "tvxStorageExt",
+     .keyName = kDeviceKey,
+     .kind = &kDrives,
+     .fillControllerPath = nullptr,
+     .deviceId = DeviceIdOf<DiskDrive_t>,
+     .render = RenderDevice<DiskDrive_t, FillExtentInstance>},
+    {.name = "Tovexa_PlexorSASSATAPort",
+     .keyPrefix = "tvxPort",
+     .keyName = kDeviceKey,
+     .kind = &kPorts,
+     .fillControllerPath = nullptr,
+     .deviceId = DeviceIdOf<SASSATAPort_t>,
+     .render = RenderDevice<SASSATAPort_t, FillPortInstance>},
+    {.name = "Tovexa_PlexorBattery",
+     .keyPrefix = "tvxControllerBattery",
+     .keyName = kDeviceKey,
+     .kind = &kBatteries,
+     .fillControllerPath = nullptr,
+     .deviceId = DeviceIdOf<Battery_t>,
+     .render = RenderDevice<Battery_t, FillBatteryInstance>},
 };
 
 KeyCopying __KeyCopying[sizeof kServedClasses / sizeof kServedClasses[0]];
@@ -116,7 +142,7 @@ CMPIObjectPath* MakePath(const Request& request, RaidController_t* ctrl, const v
     CMPIObjectPath* path =
         broker->eft->newObjectPath(broker, request.nameSpace, served.name, nullptr);
     if (path == nullptr) return nullptr;
-    if (served.fillControllerPath != nullptr) {
+    if (served.kind == nullptr) {
         served.fillControllerPath(path, ctrl);
         return path;
     }
@@ -151,16 +177,17 @@ bool SameId(const char* wanted, const char* id) {
 
 /// Returns the wanted devices of one controller, then asks for their refresh. How many there were.
 int ReturnDevices(const Request& request, RaidController_t* ctrl, const Wanted& wanted) {
+    const DeviceKind& kind = *request.served->kind;
     int found = 0;
     MutexGuard lock(ctrl->CtrlMutex);
-    const List_Entry_t* entry = (ctrl->*request.served->list)->Head;
+    const List_Entry_t* entry = (ctrl->*kind.list)->Head;
     for (; entry != nullptr; entry = entry->Next) {
         if (!SameId(wanted.deviceId, request.served->deviceId(entry->Data))) continue;
         ReturnRecord(request, ctrl, entry->Data);
         found++;
     }
     lock.Unlock();
-    HandleDeviceConfigChange(request.mi, request.ctx, ctrl, request.served->action);
+    HandleDeviceConfigChange(request.mi, request.ctx, ctrl, kind.action.ConfigAction);
     return found;
 }
 
@@ -172,7 +199,7 @@ int ReturnWanted(const Request& request, const Wanted& wanted) {
     for (; entry != nullptr; entry = entry->Next) {
         auto* ctrl = static_cast<RaidController_t*>(entry->Data);
         if (!SameId(wanted.controllerId, ctrl->DeviceID)) continue;
-        if (request.served->list != nullptr) {
+        if (request.served->kind != nullptr) {
             found += ReturnDevices(request, ctrl, wanted);
         } else {
             ReturnRecord(request, ctrl, nullptr);
@@ -185,7 +212,7 @@ int ReturnWanted(const Request& request, const Wanted& wanted) {
 /// Splits the key of a get. The key functions' codes.
 int ParseKey(const Request& request, Wanted& wanted) {
     const ServedClass& served = *request.served;
-    if (served.list != nullptr) {
+    if (served.kind != nullptr) {
         return RetrieveControllerAndDeviceIDs(request.path, served.keyPrefix, &wanted.controllerId,
                                               &wanted.deviceId);
     }
