@@ -71,9 +71,9 @@ void DumpDisk(const DiskDrive_t* disk) {
            "\tPrimordial        - %d\n\tEnabledState      - %d\n\tOperationalStatus - %d\n"
            "\tSlot              - %d\n\tChassis           - %s\n",
            PathText(LOG_INFO, disk->DiskOp), PathText(LOG_INFO, disk->ExtentOp), disk->DeviceID,
-           disk->Name, disk->FwVersion, disk->NumberOfBlocks, disk->ConsumableBlocks,
-           disk->Primordial, disk->EnabledState, disk->OperationalStatus, disk->SlotNumber,
-           disk->Chassis != nullptr ? disk->Chassis : "No Chassis");
+           OrNull(disk->Name), OrNull(disk->FwVersion), disk->NumberOfBlocks,
+           disk->ConsumableBlocks, disk->Primordial, disk->EnabledState, disk->OperationalStatus,
+           disk->SlotNumber, disk->Chassis != nullptr ? disk->Chassis : "No Chassis");
 }
 
 /// Candidate pools of the drive's extent; null without an extent or when the query failed.

@@ -28,7 +28,7 @@ void UpdateStatus(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* 
 
 void MoveToPool(RaidController_t* ctrl, DiskDrive_t* disk, const char* newPool) {
     syslog(LOG_DEBUG, "%s: disk %s pool changed, old %s, new %s\n", kUpdater, disk->DeviceID,
-           disk->Pool, newPool);
+           OrNull(disk->Pool), newPool);
     MutexGuard lock(ctrl->CtrlMutex);
     RemoveDiskFromPool(FindStoragePoolByID(ctrl, disk->Pool), disk->DeviceID);
     free(disk->Pool);
@@ -61,7 +61,7 @@ void Update(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx,
 int CheckAndUpdateDiskInfo(const CMPIInstanceMI*, const CMPIContext* ctx, RaidController_t* ctrl,
                            void* device, CMPIInstance* devInst) {
     auto* disk = static_cast<DiskDrive_t*>(device);
-    syslog(LOG_DEBUG, "%s: ENTER. disk - %s\n", __func__, disk->Name);
+    syslog(LOG_DEBUG, "%s: ENTER. disk - %s\n", __func__, OrNull(disk->Name));
     if (NeedUpdate(disk->LastUpdateTime, disk->UpdateEnabled)) {
         Update(ctrl, disk, ctx, devInst);
         StampTime(ctrl, kDrives);

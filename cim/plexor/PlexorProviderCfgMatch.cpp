@@ -199,8 +199,8 @@ void LogComparisons(const Matching& matching, int match) {
     const int end = match < 0 ? matching.freshCount : match + 1;
     for (int j = 0; j < end && !StopRequested(); j++) {
         if (matching.fresh[j].Op == nullptr) continue;
-        syslog(LOG_DEBUG, "opArr[%d]: class name %s, key %s\n", j, matching.identities[j].className,
-               matching.identities[j].key);
+        syslog(LOG_DEBUG, "opArr[%d]: class name %s, key %s\n", j,
+               OrNull(matching.identities[j].className), OrNull(matching.identities[j].key));
     }
 }
 
@@ -208,7 +208,8 @@ void LogComparisons(const Matching& matching, int match) {
 void MatchOne(Matching& matching, int i, GetOpFunc_t getOp, const char* keyname) {
     UpdateInfo_t& cached = matching.cached[i];
     const Identity wanted = ReadIdentity(getOp(cached.Device), keyname);
-    syslog(LOG_DEBUG, "dataArr[%d]: class name %s, key %s\n", i, wanted.className, wanted.key);
+    syslog(LOG_DEBUG, "dataArr[%d]: class name %s, key %s\n", i, OrNull(wanted.className),
+           OrNull(wanted.key));
     const int match = TakeEqual(matching, wanted);
     LogComparisons(matching, match);
     if (match < 0) return;

@@ -27,7 +27,7 @@ void DumpPort(const SASSATAPort_t* port) {
     syslog(LOG_INFO,
            "\nPortOp: %s\n\tDeviceID          - %s\n\tPortName:         - %s\n"
            "\tPortType          - %d\n\tOperationalStatus - %d\n",
-           PathText(LOG_INFO, port->PortOp), port->DeviceID, port->PortName, port->PortType,
+           PathText(LOG_INFO, port->PortOp), port->DeviceID, OrNull(port->PortName), port->PortType,
            port->OperationalStatus);
 }
 

@@ -60,7 +60,8 @@ CMPIObjectPath* GetControllerOp(const void* device) {
 void FreeVolume(void* data) {
     auto* volume = static_cast<StorageVolume_t*>(data);
     if (volume == nullptr) return;
-    syslog(LOG_DEBUG, "Volume %s (%s) deleted\n", volume->Name, volume->ElementName);
+    syslog(LOG_DEBUG, "Volume %s (%s) deleted\n", OrNull(volume->Name),
+           OrNull(volume->ElementName));
     Release(volume->ElementName);
     Release(volume->RaidLevel);
     Release(volume->DeviceID);
@@ -73,7 +74,7 @@ void FreeVolume(void* data) {
 void FreeDisk(void* data) {
     auto* disk = static_cast<DiskDrive_t*>(data);
     if (disk == nullptr) return;
-    syslog(LOG_DEBUG, "%s deleted\n", disk->Name);
+    syslog(LOG_DEBUG, "%s deleted\n", OrNull(disk->Name));
     Release(disk->FwVersion);
     Release(disk->Name);
     Release(disk->DeviceID);
@@ -87,7 +88,7 @@ void FreeDisk(void* data) {
 void FreePort(void* data) {
     auto* port = static_cast<SASSATAPort_t*>(data);
     if (port == nullptr) return;
-    syslog(LOG_DEBUG, "%s deleted\n", port->PortName);
+    syslog(LOG_DEBUG, "%s deleted\n", OrNull(port->PortName));
     Release(port->PortName);
     Release(port->DeviceID);
     ReleasePath(port->PortOp);
@@ -97,7 +98,7 @@ void FreePort(void* data) {
 void FreeBattery(void* data) {
     auto* battery = static_cast<Battery_t*>(data);
     if (battery == nullptr) return;
-    syslog(LOG_DEBUG, "Battery %s deleted\n", battery->DeviceID);
+    syslog(LOG_DEBUG, "Battery %s deleted\n", OrNull(battery->DeviceID));
     Release(battery->DeviceID);
     ReleasePath(battery->BatteryOp);
     free(battery);
@@ -106,7 +107,7 @@ void FreeBattery(void* data) {
 void FreeChassis(void* data) {
     auto* chassis = static_cast<Chassis_t*>(data);
     if (chassis == nullptr) return;
-    syslog(LOG_DEBUG, "Chassis %s deleted\n", chassis->Tag);
+    syslog(LOG_DEBUG, "Chassis %s deleted\n", OrNull(chassis->Tag));
     Release(chassis->Tag);
     Release(chassis->InternalTag);
     ReleasePath(chassis->ChassisOp);
@@ -116,7 +117,7 @@ void FreeChassis(void* data) {
 void FreePool(void* data) {
     auto* pool = static_cast<StoragePool_t*>(data);
     if (pool == nullptr) return;
-    syslog(LOG_DEBUG, "Pool %s deleted\n", pool->PoolID);
+    syslog(LOG_DEBUG, "Pool %s deleted\n", OrNull(pool->PoolID));
     FreeList(pool->Drives, free);
     Release(pool->PoolID);
     Release(pool->InstanceID);
@@ -129,7 +130,7 @@ void FreeController(void* data) {
     if (ctrl == nullptr) return;
     for (const DeviceKind* kind : kReleaseOrder) FreeList(ctrl->*kind->list, kind->release);
 
-    syslog(LOG_DEBUG, "Controller %s (%s) deleted\n", ctrl->Model, ctrl->DeviceID);
+    syslog(LOG_DEBUG, "Controller %s (%s) deleted\n", OrNull(ctrl->Model), OrNull(ctrl->DeviceID));
     Release(ctrl->BundleVersion);
     Release(ctrl->DriverVersion);
     Release(ctrl->BiosVersion);
@@ -160,7 +161,8 @@ int Delete(RaidController_t* ctrl, const DeviceKind& kind, void* device) {
 }
 
 void LogRemovedFromController(const char* name, const RaidController_t* ctrl) {
-    syslog(LOG_INFO, "%s removed from controller %s(%s)\n", name, ctrl->DeviceID, ctrl->Model);
+    syslog(LOG_INFO, "%s removed from controller %s(%s)\n", OrNull(name), ctrl->DeviceID,
+           OrNull(ctrl->Model));
 }
 
 }  // namespace
@@ -201,7 +203,7 @@ int DeleteDisk(RaidController_t* ctrl, void* device) {
     StoragePool_t* pool = FindStoragePoolByID(ctrl, disk->Pool);
     if (pool != nullptr) {
         RemoveDiskFromPool(pool, disk->DeviceID);
-        syslog(LOG_INFO, "%s removed from pool %s\n", disk->Name, disk->Pool);
+        syslog(LOG_INFO, "%s removed from pool %s\n", OrNull(disk->Name), disk->Pool);
     }
     FreeDisk(disk);
     return RESULT_OK;

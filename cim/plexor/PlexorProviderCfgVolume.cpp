@@ -39,11 +39,11 @@ void DumpVolume(const StorageVolume_t* volume) {
            "\tName              - %s\n\tNameNameSpace     - %d\n"
            "\tIsBasedOnUnderlyingRedundancy - %d\n\tDeltaReservation  - %d\n"
            "\tPrimordial        - %d\n\tOperationalStatus - %d\n",
-           PathText(LOG_DEBUG, volume->VolumeOp), volume->ElementName, volume->DeviceID,
-           volume->RaidLevel, volume->NumberOfBlocks, volume->ConsumableBlocks,
-           volume->DataRedundancy, volume->PackageRedundancy, volume->NameFormat, volume->Name,
-           volume->NameNameSpace, volume->IsBasedOnUnderlyingRedundancy, volume->DeltaReservation,
-           volume->Primordial, volume->OperationalStatus);
+           PathText(LOG_DEBUG, volume->VolumeOp), OrNull(volume->ElementName), volume->DeviceID,
+           OrNull(volume->RaidLevel), volume->NumberOfBlocks, volume->ConsumableBlocks,
+           volume->DataRedundancy, volume->PackageRedundancy, volume->NameFormat,
+           OrNull(volume->Name), volume->NameNameSpace, volume->IsBasedOnUnderlyingRedundancy,
+           volume->DeltaReservation, volume->Primordial, volume->OperationalStatus);
 }
 
 void ReadPool(StorageVolume_t* volume, const CMPIContext* ctx) {
@@ -125,7 +125,7 @@ bool SameName(const char* left, const char* right) {
 void UpdateName(StorageVolume_t* volume, const char* name) {
     if (SameName(volume->ElementName, name)) return;
     syslog(LOG_DEBUG, "%s: volume %s element name changed. Old name %s, new name %s\n", kUpdater,
-           volume->DeviceID, volume->ElementName, name);
+           volume->DeviceID, OrNull(volume->ElementName), OrNull(name));
     free(volume->ElementName);
     volume->ElementName = StringClone(name);
 }
@@ -160,7 +160,7 @@ int BuildVolumeInfo(const CMPIInstanceMI*, const CMPIContext* ctx, RaidControlle
 int CheckAndUpdateVolumeInfo(const CMPIInstanceMI*, const CMPIContext* ctx, RaidController_t* ctrl,
                              void* device, CMPIInstance* devInst) {
     auto* volume = static_cast<StorageVolume_t*>(device);
-    syslog(LOG_DEBUG, "%s: ENTER. volume - %s\n", __func__, volume->ElementName);
+    syslog(LOG_DEBUG, "%s: ENTER. volume - %s\n", __func__, OrNull(volume->ElementName));
     if (NeedUpdate(volume->LastUpdateTime, volume->UpdateEnabled)) {
         Update(ctrl, volume, ctx, devInst);
         StampTime(ctrl, kVolumes);

@@ -105,7 +105,8 @@ void FillSoftwareIdentityObjectPath(CMPIObjectPath* cop, RaidController_t* ctrl)
 
 void FillLogicalDeviceObjectPath(CMPIObjectPath* cop, const char* deviceID,
                                  const char* creationClassName) {
-    syslog(LOG_DEBUG, "%s: ClassName - %s, DeviceID - %s\n", __func__, creationClassName, deviceID);
+    syslog(LOG_DEBUG, "%s: ClassName - %s, DeviceID - %s\n", __func__, creationClassName,
+           OrNull(deviceID));
     AddKey(cop, "SystemCreationClassName", GetSystemClassName());
     AddKey(cop, "SystemName", GetSystemName());
     AddKey(cop, "CreationClassName", creationClassName);

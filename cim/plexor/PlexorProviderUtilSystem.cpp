@@ -75,8 +75,8 @@ int InitSystemInfo(const CMPIInstanceMI*, const CMPIContext* ctx) {
     syslog(LOG_DEBUG, "%s, CIM Query - EnumInstances: %s", __func__, PathText(LOG_DEBUG, path));
     const CMPIInstance* host = FindHostInstance(ctx, path);
     if (host == nullptr || !StoreNames(host)) return RESULT_NOTHING;
-    syslog(LOG_DEBUG, "SYSTEM INFO: HostName %s, SystemName %s, SystemClassName %s\n", __HostName,
-           __SystemName, __SystemClassName);
+    syslog(LOG_DEBUG, "SYSTEM INFO: HostName %s, SystemName %s, SystemClassName %s\n",
+           OrNull(GetHostName()), OrNull(GetSystemName()), OrNull(GetSystemClassName()));
     return RESULT_OK;
 }
 
