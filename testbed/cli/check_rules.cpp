@@ -4,6 +4,7 @@
 #include <vector>
 
 #include "cim_words.h"
+#include "inventory.h"
 
 namespace testbed {
 namespace {
@@ -67,11 +68,6 @@ std::uint64_t numberOf(const Instance& instance, const char* property) {
     // The provider tells one state. Of several, a bad one must not hide behind a good one.
     const auto* elements = std::get_if<std::vector<CimValue>>(&value->data);
     return elements && elements->size() > 1 ? kSeveral : value->asUnsigned();
-}
-
-std::string nameOf(const Instance& instance) {
-    const CimValue* name = instance.find("ElementName");
-    return name && !name->asString().empty() ? name->asString() : instance.path.text();
 }
 
 bool saysState(const std::string& name, const StateRule& rule) {

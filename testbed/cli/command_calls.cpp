@@ -8,6 +8,7 @@
 #include <map>
 #include <memory>
 
+#include "exit_status.h"
 #include "library_locator.h"
 #include "manager_option.h"
 #include "provider_log.h"
@@ -18,8 +19,6 @@
 
 namespace testbed {
 namespace {
-
-constexpr int kProviderFailed = 3;
 
 struct CallsOptions {
     std::string scenario;

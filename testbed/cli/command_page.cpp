@@ -10,6 +10,7 @@
 
 #include "access.h"
 #include "ask_options.h"
+#include "host_name.h"
 #include "http_server.h"
 #include "page_about.h"
 #include "page_server.h"
@@ -26,12 +27,6 @@ struct PageOptions {
     double intervalSeconds = 5;
     bool insecurePublic = false;
 };
-
-std::string hostName() {
-    char name[256] = "";
-    gethostname(name, sizeof name - 1);
-    return *name == '\0' ? "localhost" : name;
-}
 
 Answers askNow(const AskOptions& options) {
     std::atomic<int> answered = 0;

@@ -15,6 +15,7 @@
 #include "command_queue.h"
 #include "control_socket.h"
 #include "descriptor_limit.h"
+#include "host_name.h"
 #include "http_server.h"
 #include "input_lines.h"
 #include "live_session.h"
@@ -43,12 +44,6 @@ struct ServeOptions {
 
 /// Beside connections: files, the provider's and those of the system's libraries.
 constexpr std::size_t kOtherDescriptors = 64;
-
-std::string hostName() {
-    char name[256] = "";
-    gethostname(name, sizeof name - 1);
-    return *name == '\0' ? "localhost" : name;
-}
 
 Registration registrationOf(ProviderSession& session) {
     Registration registration{session.client(), kServedNamespace, {}};

@@ -8,6 +8,7 @@
 
 #include "check_command.h"
 #include "colour.h"
+#include "exit_status.h"
 #include "inventory.h"
 #include "json_view.h"
 #include "library_locator.h"
@@ -22,8 +23,6 @@
 
 namespace testbed {
 namespace {
-
-constexpr int kProviderFailed = 3;
 
 struct ShowOptions {
     std::string scenario;

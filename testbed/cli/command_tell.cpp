@@ -5,11 +5,10 @@
 #include <memory>
 
 #include "control_socket.h"
+#include "exit_status.h"
 
 namespace testbed {
 namespace {
-
-constexpr int kRefusedStatus = 1;
 
 struct TellOptions {
     std::string socket;

@@ -7,6 +7,7 @@
 #include <iostream>
 #include <memory>
 
+#include "exit_status.h"
 #include "input_lines.h"
 #include "inventory_changes.h"
 #include "live_session.h"
@@ -15,9 +16,6 @@
 
 namespace testbed {
 namespace {
-
-constexpr int kRefused = 1;
-constexpr int kProviderFailed = 3;
 
 struct WatchOptions {
     LiveOptions live;
@@ -52,7 +50,7 @@ public:
             takeNewFile();
             poll();
         }
-        return hasFailed() ? kRefused : 0;
+        return hasFailed() ? kRefusedStatus : 0;
     }
 
 private:

@@ -18,8 +18,8 @@ constexpr std::size_t kMostConnections = 16;
 constexpr std::size_t kLongestCommand = 65536;
 constexpr std::chrono::seconds kPatience{5};
 constexpr std::chrono::seconds kAnswerLimit{60};
-constexpr const char* kOk = "ok\n";
-constexpr const char* kRefused = "refused\n";
+constexpr const char* kOkReply = "ok\n";
+constexpr const char* kRefusedReply = "refused\n";
 
 [[noreturn]] void failAt(const std::string& path, const std::string& what) {
     throw std::runtime_error(path + ": " + what);
@@ -71,7 +71,7 @@ bool receiveWaiting(int descriptor, std::string& received) {
 void answer(int descriptor, const CommandResult& result) {
     fcntl(descriptor, F_SETFL, 0);
     limitWaits(descriptor, kPatience);
-    sendAll(descriptor, (result.refused ? kRefused : kOk) + result.text);
+    sendAll(descriptor, (result.refused ? kRefusedReply : kOkReply) + result.text);
 }
 
 }  // namespace
@@ -152,8 +152,9 @@ CommandResult tellSocket(const std::string& path, const std::string& command) {
     if (sendAll(descriptor.get(), line + "\n"))
         for (ssize_t size = 0; (size = recv(descriptor.get(), buffer, sizeof buffer, 0)) > 0;)
             reply.append(buffer, static_cast<std::size_t>(size));
-    if (reply.starts_with(kOk)) return {false, false, reply.substr(std::strlen(kOk))};
-    if (reply.starts_with(kRefused)) return {true, false, reply.substr(std::strlen(kRefused))};
+    if (reply.starts_with(kOkReply)) return {false, false, reply.substr(std::strlen(kOkReply))};
+    if (reply.starts_with(kRefusedReply))
+        return {true, false, reply.substr(std::strlen(kRefusedReply))};
     failAt(path, "no answer");
 }
 

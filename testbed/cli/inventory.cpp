@@ -55,6 +55,11 @@ std::optional<std::size_t> ownerAmong(std::span<const std::string> controllerIds
     return owner;
 }
 
+std::string nameOf(const Instance& instance) {
+    const CimValue* name = instance.find("ElementName");
+    return name && !name->asString().empty() ? name->asString() : instance.path.text();
+}
+
 Inventory collectInventory(InstanceClient& client, const std::vector<std::string>& classNames,
                            const std::string& nameSpace) {
     Inventory inventory;

@@ -39,6 +39,9 @@ bool belongsTo(const ServedClass& served, const std::string& identity,
 std::optional<std::size_t> ownerAmong(std::span<const std::string> controllerIds,
                                       const ServedClass& served, const Instance& instance);
 
+/// What people call it: its ElementName, or its path when it tells none.
+std::string nameOf(const Instance& instance);
+
 struct ClassAnswer {
     std::string className;
     Response response;

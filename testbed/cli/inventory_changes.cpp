@@ -18,11 +18,6 @@ std::string propertyChanges(const Instance& before, const Instance& after) {
 
 namespace {
 
-std::string nameOf(const Instance& instance) {
-    const CimValue* name = instance.find("ElementName");
-    return name != nullptr && !name->isNull ? name->asString() : instance.path.text();
-}
-
 const Instance* findPath(const ClassAnswer& answer, const ObjectPath& path) {
     for (const Instance& instance : answer.response.instances)
         if (instance.path == path) return &instance;

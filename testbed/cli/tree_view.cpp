@@ -74,8 +74,7 @@ std::string shown(const std::string& text, const TreeStyle& style) {
 
 Line lineOf(const Instance& instance, const ServedClass& served, const TreeStyle& style) {
     std::string name = textOf(instance, "VersionString");
-    if (name.empty()) name = textOf(instance, "ElementName");
-    if (name.empty()) name = instance.path.text();
+    if (name.empty()) name = nameOf(instance);
     name = shown(name, style);
     const std::string text = name + statesOf(instance);
     const auto verdict = style.colours ? style.policy.judge(served.name, instance) : std::nullopt;

@@ -17,14 +17,6 @@ namespace {
 
 constexpr const char* kNotValid = "request-not-loosely-valid";
 
-bool isElement(pugi::xml_node node, const char* name) {
-    return std::string_view(node.name()) == name;
-}
-
-pugi::xml_node firstElement(pugi::xml_node node) {
-    return node.find_child([](pugi::xml_node child) { return child.type() == pugi::node_element; });
-}
-
 /// The version's major number must be the one that is served.
 void requireVersion(const std::string& version, const char* major, const char* cimError) {
     if (!version.starts_with(std::string(major) + "."))

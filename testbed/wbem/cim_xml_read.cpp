@@ -15,14 +15,6 @@ struct DepthLimit : pugi::xml_tree_walker {
     }
 };
 
-bool isElement(pugi::xml_node node, const char* name) {
-    return std::string_view(node.name()) == name;
-}
-
-pugi::xml_node firstElement(pugi::xml_node node) {
-    return node.find_child([](pugi::xml_node child) { return child.type() == pugi::node_element; });
-}
-
 [[noreturn]] void refuse(pugi::xml_node node, const std::string& why) {
     throw CimXmlError(xmlText(node.name()) + ": " + why);
 }
@@ -97,6 +89,14 @@ void parseXml(const std::string& text, pugi::xml_document& document) {
     if (!document.traverse(limit))
         throw CimXmlError("elements nested more than " + std::to_string(kDeepestNesting) +
                           " levels deep");
+}
+
+bool isElement(pugi::xml_node node, const char* name) {
+    return std::string_view(node.name()) == name;
+}
+
+pugi::xml_node firstElement(pugi::xml_node node) {
+    return node.find_child([](pugi::xml_node child) { return child.type() == pugi::node_element; });
 }
 
 std::string elementText(pugi::xml_node node) {

@@ -22,6 +22,9 @@ constexpr std::ptrdiff_t kMostMarks = 600'000;
 /// itself is expanded.
 void parseXml(const std::string& text, pugi::xml_document& document);
 
+bool isElement(pugi::xml_node node, const char* name);
+/// The first child that is an element; none without one.
+pugi::xml_node firstElement(pugi::xml_node node);
 /// The element's text, of all its pieces, nothing trimmed.
 std::string elementText(pugi::xml_node node);
 /// The child of that name. Throws CimXmlError when there is none.

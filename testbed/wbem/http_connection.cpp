@@ -14,7 +14,7 @@ namespace http = beast::http;
 using asio::use_awaitable;
 using asio::ip::tcp;
 using Clock = HttpConnection::Clock;
-using Parser = http::request_parser<http::string_body>;
+using RequestParser = http::request_parser<http::string_body>;
 
 constexpr std::size_t kReadSize = 16 * 1024;
 /// However quiet a stream is, it is asked that often.
@@ -30,7 +30,7 @@ int refusalFor(const beast::error_code& error) {
 }
 
 /// The status that refuses a request whose headers have arrived; 0 for one that is welcome.
-int refusalFor(const Parser& parser) {
+int refusalFor(const RequestParser& parser) {
     const auto& request = parser.get();
     const auto coding = request.find(http::field::transfer_encoding);
     const auto expectation = request.find(http::field::expect);
@@ -100,7 +100,7 @@ public:
         for (bool keep = true; keep; enter(Phase::Reading, options_.times.idle)) {
             if (buffer_.size() == 0) co_await receive();
             enter(Phase::Reading, options_.times.request);
-            Parser parser;
+            RequestParser parser;
             parser.header_limit(static_cast<std::uint32_t>(options_.limits.head));
             parser.body_limit(options_.limits.body);
             const int refusal = co_await read(parser);
@@ -149,7 +149,7 @@ private:
     }
 
     /// Reads a request whole: 0, or the status that refuses it.
-    asio::awaitable<int> read(Parser& parser) {
+    asio::awaitable<int> read(RequestParser& parser) {
         int refusal = 0;
         while (refusal == 0 && !parser.is_header_done()) refusal = co_await readSome(parser);
         if (refusal == 0) refusal = refusalFor(parser);
@@ -160,7 +160,7 @@ private:
         co_return refusal;
     }
 
-    asio::awaitable<int> readSome(Parser& parser) {
+    asio::awaitable<int> readSome(RequestParser& parser) {
         refuseLate();
         beast::error_code error;
         co_await http::async_read_some(stream_, buffer_, parser,
@@ -176,7 +176,7 @@ private:
         co_await asio::async_write(stream_, asio::buffer(kContinue), use_awaitable);
     }
 
-    HttpRequest received(Parser& parser) {
+    HttpRequest received(RequestParser& parser) {
         HttpRequest request = requestFrom(parser.release());
         request.isFromThisHost =
             !isPublic(bottom().socket().remote_endpoint().address().to_string());

@@ -29,7 +29,7 @@ namespace ssl = asio::ssl;
 using asio::use_awaitable;
 using asio::ip::tcp;
 using Clock = std::chrono::steady_clock;
-using Parser = http::response_parser<http::string_body>;
+using ResponseParser = http::response_parser<http::string_body>;
 using TlsStream = beast::ssl_stream<beast::tcp_stream&>;
 
 constexpr const char* kLate = "no answer in time";
@@ -182,7 +182,7 @@ private:
         beast::error_code error;
         co_await http::async_write(stream, message, asio::redirect_error(use_awaitable, error));
         if (error) fail("the server takes no request", error);
-        std::optional<Parser> parser;
+        std::optional<ResponseParser> parser;
         do {
             parser.emplace();
             parser->header_limit(kLargestHead);
@@ -195,7 +195,7 @@ private:
     }
 
     template <class Stream>
-    asio::awaitable<void> readSome(Stream& stream, Parser& parser) {
+    asio::awaitable<void> readSome(Stream& stream, ResponseParser& parser) {
         // The stream's own deadline does not stop a peer whose bytes are always there already.
         if (Clock::now() >= bounds_.deadline) throw WbemError(kLate);
         beast::error_code error;
@@ -215,7 +215,7 @@ private:
         fail("the server closed the connection", error);
     }
 
-    static void refuseCodings(const Parser& parser) {
+    static void refuseCodings(const ResponseParser& parser) {
         const auto& message = parser.get();
         const auto coding = message.find(http::field::content_encoding);
         if (coding != message.end() && !beast::iequals(coding->value(), "identity"))

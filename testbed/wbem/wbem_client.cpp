@@ -21,8 +21,8 @@ std::string newMessageId() {
 }
 
 /// A request's message with its operation, to which parameters are added.
-struct Operation {
-    Operation(const char* method, const std::string& nameSpace)
+struct OperationCall {
+    OperationCall(const char* method, const std::string& nameSpace)
         : asked{method, newMessageId(), nameSpace, false} {
         pugi::xml_node cim = document.append_child("CIM");
         cim.append_attribute("CIMVERSION") = "2.0";
@@ -186,7 +186,7 @@ Response WbemClient::call(const AskedOperation& asked, const pugi::xml_document&
 
 Response WbemClient::enumerateInstanceNames(const std::string& className,
                                             const std::string& nameSpace) {
-    Operation operation("EnumerateInstanceNames", nameSpace);
+    OperationCall operation("EnumerateInstanceNames", nameSpace);
     operation.asked.namesOnly = true;
     writeClassName(operation.parameter("ClassName"), className);
     return call(operation.asked, operation.document);
@@ -195,7 +195,7 @@ Response WbemClient::enumerateInstanceNames(const std::string& className,
 Response WbemClient::enumerateInstances(const std::string& className,
                                         const PropertyList& properties,
                                         const std::string& nameSpace) {
-    Operation operation("EnumerateInstances", nameSpace);
+    OperationCall operation("EnumerateInstances", nameSpace);
     writeClassName(operation.parameter("ClassName"), className);
     // Servers differ in what they take for granted.
     operation.flag("LocalOnly", false);
@@ -207,7 +207,7 @@ Response WbemClient::enumerateInstances(const std::string& className,
 }
 
 Response WbemClient::getInstance(const ObjectPath& path, const PropertyList& properties) {
-    Operation operation("GetInstance", path.nameSpace);
+    OperationCall operation("GetInstance", path.nameSpace);
     writeInstanceName(operation.parameter("InstanceName"), path);
     operation.flag("LocalOnly", false);
     operation.flag("IncludeQualifiers", false);

@@ -5,6 +5,7 @@
 #include <fstream>
 
 #include "canned_answers.h"
+#include "elements.h"
 #include "printable.h"
 #include "scripted_server.h"
 #include "tool_process.h"
@@ -12,15 +13,10 @@
 namespace testbed {
 namespace {
 
-constexpr const char* kVolume = "Tovexa_PlexorStorageVolume";
-constexpr const char* kDrive = "Tovexa_PlexorStorageExtent";
-
-Instance drive(const std::string& id, const std::string& state, int status, int health) {
-    Instance instance;
+Instance drive(const std::string& id, const std::string& state, std::uint16_t status,
+               std::uint16_t health) {
+    Instance instance = element("Drive " + id + " - " + state, status, health);
     instance.set("DeviceID", CimValue::string("tvxStorageExtC0_" + id));
-    instance.set("ElementName", CimValue::string("Drive " + id + " - " + state));
-    instance.set("OperationalStatus", CimValue::uint16Array({static_cast<std::uint16_t>(status)}));
-    instance.set("HealthState", CimValue::uint16(static_cast<std::uint16_t>(health)));
     return instance;
 }
 
@@ -163,7 +159,9 @@ TEST(Metrics, SayWhenNobodyAnswers) {
 TEST(Printable, LeavesNothingThatMisleads) {
     EXPECT_EQ(printable("a\xc3\xa4\xe6\xbc\xa2 b"), "a\xc3\xa4\xe6\xbc\xa2 b");
     EXPECT_EQ(printable("\xe2\x80\xae\xe2\x80\x8b\xc2\x9b\x7f\t"), "?????");
-    EXPECT_EQ(printable("\xff\xc3(\xe2\x80"), "??(??");
+    EXPECT_EQ(printable("\xff\xc3(\xe2\x80"),
+              "??"
+              "(??");
     EXPECT_EQ(printable("\xed\xa0\x80\xc0\xaf\xf4\x90\x80\x80"), "?????????");
     EXPECT_EQ(printableAscii("a\xc3\xa4\xff"), "a??");
 }

@@ -6,25 +6,14 @@
 #include <set>
 #include <sstream>
 
+#include "elements.h"
+
 namespace testbed {
 namespace {
-
-constexpr const char* kVolume = "Tovexa_PlexorStorageVolume";
-constexpr const char* kDrive = "Tovexa_PlexorStorageExtent";
-constexpr const char* kPort = "Tovexa_PlexorSASSATAPort";
-constexpr const char* kBattery = "Tovexa_PlexorBattery";
 
 constexpr CheckLevel kOk = CheckLevel::Ok;
 constexpr CheckLevel kWarning = CheckLevel::Warning;
 constexpr CheckLevel kCritical = CheckLevel::Critical;
-
-Instance element(const std::string& name, int status, int health) {
-    Instance instance;
-    instance.set("ElementName", CimValue::string(name));
-    instance.set("OperationalStatus", CimValue::uint16Array({static_cast<std::uint16_t>(status)}));
-    instance.set("HealthState", CimValue::uint16(static_cast<std::uint16_t>(health)));
-    return instance;
-}
 
 struct Case {
     const char* className;

@@ -4,16 +4,10 @@
 
 #include <algorithm>
 
+#include "elements.h"
+
 namespace testbed {
 namespace {
-
-Instance element(const std::string& name, std::uint16_t status, std::uint16_t health) {
-    Instance instance;
-    instance.set("ElementName", CimValue::string(name));
-    instance.set("OperationalStatus", CimValue::uint16Array({status}));
-    instance.set("HealthState", CimValue::uint16(health));
-    return instance;
-}
 
 ClassAnswer answer(const char* kind, std::vector<Instance> instances) {
     ClassAnswer made{std::string("Tovexa_Plexor") + kind, {}};

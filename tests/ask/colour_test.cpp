@@ -5,27 +5,24 @@
 #include <stdlib.h>
 #include <unistd.h>
 
+#include "elements.h"
 #include "tree_view.h"
 
 namespace testbed {
 namespace {
 
-Instance element(const char* className, const std::string& id, const std::string& name,
-                 std::uint16_t status, std::uint16_t health) {
-    Instance instance;
+Instance device(const char* className, const std::string& name, std::uint16_t status,
+                std::uint16_t health) {
+    Instance instance = element(name, status, health);
     instance.path = {"root/cimv2", className, {}};
-    instance.path.key("DeviceID", CimValue::string(id));
-    instance.set("ElementName", CimValue::string(name));
-    instance.set("OperationalStatus", CimValue::uint16Array({status}));
-    instance.set("HealthState", CimValue::uint16(health));
+    instance.path.key("DeviceID", CimValue::string("x"));
     return instance;
 }
 
 TEST(Colour, TreeShowsWhatACheckWouldSay) {
-    ClassAnswer drives{"Tovexa_PlexorStorageExtent", {}};
+    ClassAnswer drives{kDrive, {}};
     const auto add = [&](const char* name, std::uint16_t status, std::uint16_t health) {
-        drives.response.instances.push_back(
-            element("Tovexa_PlexorStorageExtent", "x", name, status, health));
+        drives.response.instances.push_back(device(kDrive, name, status, health));
     };
     add("a - ONLINE", 2, 5);
     add("b - REBUILD", 2, 5);
@@ -39,9 +36,8 @@ TEST(Colour, TreeShowsWhatACheckWouldSay) {
 }
 
 TEST(Colour, ControllersHaveNone) {
-    ClassAnswer controllers{"Tovexa_PlexorController", {}};
-    controllers.response.instances.push_back(
-        element("Tovexa_PlexorController", "x", "Controller", 6, 30));
+    ClassAnswer controllers{kController, {}};
+    controllers.response.instances.push_back(device(kController, "Controller", 6, 30));
     EXPECT_EQ(treeView({controllers}, {.colours = true}),
               "Controller  [health failed, status error]\n");
 }

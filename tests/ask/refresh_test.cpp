@@ -5,16 +5,13 @@
 #include <chrono>
 
 #include "canned_answers.h"
+#include "elements.h"
 #include "scripted_server.h"
 #include "tool_process.h"
 
 namespace {
 
 using std::chrono::steady_clock;
-
-constexpr const char* kDrive = "Tovexa_PlexorStorageExtent";
-constexpr const char* kVolume = "Tovexa_PlexorStorageVolume";
-constexpr const char* kController = "Tovexa_PlexorController";
 
 std::string drive(const std::string& id) {
     return namedInstance(kDrive, "DeviceID", "tvxStorageExtC0_" + id, "Drive " + id + " - ONLINE",

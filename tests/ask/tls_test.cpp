@@ -7,14 +7,13 @@
 #include <algorithm>
 
 #include "canned_answers.h"
+#include "elements.h"
 #include "scripted_server.h"
 #include "tool_process.h"
 #include "wbem_client.h"
 
 namespace testbed {
 namespace {
-
-constexpr const char* kDrive = "Tovexa_PlexorStorageExtent";
 
 struct Release {
     void operator()(X509* certificate) const { X509_free(certificate); }

@@ -5,13 +5,12 @@
 #include <regex>
 
 #include "canned_answers.h"
+#include "elements.h"
 #include "scripted_server.h"
 #include "tool_process.h"
 #include "wbem_client.h"
 
 namespace {
-
-constexpr const char* kBattery = "Tovexa_PlexorBattery";
 
 /// What the client sends for batteries, with kSameId as its message's id.
 std::string batteryRequest() {

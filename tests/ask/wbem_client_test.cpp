@@ -5,6 +5,7 @@
 #include <random>
 
 #include "canned_answers.h"
+#include "elements.h"
 #include "scripted_server.h"
 
 namespace testbed {
@@ -13,8 +14,6 @@ namespace {
 using std::chrono::milliseconds;
 using std::chrono::seconds;
 using std::chrono::steady_clock;
-
-constexpr const char* kDrive = "Tovexa_PlexorStorageExtent";
 
 WbemClientOptions within(milliseconds time) {
     WbemClientOptions options;

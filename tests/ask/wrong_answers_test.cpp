@@ -7,6 +7,7 @@
 #include <cstdlib>
 
 #include "canned_answers.h"
+#include "elements.h"
 #include "printable.h"
 #include "scripted_server.h"
 #include "tool_process.h"
@@ -17,8 +18,6 @@ using std::chrono::milliseconds;
 using std::chrono::seconds;
 using std::chrono::steady_clock;
 
-constexpr const char* kDrive = "Tovexa_PlexorStorageExtent";
-constexpr const char* kVolume = "Tovexa_PlexorStorageVolume";
 constexpr const char* kPassword = "s3cretWord";
 /// "mon:s3cretWord"
 constexpr const char* kToken = "bW9uOnMzY3JldFdvcmQ=";

@@ -8,12 +8,11 @@
 #include "inventory.h"
 #include "mof_error.h"
 #include "mof_reader.h"
+#include "schema_space.h"
 #include "scratch_directory.h"
 
 namespace testbed {
 namespace {
-
-constexpr const char* kSpace = "root/cimv2";
 
 std::set<std::string> keysOf(const Repository& repository, const std::string& className) {
     std::set<std::string> keys;

@@ -6,14 +6,13 @@
 #include "mof_error.h"
 #include "mof_reader.h"
 #include "schema_choice.h"
+#include "schema_space.h"
 #include "scratch_directory.h"
 #include "standard_qualifiers.h"
 #include "synthetic_schema.h"
 
 namespace testbed {
 namespace {
-
-constexpr const char* kSpace = "root/cimv2";
 
 std::string textOf(const Qualifiers& qualifiers, const char* name) {
     for (const auto& [known, value] : qualifiers)

@@ -14,9 +14,9 @@
 namespace plexortest {
 namespace {
 
-std::mutex mutex;
-std::vector<LogLine> captured;                 // guarded by mutex
-std::function<void(const LogLine&)> lineHook;  // guarded by mutex
+std::mutex logMutex;
+std::vector<LogLine> captured;                 // guarded by logMutex
+std::function<void(const LogLine&)> lineHook;  // guarded by logMutex
 std::atomic<bool> masked{false};
 std::atomic<bool> discarded{false};
 
@@ -43,7 +43,7 @@ void __attribute__((format(printf, 2, 0))) capture(int priority, const char* for
     if (discarded.load(std::memory_order_relaxed)) return;
     std::function<void(const LogLine&)> hook;
     {
-        std::lock_guard lock(mutex);
+        std::lock_guard lock(logMutex);
         captured.push_back(line);
         hook = lineHook;
     }
@@ -66,12 +66,12 @@ void PrintTo(const LogLine& line, std::ostream* out) {
 }
 
 std::vector<LogLine> CapturedSyslog::lines() {
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(logMutex);
     return captured;
 }
 
 std::vector<std::string> CapturedSyslog::linesAt(int priority) {
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(logMutex);
     std::vector<std::string> texts;
     for (const LogLine& line : captured) {
         if (line.priority == priority) texts.push_back(line.text);
@@ -80,20 +80,20 @@ std::vector<std::string> CapturedSyslog::linesAt(int priority) {
 }
 
 std::size_t CapturedSyslog::count(const std::string& text) {
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(logMutex);
     return static_cast<std::size_t>(std::count_if(
         captured.begin(), captured.end(), [&](const LogLine& line) { return line.text == text; }));
 }
 
 std::size_t CapturedSyslog::countContaining(const std::string& part) {
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(logMutex);
     return static_cast<std::size_t>(std::count_if(
         captured.begin(), captured.end(),
         [&](const LogLine& line) { return line.text.find(part) != std::string::npos; }));
 }
 
 void CapturedSyslog::clear() {
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(logMutex);
     captured.clear();
 }
 
@@ -106,7 +106,7 @@ void CapturedSyslog::discard(bool on) {
 }
 
 void CapturedSyslog::onLine(std::function<void(const LogLine&)> hook) {
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(logMutex);
     lineHook = std::move(hook);
 }
 

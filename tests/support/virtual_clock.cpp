@@ -12,14 +12,14 @@ namespace {
 // Relaxed, so that reading the clock orders nothing between the threads under test.
 std::atomic<time_t> currentTime{0};
 std::atomic<time_t> step{0};  // added by each reading
-std::mutex mutex;
-std::vector<Sleep> recorded;                  // guarded by mutex
-std::function<void(unsigned int)> sleepHook;  // guarded by mutex
+std::mutex sleepMutex;
+std::vector<Sleep> recorded;                  // guarded by sleepMutex
+std::function<void(unsigned int)> sleepHook;  // guarded by sleepMutex
 
 void sleepVirtually(unsigned int seconds) {
     std::function<void(unsigned int)> hook;
     {
-        std::lock_guard lock(mutex);
+        std::lock_guard lock(sleepMutex);
         recorded.push_back({std::this_thread::get_id(), seconds});
         hook = sleepHook;
     }
@@ -47,19 +47,19 @@ void VirtualClock::stepAtEachReading(time_t seconds) {
 }
 
 std::vector<Sleep> VirtualClock::sleeps() {
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(sleepMutex);
     return recorded;
 }
 
 void VirtualClock::onSleep(std::function<void(unsigned int)> hook) {
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(sleepMutex);
     sleepHook = std::move(hook);
 }
 
 void VirtualClock::reset(time_t now) {
     set(now);
     stepAtEachReading(0);
-    std::lock_guard lock(mutex);
+    std::lock_guard lock(sleepMutex);
     recorded.clear();
     sleepHook = nullptr;
 }

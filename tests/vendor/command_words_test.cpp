@@ -8,7 +8,7 @@ namespace {
 
 using nlohmann::json;
 
-std::string errorOf(const std::string& command) {
+std::string commandError(const std::string& command) {
     try {
         commandWords(command);
     } catch (const ScenarioError& error) {
@@ -59,14 +59,14 @@ TEST(CommandWords, WordsFollowEachOther) {
 }
 
 TEST(CommandWords, WhatIsOpenIsRefused) {
-    EXPECT_EQ(errorOf("a=\"x"), "command: a quotation mark is missing");
-    EXPECT_EQ(errorOf("a=[1, 2"), "command: a bracket is missing");
-    EXPECT_EQ(errorOf("a=\"x\"y"), "command: a blank is missing behind \"x\"");
-    EXPECT_EQ(errorOf("a=[oops]"), "command: line 1, column 2: not valid JSON");
-    EXPECT_EQ(errorOf("a=[1e999]"), "command: line 1, column 7: the number is too large");
-    EXPECT_NE(errorOf("a=" + std::string(200000, '[')).find("a bracket is missing"),
+    EXPECT_EQ(commandError("a=\"x"), "command: a quotation mark is missing");
+    EXPECT_EQ(commandError("a=[1, 2"), "command: a bracket is missing");
+    EXPECT_EQ(commandError("a=\"x\"y"), "command: a blank is missing behind \"x\"");
+    EXPECT_EQ(commandError("a=[oops]"), "command: line 1, column 2: not valid JSON");
+    EXPECT_EQ(commandError("a=[1e999]"), "command: line 1, column 7: the number is too large");
+    EXPECT_NE(commandError("a=" + std::string(200000, '[')).find("a bracket is missing"),
               std::string::npos);
-    EXPECT_NE(errorOf("a=" + std::string(200000, '[') + std::string(200000, ']'))
+    EXPECT_NE(commandError("a=" + std::string(200000, '[') + std::string(200000, ']'))
                   .find("nested deeper than 64 levels"),
               std::string::npos);
 }

@@ -9,18 +9,18 @@ namespace {
 
 using nlohmann::json;
 
-const json kArray = json::parse(R"({"controllers": [{"id": "C 0", "drives": [
+const json kThreeDrives = json::parse(R"({"controllers": [{"id": "C 0", "drives": [
     {"id": "5", "slot": 5, "enclosure": "32", "name": "a \"b\"", "pool": "DG0", "state": "failed"},
     {"id": "s", "state": "hot spare", "status": 2}, {"id": "k"}]}]})");
 
 TEST(PulledDrives, NothingIsMissing) {
-    EXPECT_TRUE(pulledDrives(kArray, kArray).empty());
+    EXPECT_TRUE(pulledDrives(kThreeDrives, kThreeDrives).empty());
 }
 
 TEST(PulledDrives, AreAddedByTheCommandThatTheyCarry) {
-    json now = kArray;
+    json now = kThreeDrives;
     now["controllers"][0]["drives"] = json::array({json{{"id", "k"}}});
-    const auto pulled = pulledDrives(kArray, now);
+    const auto pulled = pulledDrives(kThreeDrives, now);
     ASSERT_EQ(pulled.size(), 2u);
     EXPECT_EQ(pulled[0].controller, "C 0");
     EXPECT_EQ(pulled[0].id, "5");
@@ -34,7 +34,7 @@ TEST(PulledDrives, AreAddedByTheCommandThatTheyCarry) {
 }
 
 TEST(PulledDrives, ControllersThatAreGoneHaveNoSlots) {
-    EXPECT_TRUE(pulledDrives(kArray, json::parse(R"({"controllers": []})")).empty());
+    EXPECT_TRUE(pulledDrives(kThreeDrives, json::parse(R"({"controllers": []})")).empty());
 }
 
 }  // namespace

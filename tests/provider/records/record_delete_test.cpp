@@ -11,7 +11,7 @@ namespace plexortest {
 namespace {
 
 /// One kind of device and what its deletion says.
-struct Kind {
+struct DeletedKind {
     const char* name;
     int (*remove)(RaidController_t* ctrl, void* device);
     List_t* RaidController_t::*list;
@@ -21,11 +21,11 @@ struct Kind {
     bool releasedUnderLock;
 };
 
-void PrintTo(const Kind& kind, std::ostream* out) {
+void PrintTo(const DeletedKind& kind, std::ostream* out) {
     *out << kind.name;
 }
 
-const Kind kKinds[] = {
+const DeletedKind kDeletedKinds[] = {
     {"Volume",
      DeleteVolume,
      &RaidController_t::VolumeList,
@@ -72,7 +72,7 @@ const Kind kKinds[] = {
      false},
 };
 
-class RecordDelete : public ProviderTest, public ::testing::WithParamInterface<Kind> {
+class RecordDelete : public ProviderTest, public ::testing::WithParamInterface<DeletedKind> {
 protected:
     void SetUp() override {
         ProviderTest::SetUp();
@@ -105,7 +105,7 @@ protected:
     RaidController_t* ctrl = nullptr;
 };
 
-INSTANTIATE_TEST_SUITE_P(EveryKind, RecordDelete, ::testing::ValuesIn(kKinds),
+INSTANTIATE_TEST_SUITE_P(EveryKind, RecordDelete, ::testing::ValuesIn(kDeletedKinds),
                          [](const auto& kind) { return std::string(kind.param.name); });
 
 TEST_P(RecordDelete, TakesTheRecordOutAndReleasesIt) {

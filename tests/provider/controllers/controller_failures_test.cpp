@@ -108,7 +108,7 @@ TEST_F(ControllerFailures, EverythingFails) {
 // The allocations of one controller: record, DeviceID, Model, four versions, list entry.
 constexpr std::size_t kAllocations = 8;
 
-struct Shortage {
+struct ControllerShortage {
     std::size_t allocation;
     int result;
     const char* summary;  ///< of the controller; null when there is none
@@ -118,7 +118,7 @@ struct Shortage {
 TEST_F(ControllerFailures, EachAllocationOfAController) {
     addFullController(addProfile(), "C0");
     const std::string copyFailed = "strdup() failed to duplicate string ";
-    const Shortage shortages[] = {
+    const ControllerShortage shortages[] = {
         {1, -2, nullptr,
          errorLine("BuildControllerInfo, failed to allocate memory for RaidController_t\n")},
         {2, 0, nullptr, warningLine(copyFailed + "C0\n")},
@@ -130,7 +130,7 @@ TEST_F(ControllerFailures, EachAllocationOfAController) {
         {8, -2, nullptr,
          errorLine("BuildControllerInfo: failed to add controller to list, rc -2.\n")},
     };
-    for (const Shortage& shortage : shortages) {
+    for (const ControllerShortage& shortage : shortages) {
         SCOPED_TRACE(shortage.allocation);
         const auto fault = FailAllocation::nth(shortage.allocation);
         EXPECT_EQ(build(), shortage.result);

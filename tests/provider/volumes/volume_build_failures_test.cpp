@@ -177,7 +177,7 @@ struct VolumeAllocation {
     std::vector<std::string> complaints;
 };
 
-const VolumeAllocation kAllocations[] = {
+const VolumeAllocation kVolumeAllocations[] = {
     {"Record",
      1,
      -2,
@@ -238,11 +238,11 @@ TEST_P(VolumeBuildMemory, HasThisOutcome) {
     EXPECT_EQ(ctrl_->VolumeUpdateTime, kStart);
 }
 
-INSTANTIATE_TEST_SUITE_P(Volume, VolumeBuildMemory, testing::ValuesIn(kAllocations),
+INSTANTIATE_TEST_SUITE_P(Volume, VolumeBuildMemory, testing::ValuesIn(kVolumeAllocations),
                          [](const auto& given) { return given.param.label; });
 
 TEST_F(VolumeBuildFailures, MemoryRunningOutForGoodTurnsTheVolumeAway) {
-    for (const VolumeAllocation& first : kAllocations) {
+    for (const VolumeAllocation& first : kVolumeAllocations) {
         SCOPED_TRACE(first.label);
         const bool beforeTheCopies = first.number <= 2;
         const auto fault = FailAllocation::from(first.number);
@@ -254,7 +254,7 @@ TEST_F(VolumeBuildFailures, MemoryRunningOutForGoodTurnsTheVolumeAway) {
 TEST_F(VolumeBuildFailures, AllocationsAreAllInTheTable) {
     const auto count = FailAllocation::none();
     ASSERT_EQ(buildVolume(), 0);
-    EXPECT_EQ(count.calls(), std::size(kAllocations));
+    EXPECT_EQ(count.calls(), std::size(kVolumeAllocations));
 }
 
 TEST_F(VolumeBuildFailures, ListFailureIsLoggedWithoutTheLock) {
@@ -285,7 +285,7 @@ struct VolumeNumber {
             [](const StorageVolume_t* volume) -> std::uint64_t { return volume->name; } \
     }
 
-constexpr VolumeNumber kNumbers[] = {
+constexpr VolumeNumber kVolumeNumbers[] = {
     VOLUME_NUMBER(NumberOfBlocks, false),
     VOLUME_NUMBER(ConsumableBlocks, false),
     VOLUME_NUMBER(DataRedundancy, false),
@@ -313,7 +313,7 @@ TEST_P(VolumeBuildValues, CountAsZeroWhenOdd) {
     }
 }
 
-INSTANTIATE_TEST_SUITE_P(Volume, VolumeBuildValues, testing::ValuesIn(kNumbers),
+INSTANTIATE_TEST_SUITE_P(Volume, VolumeBuildValues, testing::ValuesIn(kVolumeNumbers),
                          [](const auto& given) { return given.param.property; });
 
 TEST_F(VolumeBuildFailures, OddTextsAreNull) {

@@ -13,12 +13,11 @@ using testing::IsEmpty;
 using testing::SizeIs;
 
 constexpr char kFull[] = "BuildLogicalDeviceInfo: FIFO full, waiting...\n";
-constexpr char kWaiting[] = "BuildLogicalDeviceInfo: FIFO not empty, waiting...\n";
 
 class DevicesQueue : public DevicesTest {
 protected:
     static std::size_t fullLines() { return CapturedSyslog::count(kFull); }
-    static std::size_t waitLines() { return CapturedSyslog::count(kWaiting); }
+    static std::size_t waitLines() { return CapturedSyslog::count(kWaiting.text); }
     /// Every wait so far was one second of this thread's.
     void expectOneSecondWaits(std::size_t count) {
         EXPECT_THAT(VirtualClock::sleeps(), SizeIs(count));
@@ -143,7 +142,7 @@ TEST_F(DevicesQueue, WaitsAfterAFailedQueryToo) {
     VirtualClock::onSleep([](unsigned int) { setActiveThreads(1); });
     EXPECT_EQ(walk(), 0);
     EXPECT_EQ(waitLines(), 1u);
-    EXPECT_TRUE(loggedInOrder({debugLine(kWaiting), debugLine("BuildLogicalDeviceInfo, DONE...\n"),
+    EXPECT_TRUE(loggedInOrder({kWaiting, debugLine("BuildLogicalDeviceInfo, DONE...\n"),
                                debugLine("BuildLogicalDeviceInfo, exit...\n")}));
 }
 

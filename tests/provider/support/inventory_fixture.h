@@ -15,6 +15,9 @@
 
 namespace plexortest {
 
+/// What the profile that is looked for is registered as.
+inline constexpr char kProfileName[] = "Host Hardware RAID Controller";
+
 inline LogLine debugLine(std::string text) {
     return {LOG_DEBUG, std::move(text)};
 }

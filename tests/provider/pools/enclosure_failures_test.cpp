@@ -64,7 +64,7 @@ TYPED_TEST(EnclosureFailures, PathThatCannotBeCloned) {
 }
 
 TYPED_TEST(EnclosureFailures, EveryAllocationInTurn) {
-    for (const Shortage& shortage : TypeParam::shortages(this->rejected())) {
+    for (const EnclosureShortage& shortage : TypeParam::shortages(this->rejected())) {
         SCOPED_TRACE(shortage.allocation);
         this->startOver();
         const auto fault = FailAllocation::nth(shortage.allocation);

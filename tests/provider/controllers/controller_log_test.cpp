@@ -7,8 +7,8 @@ namespace {
 using testbed::CimValue;
 using testing::ElementsAre;
 
-const LogLine kEnter = debugLine("BuildControllerInfo, enter...\n");
-const LogLine kExit = debugLine("BuildControllerInfo, EXIT(0).\n");
+const LogLine kBuildEnter = debugLine("BuildControllerInfo, enter...\n");
+const LogLine kBuildExit = debugLine("BuildControllerInfo, EXIT(0).\n");
 
 class ControllerLog : public ControllerTest {
 protected:
@@ -34,7 +34,7 @@ protected:
 
 TEST_F(ControllerLog, NoProfile) {
     ASSERT_EQ(build(), 0);
-    EXPECT_THAT(inventoryLog(), ElementsAre(kEnter, kExit));
+    EXPECT_THAT(inventoryLog(), ElementsAre(kBuildEnter, kBuildExit));
 }
 
 TEST_F(ControllerLog, CompleteController) {
@@ -46,7 +46,7 @@ TEST_F(ControllerLog, CompleteController) {
     EXPECT_THAT(
         inventoryLog(),
         ElementsAre(
-            kEnter, profileQuery(profile), systemQuery(vendor.port),
+            kBuildEnter, profileQuery(profile), systemQuery(vendor.port),
             debugLine("PortController: " + port + "\n"), packageQuery(vendor.port),
             softwareQuery(vendor.system),
             debugLine("BuildControllerInfo: ctrl C0, swClass 10, versionStr FW-C0\n"),
@@ -64,7 +64,7 @@ TEST_F(ControllerLog, CompleteController) {
                      "\tOperationalStatus - 2\n"),
             debugLine(formatted("BuildControllerInfo: controller %p added to the list\n",
                                 static_cast<void*>(controllers()[0]))),
-            kExit));
+            kBuildExit));
 }
 
 TEST_F(ControllerLog, BareControllerIsStillDumped) {
@@ -84,9 +84,9 @@ TEST_F(ControllerLog, ControllerWithoutDeviceId) {
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(
         inventoryLog(),
-        ElementsAre(kEnter, profileQuery(profile),
+        ElementsAre(kBuildEnter, profileQuery(profile),
                     errorLine("NULL DeviceID for PortController: " + vendor.port.text() + "\n"),
-                    kExit));
+                    kBuildExit));
 }
 
 TEST_F(ControllerLog, ControllerWithoutDeviceIdAndPath) {
@@ -96,8 +96,8 @@ TEST_F(ControllerLog, ControllerWithoutDeviceIdAndPath) {
     failOnly(answerNull(Entry::Clone));
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(inventoryLog(),
-                ElementsAre(kEnter, profileQuery(profile),
-                            errorLine("NULL DeviceID for PortController: NULL\n"), kExit));
+                ElementsAre(kBuildEnter, profileQuery(profile),
+                            errorLine("NULL DeviceID for PortController: NULL\n"), kBuildExit));
 }
 
 TEST_F(ControllerLog, ControllerWithoutSystem) {
@@ -106,8 +106,8 @@ TEST_F(ControllerLog, ControllerWithoutSystem) {
     ASSERT_TRUE(repository.remove(vendor.system));
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(inventoryLog(),
-                ElementsAre(kEnter, profileQuery(profile), systemQuery(vendor.port),
-                            debugLine("PortController: " + vendor.port.text() + "\n"), kExit));
+                ElementsAre(kBuildEnter, profileQuery(profile), systemQuery(vendor.port),
+                            debugLine("PortController: " + vendor.port.text() + "\n"), kBuildExit));
 }
 
 TEST_F(ControllerLog, VendorsTextsAreNoFormats) {

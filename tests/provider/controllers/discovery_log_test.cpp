@@ -6,7 +6,6 @@ namespace {
 
 using testbed::CimValue;
 
-constexpr char kName[] = "Host Hardware RAID Controller";
 using testing::ElementsAre;
 
 const LogLine kEntering = debugLine("GetHHRCProfiles: entering...\n");
@@ -27,8 +26,8 @@ protected:
 };
 
 TEST_F(DiscoveryLog, AsksOnceForAllRegistrations) {
-    vendor_.profile(kName, "P0");
-    vendor_.profile(kName, "P1");
+    vendor_.profile(kProfileName, "P0");
+    vendor_.profile(kProfileName, "P1");
     ASSERT_EQ(discover(), 2);
     const auto calls = books().calls();
     ASSERT_EQ(calls.size(), 2u);
@@ -40,7 +39,7 @@ TEST_F(DiscoveryLog, AsksOnceForAllRegistrations) {
 }
 
 TEST_F(DiscoveryLog, OneRegistrationAndAnother) {
-    vendor_.profile(kName, "P1");
+    vendor_.profile(kProfileName, "P1");
     vendor_.profile("Fan", "F");
     ASSERT_EQ(discover(), 1);
     EXPECT_THAT(
@@ -56,7 +55,7 @@ TEST_F(DiscoveryLog, OneRegistrationAndAnother) {
 }
 
 TEST_F(DiscoveryLog, ReadsNameOrganizationVersionInThisOrder) {
-    vendor_.profile(kName, "P1");
+    vendor_.profile(kProfileName, "P1");
     books().recordObjectCalls(true);
     ASSERT_EQ(discover(), 1);
     std::vector<std::string> read;
@@ -87,7 +86,7 @@ TEST_F(DiscoveryLog, PathCannotBeMade) {
 }
 
 TEST_F(DiscoveryLog, NoPathInSpiteOfAnOkStatus) {
-    vendor_.profile(kName, "P1");
+    vendor_.profile(kProfileName, "P1");
     failOnly(answerNull(Entry::NewObjectPath));
     EXPECT_EQ(discover(), 0);
     EXPECT_THAT(inventoryLog(),
@@ -96,7 +95,7 @@ TEST_F(DiscoveryLog, NoPathInSpiteOfAnOkStatus) {
 }
 
 TEST_F(DiscoveryLog, FailedEnumerationIsNoErrorResult) {
-    vendor_.profile(kName, "P1");
+    vendor_.profile(kProfileName, "P1");
     for (const QueryFailure& failure : queryFailures()) {
         SCOPED_TRACE(failure.name);
         auto rule = failure.answer;
@@ -117,7 +116,7 @@ TEST_F(DiscoveryLog, FailedEnumerationIsNoErrorResult) {
 }
 
 TEST_F(DiscoveryLog, TooManyRegistrations) {
-    for (int i = 0; i < 9; i++) vendor_.profile(kName, "P" + std::to_string(i));
+    for (int i = 0; i < 9; i++) vendor_.profile(kProfileName, "P" + std::to_string(i));
     EXPECT_EQ(discover(), -5);
     const auto log = inventoryLog();
     ASSERT_EQ(log.size(), 2u + 8u * 2u + 2u);
@@ -126,14 +125,14 @@ TEST_F(DiscoveryLog, TooManyRegistrations) {
 }
 
 TEST_F(DiscoveryLog, RegistrationWithoutPath) {
-    vendor_.profile(kName, "P1");
+    vendor_.profile(kProfileName, "P1");
     failOnly(answerNull(Entry::InstanceGetObjectPath));
     EXPECT_EQ(discover(), 1);
     EXPECT_TRUE(logged(LOG_INFO, "Found a HHRC profile: NULL\n"));
 }
 
 TEST_F(DiscoveryLog, AbsentTextsArePrintedAsNull) {
-    const Path bare = vendor_.profile(kName, "bare");
+    const Path bare = vendor_.profile(kProfileName, "bare");
     for (const char* name : {"RegisteredName", "RegisteredVersion", "RegisteredOrganization"}) {
         unset(bare, name);
     }
@@ -144,7 +143,7 @@ TEST_F(DiscoveryLog, AbsentTextsArePrintedAsNull) {
 }
 
 TEST_F(DiscoveryLog, VendorsTextsAreNoFormats) {
-    set(vendor_.profile(kName, "P%s"), "RegisteredVersion", CimValue::string("%n%s%d%%"));
+    set(vendor_.profile(kProfileName, "P%s"), "RegisteredVersion", CimValue::string("%n%s%d%%"));
     EXPECT_EQ(discover(), 1);
     EXPECT_TRUE(logged(LOG_DEBUG,
                        "CIM_RegisteredProfile: RegisteredName Host Hardware RAID "
@@ -156,7 +155,7 @@ TEST_F(DiscoveryLog, VendorsTextsAreNoFormats) {
 }
 
 TEST_F(DiscoveryLog, MaskedLinesCostNoCallForTheirTexts) {
-    vendor_.profile(kName, "P1");
+    vendor_.profile(kProfileName, "P1");
     books().recordObjectCalls(true);
     setlogmask(LOG_UPTO(LOG_ERR));
     EXPECT_EQ(discover(), 1);

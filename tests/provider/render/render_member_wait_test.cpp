@@ -49,14 +49,14 @@ protected:
     int missed = 0;
 };
 
-constexpr const char* kName =
+constexpr const char* kNameOfAll =
     "RAID5 Volume 1 Logical Volume 1 on controller C0, Drives(d1,late,d3) - OPTIMAL";
 
 TEST_F(RenderMemberWait, TheSameMemberIsLookedUpAgainUntilItAppears) {
     for (const int misses : {1, 5, 200}) {
         CapturedSyslog::clear();
         appearAfterMisses("late", misses);
-        EXPECT_EQ(kName, valueOf(rowsOf(FillVolumeInstance, ctrl, volume), "ElementName"));
+        EXPECT_EQ(kNameOfAll, valueOf(rowsOf(FillVolumeInstance, ctrl, volume), "ElementName"));
         EXPECT_EQ(static_cast<size_t>(misses), lookupsOf("late", "can not find"));
         EXPECT_EQ(1u, lookupsOf("late", "found"));
         // The walk went on from there, without a second look at the others.
@@ -70,7 +70,7 @@ TEST_F(RenderMemberWait, ARequestIsAnsweredWhenTheRecordAppears) {
     appearAfterMisses("late", 3);
     const testbed::Response response = client().enumerateInstances("Tovexa_PlexorStorageVolume");
     ASSERT_EQ(1u, response.instances.size());
-    EXPECT_EQ(kName, property(response.instances[0], "ElementName"));
+    EXPECT_EQ(kNameOfAll, property(response.instances[0], "ElementName"));
     EXPECT_EQ(1, response.doneCalls);
 }
 

@@ -11,15 +11,12 @@
 namespace {
 
 using plexortest::CapturedSyslog;
+using plexortest::currentProcessLine;
 using plexortest::formatted;
 using plexortest::LogLine;
 using plexortest::VirtualClock;
 using plexortest::WorkersHeld;
 using testbed::Entry;
-
-std::string currentProcessLine() {
-    return formatted("Current process:pid=%d, ppid=%d\n", getpid(), getppid());
-}
 
 class EntryFactoryTest : public plexortest::EntryTest {
 protected:

@@ -26,16 +26,15 @@ protected:
     }
 };
 
-const LogLine kEnter = debugLine("BuildLogicalDeviceInfo, enter...\n");
-const LogLine kWaiting = debugLine("BuildLogicalDeviceInfo: FIFO not empty, waiting...\n");
+const LogLine kWalkEnter = debugLine("BuildLogicalDeviceInfo, enter...\n");
 const LogLine kDone = debugLine("BuildLogicalDeviceInfo, DONE...\n");
-const LogLine kExit = debugLine("BuildLogicalDeviceInfo, exit...\n");
+const LogLine kWalkExit = debugLine("BuildLogicalDeviceInfo, exit...\n");
 
 TEST_F(DevicesWalk, NoDevices) {
     EXPECT_EQ(walk(), 0);
     EXPECT_THAT(taken(), IsEmpty());
     EXPECT_THAT(VirtualClock::sleeps(), IsEmpty());
-    EXPECT_THAT(inventoryLog(), ElementsAre(kEnter, source(), query(), kDone, kExit));
+    EXPECT_THAT(inventoryLog(), ElementsAre(kWalkEnter, source(), query(), kDone, kWalkExit));
 }
 
 TEST_F(DevicesWalk, OneQueryForDevicesOfAllKinds) {
@@ -99,9 +98,9 @@ TEST_F(DevicesWalk, Log) {
     const Path drive = vendor_.drive(vendor, "d1").drive;
     EXPECT_EQ(walk(), 0);
     EXPECT_THAT(inventoryLog(),
-                ElementsAre(kEnter, source(), query(), classified(1, volume), added(volume),
+                ElementsAre(kWalkEnter, source(), query(), classified(1, volume), added(volume),
                             classified(99, fan), classified(3, drive), added(drive), kWaiting,
-                            kDone, kExit));
+                            kDone, kWalkExit));
 }
 
 TEST_F(DevicesWalk, BuildsNothingItself) {
@@ -120,7 +119,7 @@ TEST_F(DevicesWalk, FailedQueryQueuesNothing) {
         failOnly(along("CIM_SystemDevice", failure.answer));
         EXPECT_EQ(walk(), 0);
         EXPECT_THAT(taken(), IsEmpty());
-        std::vector<LogLine> expected = {kEnter, source(), query()};
+        std::vector<LogLine> expected = {kWalkEnter, source(), query()};
         if (failure.logged) {
             expected.push_back(errorLine("Associators " + vendor.system.text() +
                                          " (assocClass: CIM_SystemDevice, resultClass: NULL) "
@@ -128,7 +127,7 @@ TEST_F(DevicesWalk, FailedQueryQueuesNothing) {
                                          *failure.logged));
         }
         expected.push_back(kDone);
-        expected.push_back(kExit);
+        expected.push_back(kWalkExit);
         EXPECT_EQ(inventoryLog(), expected);
         EXPECT_EQ(books().calls().size(), 1u);
     }

@@ -6,8 +6,6 @@ namespace {
 
 using testbed::CimValue;
 
-constexpr char kName[] = "Host Hardware RAID Controller";
-
 class DiscoveryProfiles : public InventoryTest {
 protected:
     int discover() {
@@ -15,7 +13,7 @@ protected:
         return GetHHRCProfiles(&mi, ctx(), &profiles_);
     }
     void addProfiles(int count, const std::string& prefix = "P",
-                     const std::string& name = "Host Hardware RAID Controller") {
+                     const std::string& name = kProfileName) {
         for (int i = 0; i < count; i++) vendor_.profile(name, prefix + std::to_string(i));
     }
     /// InstanceIDs of the stored profiles.
@@ -38,7 +36,7 @@ TEST_F(DiscoveryProfiles, NoRegistrationAtAll) {
 
 TEST_F(DiscoveryProfiles, OneAmongOthersIsFound) {
     vendor_.profile("Fan", "fan");
-    vendor_.profile(kName, "raid");
+    vendor_.profile(kProfileName, "raid");
     vendor_.profile("Base Server", "server");
     EXPECT_EQ(discover(), 1);
     EXPECT_EQ(found(), (std::vector<std::string>{"raid"}));
@@ -63,10 +61,10 @@ TEST_F(DiscoveryProfiles, TheNameMustBeExact) {
 }
 
 TEST_F(DiscoveryProfiles, VersionAndOrganizationSelectNothing) {
-    const Path other = vendor_.profile(kName, "other");
+    const Path other = vendor_.profile(kProfileName, "other");
     set(other, "RegisteredOrganization", CimValue::uint16(65535));
     set(other, "RegisteredVersion", CimValue::string("99.0"));
-    const Path bare = vendor_.profile(kName, "bare");
+    const Path bare = vendor_.profile(kProfileName, "bare");
     unset(bare, "RegisteredOrganization");
     unset(bare, "RegisteredVersion");
     EXPECT_EQ(discover(), 2);
@@ -74,7 +72,7 @@ TEST_F(DiscoveryProfiles, VersionAndOrganizationSelectNothing) {
 }
 
 TEST_F(DiscoveryProfiles, StoresTheInstancesThemselves) {
-    vendor_.profile(kName, "raid");
+    vendor_.profile(kProfileName, "raid");
     ASSERT_EQ(discover(), 1);
     EXPECT_EQ(books().kindOf(profiles_.Array[0]), testbed::ObjectKind::Instance);
     EXPECT_EQ(books().liveClones(), 0u);
@@ -117,7 +115,7 @@ TEST_F(DiscoveryProfiles, NinthElementNeedNotBeAnInstanceToBeTooMany) {
 
 TEST_F(DiscoveryProfiles, NinthElementIsNotRead) {
     addProfiles(8);
-    vendor_.profile(kName, "last");
+    vendor_.profile(kProfileName, "last");
     books().recordObjectCalls(true);
     EXPECT_EQ(discover(), -5);
     EXPECT_EQ(books().count(Entry::EnumerationGetNext), 8u);
@@ -134,32 +132,32 @@ TEST_F(DiscoveryProfiles, MissingArgumentsAreRefused) {
 }
 
 TEST_F(DiscoveryProfiles, ManagerHandleIsNotNeeded) {
-    vendor_.profile(kName, "raid");
+    vendor_.profile(kProfileName, "raid");
     EXPECT_EQ(GetHHRCProfiles(nullptr, ctx(), &profiles_), 1);
 }
 
 TEST_F(DiscoveryProfiles, NameThatIsNoTextIsNoMatch) {
     for (const BadValue& bad : notTexts()) {
         repository.clearInstances();
-        set(vendor_.profile(kName, "bad"), "RegisteredName", bad.value);
-        vendor_.profile(kName, "good");
+        set(vendor_.profile(kProfileName, "bad"), "RegisteredName", bad.value);
+        vendor_.profile(kProfileName, "good");
         EXPECT_EQ(discover(), 1) << bad.name;
         EXPECT_EQ(found(), (std::vector<std::string>{"good"})) << bad.name;
     }
     repository.clearInstances();
-    unset(vendor_.profile(kName, "bad"), "RegisteredName");
+    unset(vendor_.profile(kProfileName, "bad"), "RegisteredName");
     EXPECT_EQ(discover(), 0);
 }
 
 TEST_F(DiscoveryProfiles, OtherPropertiesMayHoldAnything) {
     for (const BadValue& bad : notTexts()) {
         repository.clearInstances();
-        set(vendor_.profile(kName, "bad"), "RegisteredVersion", bad.value);
+        set(vendor_.profile(kProfileName, "bad"), "RegisteredVersion", bad.value);
         EXPECT_EQ(discover(), 1) << bad.name;
     }
     for (const BadValue& bad : notNumbers()) {
         repository.clearInstances();
-        set(vendor_.profile(kName, "bad"), "RegisteredOrganization", bad.value);
+        set(vendor_.profile(kProfileName, "bad"), "RegisteredOrganization", bad.value);
         EXPECT_EQ(discover(), 1) << bad.name;
     }
 }

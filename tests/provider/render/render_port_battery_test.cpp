@@ -10,12 +10,13 @@ namespace plexortest {
 namespace {
 
 /// HealthState for each OperationalStatus from 0 to 18, and what lies behind them.
-constexpr CMPIUint16 kHealth[] = {0, 0, 5, 0, 0, 0, 30, 0, 0, 0, 0, 0, 20, 0, 0, 5, 0, 0, 0};
-constexpr CMPIUint16 kStatuses = sizeof kHealth / sizeof kHealth[0];
+constexpr CMPIUint16 kHealthByStatus[] = {0, 0, 5,  0, 0, 0, 30, 0, 0, 0,
+                                          0, 0, 20, 0, 0, 5, 0,  0, 0};
+constexpr CMPIUint16 kStatuses = sizeof kHealthByStatus / sizeof kHealthByStatus[0];
 
 TEST(RenderHealthState, FollowsTheOperationalStatus) {
     for (CMPIUint16 status = 0; status < kStatuses; status++) {
-        EXPECT_EQ(kHealth[status], GetHealthStateByOpStatus(status)) << "status " << status;
+        EXPECT_EQ(kHealthByStatus[status], GetHealthStateByOpStatus(status)) << "status " << status;
     }
     for (const CMPIUint16 status : {19, 256 + 2, 32768, 65535}) {
         EXPECT_EQ(0, GetHealthStateByOpStatus(status)) << "status " << status;
@@ -55,7 +56,7 @@ TEST_F(RenderPort, SetsEveryPropertyInOrder) {
 TEST_F(RenderPort, HealthFollowsTheStatus) {
     for (CMPIUint16 status = 0; status < kStatuses; status++) {
         port->OperationalStatus = status;
-        EXPECT_EQ(std::to_string(kHealth[status]), valueOf(rows(), "HealthState"));
+        EXPECT_EQ(std::to_string(kHealthByStatus[status]), valueOf(rows(), "HealthState"));
         EXPECT_EQ("uint16[1]{0:uint16 " + std::to_string(status) + "}",
                   valueOf(rows(), "OperationalStatus"));
     }
@@ -133,7 +134,7 @@ TEST_F(RenderBattery, SetsEveryPropertyInOrder) {
 TEST_F(RenderBattery, HealthFollowsTheStatus) {
     for (CMPIUint16 status = 0; status < kStatuses; status++) {
         battery->OperationalStatus = status;
-        EXPECT_EQ(std::to_string(kHealth[status]), valueOf(rows(), "HealthState"));
+        EXPECT_EQ(std::to_string(kHealthByStatus[status]), valueOf(rows(), "HealthState"));
         EXPECT_EQ("uint16[1]{0:uint16 " + std::to_string(status) + "}",
                   valueOf(rows(), "OperationalStatus"));
     }

@@ -35,9 +35,9 @@ namespace {
 using Questions = std::vector<std::string>;
 
 /// An option that is no number; notes what it is asked.
-class TextOption : public AdvancedOption {
+class AskedTextOption : public AdvancedOption {
 public:
-    TextOption(Questions& asked, std::function<bool()> isDefault)
+    AskedTextOption(Questions& asked, std::function<bool()> isDefault)
         : asked_(asked), isDefault_(std::move(isDefault)) {}
     bool IsDefault() const override {
         asked_.push_back("state");
@@ -50,9 +50,9 @@ private:
 };
 
 /// One whose value is 45.
-class NumberOption : public Nodecfg::Adv::AdvancedIntegerOption {
+class AskedNumberOption : public Nodecfg::Adv::AdvancedIntegerOption {
 public:
-    NumberOption(Questions& asked, std::function<bool()> isDefault)
+    AskedNumberOption(Questions& asked, std::function<bool()> isDefault)
         : AdvancedIntegerOption(45, false), asked_(asked), isDefault_(std::move(isDefault)) {}
     bool IsDefault() const override {
         asked_.push_back("state");
@@ -83,27 +83,27 @@ protected:
 };
 
 TEST_F(PollingOption, IsAskedForItsStateAndThenItsValue) {
-    provide<NumberOption>([] { return false; });
+    provide<AskedNumberOption>([] { return false; });
     EXPECT_EQ(GetSampelInterval(), 45);
     EXPECT_EQ(asked_, (Questions{"state", "value"}));
 }
 
 TEST_F(PollingOption, AtItsDefaultIsNotAskedForItsValue) {
-    provide<NumberOption>([] { return true; });
+    provide<AskedNumberOption>([] { return true; });
     EXPECT_EQ(GetSampelInterval(), 20);
     EXPECT_EQ(asked_, Questions{"state"});
 }
 
 TEST_F(PollingOption, IsAskedForItsStateBeforeItsTypeIsLookedAt) {
-    provide<TextOption>([] { return false; });
+    provide<AskedTextOption>([] { return false; });
     EXPECT_EQ(GetSampelInterval(), 20);
     EXPECT_EQ(asked_, Questions{"state"});
 }
 
 TEST_F(PollingOption, WhoseStateCannotBeToldCountsAsTwenty) {
-    provide<NumberOption>([]() -> bool { throw std::runtime_error("no state"); });
+    provide<AskedNumberOption>([]() -> bool { throw std::runtime_error("no state"); });
     EXPECT_EQ(GetSampelInterval(), 20);
-    provide<TextOption>([]() -> bool { throw 7; });
+    provide<AskedTextOption>([]() -> bool { throw 7; });
     EXPECT_EQ(GetSampelInterval(), 20);
     EXPECT_EQ(asked_, (Questions{"state", "state"}));
     EXPECT_TRUE(CapturedSyslog::lines().empty());

@@ -9,7 +9,7 @@ class ControllerTest : public InventoryTest {
 protected:
     /// A registration that the building walks.
     Path addProfile(const std::string& id = "profile-1") {
-        const Path path = vendor_.profile("Host Hardware RAID Controller", id);
+        const Path path = vendor_.profile(kProfileName, id);
         profiles_.Array[profiles_.Count++] = instanceAt(path);
         return path;
     }

@@ -7,7 +7,7 @@ namespace {
 using testing::IsEmpty;
 
 /// The four kinds, and what differs between them.
-struct Kind {
+struct ProcessedKind {
     const char* name;
     uintptr_t code;
     testbed::ObjectPath (*add)(VendorObjects& objects, const VendorController& controller);
@@ -18,7 +18,7 @@ struct Kind {
     std::size_t paths;  ///< that a record owns
 };
 
-void PrintTo(const Kind& kind, std::ostream* out) {
+void PrintTo(const ProcessedKind& kind, std::ostream* out) {
     *out << kind.name;
 }
 
@@ -35,7 +35,7 @@ testbed::ObjectPath addBattery(VendorObjects& objects, const VendorController& c
     return objects.battery(controller, "x");
 }
 
-const Kind kKinds[] = {
+const ProcessedKind kProcessedKinds[] = {
     {"Volume", 1, addVolume, &RaidController_t::VolumeCfgMutex, &RaidController_t::VolumeList,
      &RaidController_t::VolumeUpdateTime, "BuildVolumeInfo", 1},
     {"Port", 2, addPort, &RaidController_t::PortCfgMutex, &RaidController_t::PortList,
@@ -78,13 +78,14 @@ protected:
     }
 };
 
-class DevicesProcessKind : public DevicesProcess, public testing::WithParamInterface<Kind> {};
+class DevicesProcessKind : public DevicesProcess,
+                           public testing::WithParamInterface<ProcessedKind> {};
 
-INSTANTIATE_TEST_SUITE_P(Every, DevicesProcessKind, testing::ValuesIn(kKinds),
+INSTANTIATE_TEST_SUITE_P(Every, DevicesProcessKind, testing::ValuesIn(kProcessedKinds),
                          [](const auto& param) { return param.param.name; });
 
 TEST_P(DevicesProcessKind, IsBuiltIntoItsList) {
-    const Kind& kind = GetParam();
+    const ProcessedKind& kind = GetParam();
     const Path path = kind.add(vendor_, vendor);
     VirtualClock::set(kStart + 4);
     process(itemFor(kind.code, path));
@@ -100,7 +101,7 @@ TEST_P(DevicesProcessKind, IsBuiltIntoItsList) {
 }
 
 TEST_P(DevicesProcessKind, IsBuiltUnderItsClassMutexAlone) {
-    const Kind& kind = GetParam();
+    const ProcessedKind& kind = GetParam();
     const Path path = kind.add(vendor_, vendor);
     Thread_Args_t* item = itemFor(kind.code, path);
     int watched = 0;
@@ -119,7 +120,7 @@ TEST_P(DevicesProcessKind, IsBuiltUnderItsClassMutexAlone) {
 }
 
 TEST_P(DevicesProcessKind, WaitsForItsClassMutex) {
-    const Kind& kind = GetParam();
+    const ProcessedKind& kind = GetParam();
     Thread_Args_t* item = itemFor(kind.code, kind.add(vendor_, vendor));
     CMPIContext* prepared = ::Broker->bft->prepareAttachThread(::Broker, ctx());
     pthread_mutex_lock(&(ctrl->*kind.classMutex));
@@ -139,7 +140,7 @@ TEST_P(DevicesProcessKind, WaitsForItsClassMutex) {
 }
 
 TEST_P(DevicesProcessKind, ThePathGoesBeforeTheInstance) {
-    const Kind& kind = GetParam();
+    const ProcessedKind& kind = GetParam();
     Thread_Args_t* item = itemFor(kind.code, kind.add(vendor_, vendor));
     const auto* path = reinterpret_cast<const void*>(item->Arg3);
     const auto* instance = reinterpret_cast<const void*>(item->Arg4);
@@ -153,7 +154,7 @@ TEST_P(DevicesProcessKind, ThePathGoesBeforeTheInstance) {
 }
 
 TEST_P(DevicesProcessKind, RejectedDeviceLeavesNothing) {
-    const Kind& kind = GetParam();
+    const ProcessedKind& kind = GetParam();
     const Path path = kind.add(vendor_, vendor);
     unset(path, "DeviceID");
     process(itemFor(kind.code, path));
@@ -164,7 +165,7 @@ TEST_P(DevicesProcessKind, RejectedDeviceLeavesNothing) {
 }
 
 TEST_P(DevicesProcessKind, NoMemoryForItsRecord) {
-    const Kind& kind = GetParam();
+    const ProcessedKind& kind = GetParam();
     Thread_Args_t* item = itemFor(kind.code, kind.add(vendor_, vendor));
     const auto fault = FailAllocation::from(1);
     process(item);

@@ -8,14 +8,14 @@ namespace {
 using testbed::CimValue;
 
 /// A property that is read, and how its value is seen in the record.
-struct NumberField {
+struct DiskNumber {
     const char* property;
     bool ofExtent;
     bool isArray;
     std::uint64_t (*value)(const DiskDrive_t* disk);
 };
 
-constexpr NumberField kNumbers[] = {
+constexpr DiskNumber kDiskNumbers[] = {
     {"EnabledState", false, false,
      [](const DiskDrive_t* disk) -> std::uint64_t { return disk->EnabledState; }},
     {"OperationalStatus", false, true,
@@ -30,7 +30,7 @@ constexpr NumberField kNumbers[] = {
      [](const DiskDrive_t* disk) -> std::uint64_t { return disk->ExtentStatus; }},
 };
 
-class DiskBuildValues : public DiskTest, public testing::WithParamInterface<NumberField> {
+class DiskBuildValues : public DiskTest, public testing::WithParamInterface<DiskNumber> {
 protected:
     const Path& owner() const { return GetParam().ofExtent ? objects_.extent : objects_.drive; }
 };
@@ -46,7 +46,7 @@ TEST_P(DiskBuildValues, CountAsZeroWhenOdd) {
     }
 }
 
-INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildValues, testing::ValuesIn(kNumbers),
+INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildValues, testing::ValuesIn(kDiskNumbers),
                          [](const auto& given) { return given.param.property; });
 
 class DiskBuildOddities : public DiskTest {};

@@ -9,14 +9,14 @@ using testing::ElementsAreArray;
 using testing::IsEmpty;
 
 /// The allocations of a build in order, and what the failure of each leads to.
-struct Allocation {
+struct DiskAllocation {
     const char* label;
     std::size_t number;
     int result;
     std::vector<std::string> complaints;  ///< lines above debug that the failure causes
 };
 
-const Allocation kAllocations[] = {
+const DiskAllocation kDiskAllocations[] = {
     {"Record", 1, -2, {"ERR BuildDiskInfo, failed to allocate memory for DiskDrive_t\n"}},
     {"DeviceId", 2, -1, {"WARNING strdup() failed to duplicate string D1\n", "ERR NULL DeviceID"}},
     {"Name", 3, 0, {"WARNING strdup() failed to duplicate string Disk D1\n"}},
@@ -28,7 +28,7 @@ const Allocation kAllocations[] = {
     {"ListEntry", 9, -2, {"ERR BuildDiskInfo: failed to add disk <?> to list <disks>, rc -2.\n"}},
 };
 
-class DiskBuildMemory : public DiskTest, public testing::WithParamInterface<Allocation> {
+class DiskBuildMemory : public DiskTest, public testing::WithParamInterface<DiskAllocation> {
 protected:
     /// Warnings and errors, those with a path in them cut before it.
     Lines complaints() {
@@ -44,7 +44,7 @@ protected:
 };
 
 TEST_P(DiskBuildMemory, HasThisOutcome) {
-    const Allocation& failing = GetParam();
+    const DiskAllocation& failing = GetParam();
     {
         const auto fault = FailAllocation::nth(failing.number);
         EXPECT_EQ(buildDisk(), failing.result);
@@ -66,7 +66,7 @@ TEST_P(DiskBuildMemory, HasThisOutcome) {
     EXPECT_EQ(disk()->SlotNumber, 4);
 }
 
-INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildMemory, testing::ValuesIn(kAllocations),
+INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildMemory, testing::ValuesIn(kDiskAllocations),
                          [](const auto& given) { return given.param.label; });
 
 class DiskBuildOutOfMemory : public DiskTest {
@@ -88,7 +88,7 @@ TEST_F(DiskBuildOutOfMemory, LeavesAConsistentInventoryAtEveryPoint) {
         expectConsistent(buildDisk());
         broker.flushThread();
     });
-    EXPECT_EQ(allocations, std::size(kAllocations));
+    EXPECT_EQ(allocations, std::size(kDiskAllocations));
 }
 
 TEST_F(DiskBuildOutOfMemory, OfTheRecordAsksNothing) {

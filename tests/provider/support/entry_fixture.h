@@ -2,6 +2,7 @@
 #pragma once
 
 #include <stdlib.h>
+#include <unistd.h>
 
 #include <algorithm>
 #include <atomic>
@@ -81,6 +82,11 @@ private:
         soon([] { return arrived() >= expected(); });
     }
 };
+
+/// What each first call of the factory says of the process that it is in.
+inline std::string currentProcessLine() {
+    return formatted("Current process:pid=%d, ppid=%d\n", getpid(), getppid());
+}
 
 class EntryTest : public ProviderTest {
 protected:

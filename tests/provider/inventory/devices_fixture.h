@@ -6,6 +6,9 @@
 
 namespace plexortest {
 
+/// Said whenever the walk, at its end, waits for the queue to empty.
+inline const LogLine kWaiting = debugLine("BuildLogicalDeviceInfo: FIFO not empty, waiting...\n");
+
 class DevicesTest : public InventoryTest {
 protected:
     void SetUp() override {

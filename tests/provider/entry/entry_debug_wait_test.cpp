@@ -9,6 +9,7 @@
 namespace {
 
 using plexortest::CapturedSyslog;
+using plexortest::currentProcessLine;
 using plexortest::formatted;
 using plexortest::LogLine;
 using plexortest::Sleep;
@@ -16,10 +17,6 @@ using plexortest::VirtualClock;
 
 std::string waitingLine() {
     return formatted("Waiting for hostdbgd attach:pid=%d, ppid=%d\n", getpid(), getppid());
-}
-
-std::string currentProcessLine() {
-    return formatted("Current process:pid=%d, ppid=%d\n", getpid(), getppid());
 }
 
 /// What a debugger does to the stopped process: no thread of it is a party to this write.

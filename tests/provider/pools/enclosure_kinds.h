@@ -10,7 +10,7 @@
 namespace plexortest {
 
 /// What one failing allocation makes of a build.
-struct Shortage {
+struct EnclosureShortage {
     std::size_t allocation;
     int result;
     std::vector<std::string> lines;  ///< between the first and the last
@@ -41,7 +41,7 @@ struct PoolKind {
         return {"InstanceID", "PoolID",           "TotalManagedSpace", "RemainingManagedSpace",
                 "Primordial", "OperationalStatus"};
     }
-    static std::vector<Shortage> shortages(const std::string& rejectedLine) {
+    static std::vector<EnclosureShortage> shortages(const std::string& rejectedLine) {
         return {{1, -2, {"BuildSinglePoolInfo, failed to allocate memory for StoragePool_t\n"}},
                 {2, -1, {"strdup() failed to duplicate string P1\n", rejectedLine}},
                 {3, -1, {"strdup() failed to duplicate string Pool P1\n", rejectedLine}},
@@ -76,7 +76,7 @@ struct ChassisKind {
     static std::vector<std::string> mandatory() { return {"Tag"}; }
     static std::vector<std::string> properties() { return {"Tag", "OperationalStatus"}; }
     /// The third is the internal tag, without which the chassis is cached.
-    static std::vector<Shortage> shortages(const std::string& rejectedLine) {
+    static std::vector<EnclosureShortage> shortages(const std::string& rejectedLine) {
         return {{1, -2, {"BuildSingleChassisInfo, failed to allocate memory for Chassis_t\n"}},
                 {2, -1, {"strdup() failed to duplicate string C0_E\n", rejectedLine}},
                 {4, -2, {notAdded}}};
