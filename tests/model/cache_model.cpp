@@ -49,9 +49,9 @@ std::string keyOf(const Instance& inst, const char* name) {
     return value != nullptr ? value->asString() : "";
 }
 
-/// A text as printf shows it.
+/// A text as the log shows it.
 std::string shown(const Text& value) {
-    return value ? *value : "(null)";
+    return value ? *value : "NULL";
 }
 
 std::string str(std::uint64_t value) {

@@ -82,7 +82,7 @@ BatteryState readBattery(const Battery_t& battery) {
 }
 
 std::string shown(const Text& text) {
-    return text ? *text : "(null)";
+    return text ? *text : "NULL";
 }
 
 }  // namespace

@@ -107,7 +107,7 @@ TEST_F(DiskBuildOutOfMemory, OfTheDeviceIdComplainsTwice) {
     EXPECT_THAT(logLines(),
                 ElementsAre("DEBUG BuildDiskInfo, ENTER...\n",
                             "WARNING strdup() failed to duplicate string D1\n",
-                            "ERR NULL DeviceID for disk " + kDrive + "\n", "DEBUG (null) deleted\n",
+                            "ERR NULL DeviceID for disk " + kDrive + "\n", "DEBUG NULL deleted\n",
                             "DEBUG BuildDiskInfo, EXIT(-1).\n"));
 }
 

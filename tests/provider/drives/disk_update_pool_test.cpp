@@ -188,7 +188,7 @@ TEST_F(DiskUpdatePool, LosesAPoolWhoseIdentifierCannotBeCopied) {
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_STREQ(disk()->Pool, "P2");
     EXPECT_TRUE(
-        logged(LOG_DEBUG, "CheckAndUpdateDiskInfo: disk D1 pool changed, old (null), new P2\n"));
+        logged(LOG_DEBUG, "CheckAndUpdateDiskInfo: disk D1 pool changed, old NULL, new P2\n"));
 }
 
 TEST_F(DiskUpdatePool, SurvivesEveryFailingAllocation) {

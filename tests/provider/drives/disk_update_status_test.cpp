@@ -233,7 +233,7 @@ TEST_F(DiskUpdateFetch, OfANamelessDriveIsTraced) {
     free(disk()->Name);
     disk()->Name = nullptr;
     ASSERT_EQ(updateDisk(), 0);
-    EXPECT_EQ(logLines()[0], "DEBUG CheckAndUpdateDiskInfo: ENTER. disk - (null)\n");
+    EXPECT_EQ(logLines()[0], "DEBUG CheckAndUpdateDiskInfo: ENTER. disk - NULL\n");
 }
 
 }  // namespace

@@ -21,7 +21,7 @@ struct DiskKind {
     static constexpr const char* noMemory =
         "ERR BuildDiskInfo, failed to allocate memory for DiskDrive_t\n";
     static constexpr const char* nullDeviceId = "ERR NULL DeviceID for disk ";
-    static constexpr const char* blankReleased = "DEBUG (null) deleted\n";
+    static constexpr const char* blankReleased = "DEBUG NULL deleted\n";
     static constexpr const char* exit = "DEBUG BuildDiskInfo, EXIT(";
     static constexpr const char* updated = "DEBUG CheckAndUpdateDiskInfo, exit\n";
     static testbed::ObjectPath make(VendorObjects& vendor, const VendorController& card,
@@ -44,7 +44,7 @@ struct VolumeKind {
     static constexpr const char* noMemory =
         "ERR BuildVolumeInfo, failed to allocate memory for StorageVolume_t\n";
     static constexpr const char* nullDeviceId = "ERR NULL DeviceID for volume ";
-    static constexpr const char* blankReleased = "DEBUG Volume (null) ((null)) deleted\n";
+    static constexpr const char* blankReleased = "DEBUG Volume NULL (NULL) deleted\n";
     static constexpr const char* exit = "DEBUG BuildVolumeInfo, EXIT(";
     static constexpr const char* updated = "DEBUG CheckAndUpdateVolumeInfo, exit\n";
     static testbed::ObjectPath make(VendorObjects& vendor, const VendorController& card,
@@ -67,7 +67,7 @@ struct PortKind {
     static constexpr const char* noMemory =
         "ERR BuildPortInfo, failed to allocate memory for SASSATAPort_t\n";
     static constexpr const char* nullDeviceId = "ERR NULL DeviceID for port ";
-    static constexpr const char* blankReleased = "DEBUG (null) deleted\n";
+    static constexpr const char* blankReleased = "DEBUG NULL deleted\n";
     static constexpr const char* exit = "DEBUG BuildPortInfo, EXIT(";
     static constexpr const char* updated = "DEBUG CheckAndUpdatePortInfo, exit.\n";
     static testbed::ObjectPath make(VendorObjects& vendor, const VendorController& card,
@@ -90,7 +90,7 @@ struct BatteryKind {
     static constexpr const char* noMemory =
         "ERR BuildBatteryInfo, failed to allocate memory for Battery_t\n";
     static constexpr const char* nullDeviceId = "ERR NULL DeviceID for battery ";
-    static constexpr const char* blankReleased = "DEBUG Battery (null) deleted\n";
+    static constexpr const char* blankReleased = "DEBUG Battery NULL deleted\n";
     static constexpr const char* exit = "DEBUG BuildBatteryInfo, EXIT(";
     static constexpr const char* updated = "DEBUG CheckAndUpdateBatteryInfo, exit.\n";
     static testbed::ObjectPath make(VendorObjects& vendor, const VendorController& card,

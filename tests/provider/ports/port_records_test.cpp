@@ -78,7 +78,7 @@ TEST_F(PortBuild, WithoutNameHasNone) {
     repository.eraseProperty(path_, "ElementName");
     ASSERT_EQ(buildIt(), 0);
     EXPECT_EQ(record()->PortName, nullptr);
-    EXPECT_EQ(CapturedSyslog::countContaining("\tPortName:         - (null)\n"), 1u);
+    EXPECT_EQ(CapturedSyslog::countContaining("\tPortName:         - NULL\n"), 1u);
 }
 
 TEST_F(PortBuild, OddValuesCountAsNoneOrZero) {

@@ -123,7 +123,7 @@ TEST_F(ControllerRelease, ControllerThatWasOnlyBegunIsReleased) {
         *text = nullptr;
     }
     FreeController(ctrl);
-    EXPECT_TRUE(logged(LOG_DEBUG, "Controller (null) ((null)) deleted\n"));
+    EXPECT_TRUE(logged(LOG_DEBUG, "Controller NULL (NULL) deleted\n"));
 }
 
 TEST_F(ControllerRelease, IsAReleaseFunctionOfTheControllerList) {

@@ -76,8 +76,8 @@ TEST_F(RecordRelease, RecordsWithoutAnyTextAreReleased) {
     pool->Drives = &pool->_Drives;
     FreePool(pool);
     EXPECT_EQ(CapturedSyslog::countContaining(" deleted\n"), 6u);
-    EXPECT_TRUE(logged(LOG_DEBUG, "Volume (null) ((null)) deleted\n"));
-    EXPECT_TRUE(logged(LOG_DEBUG, "Battery (null) deleted\n"));
+    EXPECT_TRUE(logged(LOG_DEBUG, "Volume NULL (NULL) deleted\n"));
+    EXPECT_TRUE(logged(LOG_DEBUG, "Battery NULL deleted\n"));
 }
 
 TEST_F(RecordRelease, TextsAreOnlyArgumentsNeverFormats) {

@@ -245,13 +245,13 @@ TEST_F(HostIdentity, ItsNamesAreReadInTheirOrder) {
 TEST_F(HostIdentity, MissingNamesAreMissingFromTheLine) {
     const std::pair<const char*, const char*> lines[] = {
         {"Name",
-         "SYSTEM INFO: HostName host, SystemName (null), "
+         "SYSTEM INFO: HostName host, SystemName NULL, "
          "SystemClassName OMC_UnitaryComputerSystem\n"},
         {"ElementName",
-         "SYSTEM INFO: HostName (null), SystemName (null), "
+         "SYSTEM INFO: HostName NULL, SystemName NULL, "
          "SystemClassName OMC_UnitaryComputerSystem\n"},
         {"CreationClassName",
-         "SYSTEM INFO: HostName (null), SystemName (null), SystemClassName (null)\n"}};
+         "SYSTEM INFO: HostName NULL, SystemName NULL, SystemClassName NULL\n"}};
     for (const auto& [name, line] : lines) {
         repository.eraseProperty(host(), name);
         EXPECT_EQ(init(), 0);

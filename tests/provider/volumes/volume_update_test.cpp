@@ -125,7 +125,7 @@ const Change kChanges[] = {
      "\n"},
     {"NameGone", "ElementName", CimValue::null(CMPI_string),
      "DEBUG CheckAndUpdateVolumeInfo: volume V1 element name changed. Old name Volume V1, new name "
-     "(null)\n"},
+     "NULL\n"},
 };
 
 class VolumeUpdateChange : public VolumeUpdate, public testing::WithParamInterface<Change> {
@@ -200,7 +200,7 @@ TEST_F(VolumeUpdate, OfANamelessVolumeThatStaysNamelessIsNoChange) {
     CapturedSyslog::clear();
     ASSERT_EQ(updateVolume(), 0);
     EXPECT_THAT(logLines(),
-                ElementsAre("DEBUG CheckAndUpdateVolumeInfo: ENTER. volume - (null)\n", kExit));
+                ElementsAre("DEBUG CheckAndUpdateVolumeInfo: ENTER. volume - NULL\n", kExit));
 }
 
 TEST_F(VolumeUpdate, GivesANamelessVolumeItsName) {
@@ -211,7 +211,7 @@ TEST_F(VolumeUpdate, GivesANamelessVolumeItsName) {
     ASSERT_EQ(updateVolume(), 0);
     EXPECT_STREQ(volume()->ElementName, "named");
     EXPECT_THAT(changes(), ElementsAre("DEBUG CheckAndUpdateVolumeInfo: volume V1 element name "
-                                       "changed. Old name (null), new name named\n"));
+                                       "changed. Old name NULL, new name named\n"));
 }
 
 TEST_F(VolumeUpdate, LosesANameThatCannotBeCopied) {
