@@ -100,7 +100,7 @@ TEST_F(InventoryAsync, FullQueueMeansNoInventoryAndNoRefreshEver) {
     EXPECT_EQ(WakeUpCounter::signals(), 0);
     {
         Worker worker(ctx());
-        ASSERT_TRUE(comesTrue([] { return queuedItems() == 0; }));
+        ASSERT_TRUE(eventually([] { return queuedItems() == 0; }));
         ASSERT_TRUE(workersComeToRest());
     }
     EXPECT_EQ(ThreadActivityDone, 0u);
@@ -177,7 +177,7 @@ TEST_F(InventoryAsync, TheTimesAreWrittenWithoutTheControllersMutex) {
     pthread_mutex_lock(&ctrl->CtrlMutex);
     {
         Worker worker(ctx());
-        EXPECT_TRUE(comesTrue([] { return threadActivityDone() == 1; }));
+        EXPECT_TRUE(eventually([] { return threadActivityDone() == 1; }));
         pthread_mutex_unlock(&ctrl->CtrlMutex);
         EXPECT_TRUE(workersComeToRest());
     }
@@ -245,7 +245,7 @@ TEST_F(InventoryAsync, RequestsAreSkippedWhileItRunsAndServedAfterIt) {
     EXPECT_EQ(queuedItems(), 0u);
 
     gate.open();
-    ASSERT_TRUE(comesTrue([] { return threadActivityDone() == 1; }));
+    ASSERT_TRUE(eventually([] { return threadActivityDone() == 1; }));
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(ctrl->PortList->Size, 30u);
     VirtualClock::advance(20);

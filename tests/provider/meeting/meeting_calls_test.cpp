@@ -109,8 +109,8 @@ TEST_F(MeetingCallsTest, AFactoryCallThatWaitsForItsTurnLeavesWithTheCleanup) {
     auto first = callFactoryElsewhere();
     ASSERT_TRUE(gate.awaitArrivals(1));
     auto second = callFactoryElsewhere();
-    ASSERT_TRUE(
-        plexortest::soon([] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 2; }));
+    ASSERT_TRUE(plexortest::eventually(
+        [] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 2; }));
     EXPECT_TRUE(stillWaits(second));
     auto cleanup = cleanUpElsewhere(true);
     EXPECT_NE(second.get(), nullptr) << "before the first has its answer";
@@ -132,7 +132,7 @@ TEST_F(MeetingCallsTest, AFactoryCallDuringACleanupBuildsAnewAfterIt) {
     EXPECT_EQ(initialized(), 1);
     EXPECT_EQ(controllers(), 1u);
     CapturedSyslog::onLine(nullptr);
-    EXPECT_TRUE(plexortest::soon([this] { return requestDrives().get() == 1; }));
+    EXPECT_TRUE(plexortest::eventually([this] { return requestDrives().get() == 1; }));
 }
 
 TEST_F(MeetingCallsTest, AnInitialisationThatHangsIsGivenUp) {
@@ -158,7 +158,7 @@ TEST_F(MeetingCallsTest, AnInitialisationThatHangsIsGivenUp) {
     EXPECT_EQ(controllers(), 1u);
     EXPECT_EQ(initialized(), 1);
     EXPECT_EQ(CapturedSyslog::countContaining("thread 0 created"), 1u);
-    EXPECT_TRUE(plexortest::soon([this] { return requestDrives().get() == 1; }));
+    EXPECT_TRUE(plexortest::eventually([this] { return requestDrives().get() == 1; }));
 }
 
 TEST_F(MeetingCallsTest, NineCleanupsAtOnceAreOne) {

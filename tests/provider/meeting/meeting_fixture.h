@@ -63,7 +63,7 @@ protected:
         return cleanup;
     }
     static bool cleanupsInside(std::size_t count) {
-        return soon([count] {
+        return eventually([count] {
             return CapturedSyslog::count("PlexorProviderCleanup: ENTER...\n") == count;
         });
     }

@@ -42,11 +42,7 @@ public:
         : thread_([this, &mutex, part = std::move(part), check = std::move(check)] {
               pthread_mutex_lock(&mutex);
               held_ = true;
-              const auto limit = std::chrono::steady_clock::now() + std::chrono::seconds(5);
-              while (CapturedSyslog::countContaining(part) == 0 &&
-                     std::chrono::steady_clock::now() < limit) {
-                  std::this_thread::sleep_for(std::chrono::milliseconds(1));
-              }
+              eventually([&part] { return CapturedSyslog::countContaining(part) != 0; });
               // Time enough for somebody who does not wait for the mutex.
               std::this_thread::sleep_for(std::chrono::milliseconds(5));
               check();

@@ -151,7 +151,7 @@ TEST_F(ReconcileTwoWorkers, TheSameClassIsRefreshedOnce) {
     ASSERT_TRUE(gate.awaitArrivals(1));
     ASSERT_EQ(request(102), 0);
     // The other worker has taken the second request and waits for the class.
-    ASSERT_TRUE(comesTrue(
+    ASSERT_TRUE(eventually(
         [] { return timesLogged(LOG_DEBUG, "ProcessDeviceConfigChange, ENTER(102)...\n") == 2; }));
     gate.open();
     ASSERT_TRUE(workersComeToRest());
@@ -173,9 +173,9 @@ TEST_F(ReconcileTwoWorkers, DifferentClassesDoNotWaitForEachOther) {
     ASSERT_EQ(request(102), 0);
     ASSERT_TRUE(gate.awaitArrivals(1));
     ASSERT_EQ(request(103), 0);
-    EXPECT_TRUE(comesTrue([this] { return countOfLists() == 1; })) << "the battery";
+    EXPECT_TRUE(eventually([this] { return countOfLists() == 1; })) << "the battery";
     gate.open();
-    EXPECT_TRUE(comesTrue([this] { return countOfLists() == 2; })) << "and the port";
+    EXPECT_TRUE(eventually([this] { return countOfLists() == 2; })) << "and the port";
     ASSERT_TRUE(workersComeToRest());
 }
 

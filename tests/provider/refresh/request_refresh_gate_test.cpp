@@ -62,7 +62,7 @@ TEST_F(RequestRefreshGate, LooksUnderTheWorkersMutexWhetherTheInventoryIsDone) {
     ThreadActivityDone = 0;
     pthread_mutex_lock(&PlexorThreadMutex);
     auto answer = std::async(std::launch::async, [this] { return request(102); });
-    EXPECT_TRUE(comesTrue([] {
+    EXPECT_TRUE(eventually([] {
         return loggedOnce(LOG_DEBUG, "HandleDeviceConfigChange: ENTER. ctrl C0, action 102\n");
     }));
     EXPECT_EQ(answer.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
@@ -146,7 +146,7 @@ TEST_F(RequestRefreshGate, TakesNoLockOfTheController) {
     auto done = std::async(std::launch::async, [this] {
         for (int action = 100; action <= 105; action++) request(action);
     });
-    const auto status = done.wait_for(std::chrono::seconds(5));
+    const auto status = done.wait_for(kGenerousLimit);
     for (pthread_mutex_t* mutex : mutexes) pthread_mutex_unlock(mutex);
     EXPECT_EQ(status, std::future_status::ready);
     EXPECT_EQ(queuedItems(), 6u);

@@ -137,7 +137,7 @@ TEST_F(RequestRefreshQueue, AWorkerRefreshesWithItsOwnContext) {
     Worker worker(ctx());
 
     ASSERT_EQ(request(103), 0);
-    ASSERT_TRUE(comesTrue([&] { return books().count(testbed::Entry::ContextFlush) == 1; }));
+    ASSERT_TRUE(eventually([&] { return books().count(testbed::Entry::ContextFlush) == 1; }));
     ASSERT_TRUE(workersComeToRest());
     worker.stop();
 

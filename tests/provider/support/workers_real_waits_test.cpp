@@ -207,7 +207,7 @@ TEST(WorkersRealWaits, HurriedWaitEndsEarlyAndIsNoted) {
 
     EXPECT_EQ(rc, ETIMEDOUT);
     EXPECT_GE(steady_clock::now() - start, std::chrono::milliseconds(19));
-    EXPECT_LT(steady_clock::now() - start, std::chrono::seconds(5));
+    EXPECT_LT(steady_clock::now() - start, std::chrono::seconds(20));
     ASSERT_EQ(HurriedWaits::workWaits().size(), 1u);
     EXPECT_NEAR(static_cast<double>(HurriedWaits::workWaits()[0].count()), 20000, 500);
 }

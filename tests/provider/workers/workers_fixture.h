@@ -36,7 +36,7 @@ protected:
     void startWorkers(std::size_t count = 2) {
         running_ = started_ = true;
         InitPlexorThreads(ctx());
-        ASSERT_TRUE(comesTrue([&] {
+        ASSERT_TRUE(eventually([&] {
             return books().count(testbed::Entry::AttachThread) >= count && idleLines() >= count;
         }));
     }
@@ -52,7 +52,7 @@ protected:
     /// A worker that stays behind would go on in the next test.
     static void expectNobodyLeft() {
         EXPECT_EQ(workersLeft(), 0u);
-        comesTrue([] { return workersLeft() == 0; });
+        eventually([] { return workersLeft() == 0; });
     }
     /// Number of workers that could not be joined, after another try.
     static std::size_t workersLeft() {

@@ -31,7 +31,7 @@ protected:
         ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
         // A slow sanitizer needs its time here.
         for (int i = 0; i < 20 && threadActivityDone() == 0; i++) {
-            comesTrue([] { return threadActivityDone() == 1; });
+            eventually([] { return threadActivityDone() == 1; });
         }
         ASSERT_TRUE(workersComeToRest());
     }

@@ -47,10 +47,10 @@ TEST_F(WorkersQuiesce, ItWaitsForEveryRunningItem) {
     ASSERT_TRUE(second.awaitArrivals(1));
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
+    ASSERT_TRUE(eventually(StopRequested));
     EXPECT_EQ(quiet.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     first.open();
-    ASSERT_TRUE(comesTrue([this] { return tasks_.ended() == 1; }));
+    ASSERT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
     EXPECT_EQ(quiet.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     second.open();
     EXPECT_TRUE(quiet.get());
@@ -69,7 +69,7 @@ TEST_F(WorkersQuiesce, AnItemRunsUntilItsThreadIsFlushed) {
     ASSERT_TRUE(gate.awaitArrivals(1));
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
+    ASSERT_TRUE(eventually(StopRequested));
     EXPECT_EQ(quiet.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     gate.open();
     EXPECT_TRUE(quiet.get());
@@ -81,16 +81,16 @@ TEST_F(WorkersQuiesce, NoItemBeginsInThisLifeNorByItsWorkersInTheNext) {
     tasks_.queue([](CMPIContext*, void*) {});
     pthread_cond_broadcast(&PlexorThreadCond);
     const std::size_t looks = HurriedWaits::workWaits().size();
-    ASSERT_TRUE(comesTrue([&] { return HurriedWaits::workWaits().size() >= looks + 10; }));
+    ASSERT_TRUE(eventually([&] { return HurriedWaits::workWaits().size() >= looks + 10; }));
     const std::size_t idle = idleLines();
-    ASSERT_TRUE(comesTrue([&] { return HurriedWaits::workWaits().size() >= looks + 30; }));
+    ASSERT_TRUE(eventually([&] { return HurriedWaits::workWaits().size() >= looks + 30; }));
     EXPECT_EQ(idleLines(), idle) << "not even a worker that looks into the queue by itself";
     EXPECT_EQ(tasks_.ended(), 0);
     EXPECT_EQ(queuedItems(), 1u);
 
     BeginWork();
     EXPECT_FALSE(StopRequested());
-    EXPECT_TRUE(comesTrue([this] { return exitLines() == 2; })) << "their life is over";
+    EXPECT_TRUE(eventually([this] { return exitLines() == 2; })) << "their life is over";
     EXPECT_EQ(queuedItems(), 1u);
     running_ = false;
     CleanupPlexorThreads();
@@ -105,7 +105,7 @@ TEST_F(WorkersQuiesce, WhatIsQueuedBehindARunningItemDoesNotBegin) {
     for (int i = 0; i < 5; i++) tasks_.queue([](CMPIContext*, void*) {});
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
+    ASSERT_TRUE(eventually(StopRequested));
     gate.open();
     ASSERT_TRUE(quiet.get());
     EXPECT_EQ(tasks_.ended(), 2);
@@ -128,7 +128,7 @@ TEST_F(WorkersQuiesce, AStuckItemIsWaitedForThirtySecondsInAll) {
     EXPECT_LE(waits[0], std::chrono::seconds(30));
     EXPECT_GE(waits[0], std::chrono::seconds(29));
     gate.open();
-    EXPECT_TRUE(comesTrue([this] { return tasks_.ended() == 1; }));
+    EXPECT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
     EXPECT_TRUE(quiesceWorkers()) << "asked again when it has ended";
 }
 
@@ -169,7 +169,7 @@ TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
     ASSERT_TRUE(gate.awaitArrivals(1));
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
+    ASSERT_TRUE(eventually(StopRequested));
     gate.open();
     ASSERT_TRUE(quiet.get());
 
@@ -188,12 +188,12 @@ TEST_F(WorkersQuiesce, AnInventoryUnderWayIsGivenUp) {
     occupyWorker(gate);
     ASSERT_TRUE(gate.awaitArrivals(1));
     ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
-    ASSERT_TRUE(comesTrue([] {
+    ASSERT_TRUE(eventually([] {
         return timesLogged(LOG_ERR, "BuildLogicalDeviceInfo: FIFO full, waiting...\n") > 2;
     }));
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
+    ASSERT_TRUE(eventually(StopRequested));
     gate.open();
     ASSERT_TRUE(quiet.get());
     EXPECT_EQ(activeThreads(), 0u);

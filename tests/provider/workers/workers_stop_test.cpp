@@ -81,11 +81,11 @@ TEST_F(WorkersStop, ABusyWorkerFinishesItsItemAndWaitsAgain) {
     const std::size_t idle = idleLines();
 
     stopWithoutWaiting();
-    EXPECT_TRUE(comesTrue([] { return exitLines() == 1; })) << "the idle one";
+    EXPECT_TRUE(eventually([] { return exitLines() == 1; })) << "the idle one";
     EXPECT_EQ(tasks_.ended(), 0);
 
     gate.open();
-    ASSERT_TRUE(comesTrue([&] { return idleLines() == idle + 1; }));
+    ASSERT_TRUE(eventually([&] { return idleLines() == idle + 1; }));
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(tasks_.ended(), 1);
     EXPECT_EQ(exitLines(), 1u);

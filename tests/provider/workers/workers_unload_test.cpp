@@ -29,7 +29,7 @@ protected:
     /// Starts an unload on a thread of its own and waits until it has asked the workers to stop.
     std::future<CMPIrc> beginUnload() {
         auto unloading = std::async(std::launch::async, [this] { return unload(); });
-        EXPECT_TRUE(comesTrue(StopRequested));
+        EXPECT_TRUE(eventually(StopRequested));
         return unloading;
     }
     static bool releaseHasBegun() {
