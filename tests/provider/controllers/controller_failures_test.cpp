@@ -278,10 +278,10 @@ TEST_F(ControllerFailures, NullInstanceInAnEnumeration) {
 
 TEST_F(ControllerFailures, DeviceIdThatIsNoText) {
     addTwo();
-    for (const BadValue& bad : notTexts()) {
-        set(first.port, "DeviceID", bad.value);
+    for (const OddValue& odd : oddTexts()) {
+        give(first.port, "DeviceID", odd);
         EXPECT_EQ(build(), 0);
-        EXPECT_THAT(cached(), ElementsAre("C1")) << bad.name;
+        EXPECT_THAT(cached(), ElementsAre("C1")) << odd.label;
         EXPECT_TRUE(
             logged(LOG_ERR, "NULL DeviceID for PortController: " + first.port.text() + "\n"));
     }
@@ -289,21 +289,21 @@ TEST_F(ControllerFailures, DeviceIdThatIsNoText) {
 
 TEST_F(ControllerFailures, OtherPropertiesMayHoldAnything) {
     addTwo();
-    for (const BadValue& bad : notTexts()) {
-        set(first.package, "Model", bad.value);
+    for (const OddValue& odd : oddTexts()) {
+        give(first.package, "Model", odd);
         EXPECT_EQ(build(), 0);
-        ASSERT_THAT(cached(), ElementsAre("C0", "C1")) << bad.name;
-        EXPECT_EQ(summary(controllers()[0]), "absent FW-C0 BIOS-C0 DRV-C0 PKG-C0 5 2") << bad.name;
+        ASSERT_THAT(cached(), ElementsAre("C0", "C1")) << odd.label;
+        EXPECT_EQ(summary(controllers()[0]), "absent FW-C0 BIOS-C0 DRV-C0 PKG-C0 5 2") << odd.label;
     }
-    for (const BadValue& bad : notNumbers()) {
-        set(first.package, "HealthState", bad.value);
+    for (const OddValue& odd : oddNumbers()) {
+        give(first.package, "HealthState", odd);
         EXPECT_EQ(build(), 0);
-        EXPECT_EQ(controllers()[0]->HealthState, 0) << bad.name;
+        EXPECT_EQ(controllers()[0]->HealthState, 0) << odd.label;
     }
-    for (const BadValue& bad : notNumberArrays()) {
-        set(first.system, "OperationalStatus", bad.value);
+    for (const OddValue& odd : oddArrays()) {
+        give(first.system, "OperationalStatus", odd);
         EXPECT_EQ(build(), 0);
-        EXPECT_EQ(controllers()[0]->OperationalStatus, 0) << bad.name;
+        EXPECT_EQ(controllers()[0]->OperationalStatus, 0) << odd.label;
     }
 }
 

@@ -91,21 +91,19 @@ TEST_F(ControllerSoftware, OnlyTheFirstClassificationCounts) {
 
 TEST_F(ControllerSoftware, WithoutClassificationItIsABundle) {
     const Path software = vendor_.software(vendor.system, 10, "1.0");
-    for (const BadValue& bad : notNumberArrays()) {
-        set(software, "Classifications", bad.value);
-        EXPECT_EQ(versions(), "absent absent absent 1.0") << bad.name;
-        EXPECT_TRUE(logged(LOG_DEBUG, traceOf(0, "1.0"))) << bad.name;
+    for (const OddValue& odd : oddArrays()) {
+        give(software, "Classifications", odd);
+        EXPECT_EQ(versions(), "absent absent absent 1.0") << odd.label;
+        EXPECT_TRUE(logged(LOG_DEBUG, traceOf(0, "1.0"))) << odd.label;
     }
-    unset(software, "Classifications");
-    EXPECT_EQ(versions(), "absent absent absent 1.0");
 }
 
 TEST_F(ControllerSoftware, VersionThatIsNoTextIsAbsent) {
     vendor_.software(vendor.system, 11, "1.0");
     const Path software = vendor_.software(vendor.system, 10, "2.0");
-    for (const BadValue& bad : notTexts()) {
-        set(software, "VersionString", bad.value);
-        EXPECT_EQ(versions(), "absent 1.0 absent absent") << bad.name;
+    for (const OddValue& odd : oddTexts()) {
+        give(software, "VersionString", odd);
+        EXPECT_EQ(versions(), "absent 1.0 absent absent") << odd.label;
     }
 }
 

@@ -9,6 +9,7 @@
 #include <utility>
 #include <vector>
 
+#include "odd_values.h"
 #include "provider_fixture.h"
 #include "query_arguments.h"
 #include "vendor_objects.h"
@@ -52,12 +53,6 @@ struct QueryFailure {
     std::optional<std::string> logged;
 };
 
-/// A value that is not what a property should hold.
-struct BadValue {
-    const char* name;
-    testbed::CimValue value;
-};
-
 /// Whether nobody holds the mutex.
 inline bool isFree(pthread_mutex_t& mutex) {
     if (pthread_mutex_trylock(&mutex) != 0) return false;
@@ -84,12 +79,6 @@ protected:
     using Texts = std::vector<std::string>;
 
     static std::vector<QueryFailure> queryFailures();
-    /// What a text property may hold that is no text.
-    static std::vector<BadValue> notTexts();
-    /// What a number or truth value may hold that is none.
-    static std::vector<BadValue> notNumbers();
-    /// What an array of numbers may hold that has no first number.
-    static std::vector<BadValue> notNumberArrays();
 
     /// Forgets the log and the calls so far.
     void startOver() {
@@ -149,6 +138,9 @@ protected:
     void unset(const Path& path, const char* property) {
         EXPECT_TRUE(repository.eraseProperty(path, property)) << path.text() << " " << property;
     }
+    void give(const Path& path, const std::string& property, const OddValue& odd) {
+        plexortest::give(repository, path, property, odd);
+    }
     /// "<entry> <path> <association class> <result class>" for each query since startOver.
     Texts askedQueries() {
         Texts asked;
@@ -187,39 +179,6 @@ inline std::vector<QueryFailure> InventoryTest::queryFailures() {
         withResult,
         {"NULL with status OK", answerNull(any), std::nullopt},
     };
-}
-
-inline std::vector<BadValue> InventoryTest::notTexts() {
-    using testbed::CimValue;
-    return {{"null", CimValue::null(CMPI_string)},
-            {"null of no type", CimValue::null(CMPI_null)},
-            {"number", CimValue::uint64(0x4141414141414141u)},
-            {"boolean", CimValue::boolean(true)},
-            {"real", CimValue::real64(1.5)},
-            {"texts", CimValue::stringArray({"C0"})},
-            {"numbers", CimValue::uint16Array({1})},
-            {"reference", CimValue::reference({"root/sample", "CIM_ManagedElement", {}})}};
-}
-
-inline std::vector<BadValue> InventoryTest::notNumbers() {
-    using testbed::CimValue;
-    return {{"null", CimValue::null(CMPI_uint16)},
-            {"text", CimValue::string("5")},
-            {"numbers", CimValue::uint16Array({5})},
-            {"texts", CimValue::stringArray({"5"})},
-            {"reference", CimValue::reference({"root/sample", "CIM_ManagedElement", {}})}};
-}
-
-inline std::vector<BadValue> InventoryTest::notNumberArrays() {
-    using testbed::CimValue;
-    return {{"null array", CimValue::null(static_cast<CMPIType>(CMPI_uint16 | CMPI_ARRAY))},
-            {"empty array", CimValue::uint16Array({})},
-            {"null element", CimValue::array(CMPI_uint16, {CimValue::null(CMPI_uint16)})},
-            {"number", CimValue::uint16(2)},
-            {"wide number", CimValue::uint64(0x4141414141414141u)},
-            {"text", CimValue::string("2")},
-            {"texts", CimValue::stringArray({"2"})},
-            {"reference", CimValue::reference({"root/sample", "CIM_ManagedElement", {}})}};
 }
 
 }  // namespace plexortest
