@@ -318,18 +318,18 @@ TEST_F(ControllerFailures, MissingPropertiesAreEmptyFields) {
 
 TEST_F(ControllerFailures, VeryLongTexts) {
     const std::string text(65536, 'x');
-    const VendorController vendor = addFullController(addProfile(), "C0");
-    set(vendor.package, "Model", CimValue::string(text));
-    set(vendor.port, "DeviceID", CimValue::string(text));
+    const VendorController card = addFullController(addProfile(), "C0");
+    set(card.package, "Model", CimValue::string(text));
+    set(card.port, "DeviceID", CimValue::string(text));
     EXPECT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre(text));
     EXPECT_EQ(controllers()[0]->Model, text);
 }
 
 TEST_F(ControllerFailures, EmptyTextsAreTexts) {
-    const VendorController vendor = addFullController(addProfile(), "C0");
-    set(vendor.package, "Model", CimValue::string(""));
-    set(vendor.port, "DeviceID", CimValue::string(""));
+    const VendorController card = addFullController(addProfile(), "C0");
+    set(card.package, "Model", CimValue::string(""));
+    set(card.port, "DeviceID", CimValue::string(""));
     EXPECT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre(""));
     EXPECT_STREQ(controllers()[0]->Model, "");

@@ -13,9 +13,9 @@ class DevicesTest : public InventoryTest {
 protected:
     void SetUp() override {
         InventoryTest::SetUp();
-        vendor = vendor_.controller("C0");
+        card = vendor.controller("C0");
         ctrl = attach(newController("C0"));
-        ctrl->ControllerOp = clonedPath(vendor.system);
+        ctrl->ControllerOp = clonedPath(card.system);
         setActiveThreads(1);
         takeInEachSleep(1000);
         startOver();
@@ -74,7 +74,7 @@ protected:
     Texts addPorts(int count) {
         Texts expected;
         for (int i = 0; i < count; i++) {
-            vendor_.port(vendor, std::to_string(i));
+            vendor.port(card, std::to_string(i));
             expected.push_back("2 " + std::to_string(i));
         }
         return expected;
@@ -86,7 +86,7 @@ protected:
         device.path.key("DeviceID", testbed::CimValue::string(id));
         device.set("DeviceID", testbed::CimValue::string(id));
         repository.put(device);
-        vendor_.tie("CIM_SystemDevice", vendor.system, device.path);
+        vendor.tie("CIM_SystemDevice", card.system, device.path);
         return device.path;
     }
     void defineClass(const std::string& name, const std::string& superclass) {
@@ -96,7 +96,7 @@ protected:
         repository.defineClass("root/sample", definition);
     }
 
-    VendorController vendor;
+    VendorController card;
     RaidController_t* ctrl = nullptr;
     std::vector<Thread_Args_t*> taken_;
 };

@@ -107,7 +107,7 @@ protected:
         path_ = make(Kind::id);
     }
 
-    Path make(const std::string& id) { return Kind::make(vendor_, vendor, id); }
+    Path make(const std::string& id) { return Kind::make(vendor, card, id); }
     int build(const Path& path) {
         return Kind::build(&mi, ctx(), ctrl, instanceAt(path), broker.makePath(path));
     }

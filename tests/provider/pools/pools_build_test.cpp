@@ -12,7 +12,7 @@ class PoolsBuild : public EnclosureTest {
 protected:
     void SetUp() override {
         EnclosureTest::SetUp();
-        path = vendor_.pool(vendor, "P1", true);
+        path = vendor.pool(card, "P1", true);
     }
     static LogLine dump(const Path& path, const std::string& id, const std::string& rest) {
         return infoLine("\nPoolOp: " + path.text() + "\n\tInstanceID            - " + id + rest);

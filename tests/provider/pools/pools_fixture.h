@@ -9,9 +9,9 @@ class EnclosureTest : public InventoryTest {
 protected:
     void SetUp() override {
         InventoryTest::SetUp();
-        vendor = vendor_.controller("C0");
+        card = vendor.controller("C0");
         ctrl = attach(newController("C0"));
-        ctrl->ControllerOp = clonedPath(vendor.system);
+        ctrl->ControllerOp = clonedPath(card.system);
         startOver();
     }
     std::vector<StoragePool_t*> pools() const { return recordsOf<StoragePool_t>(ctrl->PoolList); }
@@ -30,7 +30,7 @@ protected:
     }
     static std::string textOf(const char* text) { return text != nullptr ? text : "absent"; }
 
-    VendorController vendor;
+    VendorController card;
     RaidController_t* ctrl = nullptr;
 };
 

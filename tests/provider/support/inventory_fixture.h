@@ -162,7 +162,7 @@ protected:
         return names;
     }
 
-    VendorObjects vendor_{repository};
+    VendorObjects vendor{repository};
 };
 
 inline std::vector<QueryFailure> InventoryTest::queryFailures() {
