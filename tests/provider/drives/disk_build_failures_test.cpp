@@ -51,8 +51,8 @@ protected:
     }
 
     /// Error lines other than the refusal of a drive without a pool.
-    Lines errors() const {
-        Lines lines = CapturedSyslog::linesAt(LOG_ERR);
+    Texts errors() const {
+        Texts lines = CapturedSyslog::linesAt(LOG_ERR);
         std::erase(lines, "No pool associated with disk " + kDrive + "\n");
         return lines;
     }
@@ -73,7 +73,7 @@ protected:
         EXPECT_STREQ(disk()->Pool, "P1");
         EXPECT_EQ(disk()->NumberOfBlocks, 0x1'0000'0002u);
         EXPECT_THAT(members(pool_), ElementsAre("D1"));
-        EXPECT_EQ(ctrl_->DiskUpdateTime, kStart);
+        EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
     }
 };
 
@@ -196,7 +196,7 @@ TEST_P(DiskBuildWrongElement, IsNeverFollowed) {
     faults().add(rule);
     const bool mediaOrPool = GetParam() == 0 || GetParam() == 5;
     EXPECT_EQ(buildDisk(), mediaOrPool ? -1 : 0);
-    EXPECT_EQ(ctrl_->DiskList->Size, mediaOrPool ? 0u : 1u);
+    EXPECT_EQ(ctrl->DiskList->Size, mediaOrPool ? 0u : 1u);
 }
 
 /// What a drive has from its extent, firmware, slot, chassis and pool.
@@ -216,13 +216,13 @@ void PrintTo(const Origins& origins, std::ostream* out) {
 
 TEST_P(DiskBuildWrongElement, GivesWayToTheNext) {
     // Each look-up finds a second object: those of another drive, an enclosure, a pool.
-    const VendorDrive other = vendor.drive(card_, "D2", poolPath_, chassis_, 9);
+    const VendorDrive other = vendor.drive(card, "D2", poolPath_, chassis_, 9);
     vendor.tie("CIM_MediaPresent", objects_.drive, other.extent);
     vendor.tie("CIM_ElementSoftwareIdentity", other.software, objects_.drive);
     vendor.tie("CIM_Realizes", other.package, objects_.drive);
     vendor.tie("CIM_PackageInConnector", other.slot, objects_.package);
-    vendor.tie("CIM_Container", vendor.chassis(card_, "C0_33"), objects_.slot);
-    vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, "P2"), objects_.extent);
+    vendor.tie("CIM_Container", vendor.chassis(card, "C0_33"), objects_.slot);
+    vendor.tie("CIM_ConcreteComponent", vendor.pool(card, "P2"), objects_.extent);
     const CMPIUint64 blocks = 0x1'0000'0002;
     const Origins expected[] = {
         {2000, "FW-D1", 4, "C0_32", "P1"},   {blocks, "FW-D2", 4, "C0_32", "P1"},
@@ -256,7 +256,7 @@ TEST_F(DiskBuildFailures, ChassisPathsWithoutATextAsTagGiveNoChassis) {
         ASSERT_EQ(buildDisk(), 0);
         EXPECT_EQ(disk()->Chassis, nullptr);
         EXPECT_EQ(disk()->SlotNumber, 4);
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
     }
 }
 

@@ -42,7 +42,7 @@ TEST_P(DiskBuildValues, CountAsZeroWhenOdd) {
         ASSERT_EQ(buildDisk(), 0);
         EXPECT_EQ(GetParam().value(disk()), 0u);
         EXPECT_STREQ(disk()->DeviceID, "D1");
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
     }
 }
 
@@ -67,7 +67,7 @@ TEST_F(DiskBuildOddities, AreNullWhenOdd) {
         ASSERT_EQ(buildDisk(), 0);
         EXPECT_EQ(disk()->Name, nullptr);
         EXPECT_EQ(disk()->FwVersion, nullptr);
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
     }
 }
 
@@ -87,7 +87,7 @@ TEST_F(DiskBuildOddities, OddSlotNumbersCountAsZero) {
         ASSERT_EQ(buildDisk(), 0);
         EXPECT_EQ(disk()->SlotNumber, 0);
         EXPECT_STREQ(disk()->Chassis, "C0_32");
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
     }
 }
 

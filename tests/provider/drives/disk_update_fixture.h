@@ -13,7 +13,7 @@ protected:
         DiskTest::SetUp();
         ASSERT_EQ(buildDisk(), 0);
         VirtualClock::set(kLater);
-        forget();
+        startOver();
     }
 
     void setStatus(std::uint16_t operational, std::uint16_t extent) {
@@ -29,7 +29,7 @@ protected:
         EXPECT_EQ(disk()->ExtentStatus, 16);
         EXPECT_STREQ(disk()->Pool, "P1");
         EXPECT_THAT(members(pool_), testing::ElementsAre("D1"));
-        EXPECT_EQ(ctrl_->DiskUpdateTime, kLater);
+        EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
         EXPECT_EQ(disk()->LastUpdateTime, kStart);
     }
 

@@ -226,7 +226,7 @@ TEST_F(DiskUpdateFetch, StampsAtTheEnd) {
     whenCalled(Entry::GetInstance, [] { VirtualClock::advance(2); });
     whenCalled(Entry::AssociatorNames, [] { VirtualClock::advance(50); });
     ASSERT_EQ(updateDisk(nullptr), 0);
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kLater + 2 + 2 + 50);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kLater + 2 + 2 + 50);
 }
 
 TEST_F(DiskUpdateFetch, OfANamelessDriveIsTraced) {

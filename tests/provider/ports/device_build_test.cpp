@@ -18,7 +18,7 @@ TYPED_TEST(DeviceBuild, WithoutDeviceIdIsTurnedAway) {
     for (const OddValue& odd : oddTexts()) {
         SCOPED_TRACE(odd.label);
         give(this->repository, this->path_, "DeviceID", odd);
-        this->forget();
+        this->startOver();
         EXPECT_EQ(this->buildIt(), -1);
         EXPECT_THAT(logLines(),
                     ElementsAre(TypeParam::enter, TypeParam::nullDeviceId + this->pathText() + "\n",
@@ -79,8 +79,8 @@ TYPED_TEST(DeviceBuild, TakesThePathThatIsHandedIn) {
     testbed::ObjectPath handedIn = this->path_;
     handedIn.key("Extra", CimValue::string("key"));
     const testbed::Instance instance = this->repository.get(this->path_).value();
-    this->vendor.tie("CIM_SystemDevice", this->card_.system, handedIn);
-    TypeParam::build(&this->mi, this->ctx(), this->ctrl_, this->broker.makeInstance(instance),
+    this->vendor.tie("CIM_SystemDevice", this->card.system, handedIn);
+    TypeParam::build(&this->mi, this->ctx(), this->ctrl, this->broker.makeInstance(instance),
                      this->broker.makePath(this->path_));
     ASSERT_NE(this->record(), nullptr);
     EXPECT_EQ(testbed::Broker::toPath(this->record()->*TypeParam::op), this->path_);
@@ -99,7 +99,7 @@ TYPED_TEST(DeviceBuild, WithoutCloneOfThePathHasNone) {
 TYPED_TEST(DeviceBuild, AppendsAtTheTail) {
     ASSERT_EQ(this->buildIt(), 0);
     void* first = this->record();
-    ASSERT_EQ(this->build(TypeParam::build, TypeParam::make(this->vendor, this->card_, "X2")), 0);
+    ASSERT_EQ(this->build(TypeParam::build, TypeParam::make(this->vendor, this->card, "X2")), 0);
     ASSERT_EQ(this->list()->Size, 2u);
     EXPECT_EQ(this->list()->Head->Data, first);
     auto* second = static_cast<typename TypeParam::Record*>(this->list()->Tail->Data);
@@ -108,7 +108,7 @@ TYPED_TEST(DeviceBuild, AppendsAtTheTail) {
 
 TYPED_TEST(DeviceBuild, AfterTheOnlyRecordWasDeletedAppendsAnew) {
     ASSERT_EQ(this->buildIt(), 0);
-    ASSERT_EQ(TypeParam::remove(this->ctrl_, this->record()), 0);
+    ASSERT_EQ(TypeParam::remove(this->ctrl, this->record()), 0);
     ASSERT_EQ(this->buildIt(), 0);
     ASSERT_EQ(this->list()->Size, 1u);
     EXPECT_STREQ(this->record()->DeviceID, "X1");
@@ -147,7 +147,7 @@ TYPED_TEST(DeviceBuild, ReadsOddStatusAsZero) {
         give(this->repository, this->path_, "OperationalStatus", odd);
         ASSERT_EQ(this->buildIt(), 0);
         EXPECT_EQ(this->record()->OperationalStatus, 0);
-        ASSERT_EQ(TypeParam::remove(this->ctrl_, this->record()), 0);
+        ASSERT_EQ(TypeParam::remove(this->ctrl, this->record()), 0);
     }
 }
 

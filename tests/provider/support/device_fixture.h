@@ -23,14 +23,14 @@ namespace plexortest {
 class DeviceTest : public ProviderTest {
 protected:
     using Path = testbed::ObjectPath;
-    using Lines = std::vector<std::string>;
+    using Texts = std::vector<std::string>;
 
     DeviceTest() : vendor(repository) {}
 
     void SetUp() override {
         ProviderTest::SetUp();
-        card_ = vendor.controller("C0");
-        ctrl_ = attach(newController("C0"));
+        card = vendor.controller("C0");
+        ctrl = attach(newController("C0"));
     }
 
     CMPIInstance* instanceAt(const Path& path) {
@@ -38,28 +38,28 @@ protected:
     }
     /// Builds from the vendor's object as it is now.
     int build(BuildFunc_t builder, const Path& path) {
-        return builder(&mi, ctx(), ctrl_, instanceAt(path), broker.makePath(path));
+        return builder(&mi, ctx(), ctrl, instanceAt(path), broker.makePath(path));
     }
     int update(UpdateFunc_t updater, void* device, CMPIInstance* fresh) {
-        return updater(&mi, ctx(), ctrl_, device, fresh);
+        return updater(&mi, ctx(), ctrl, device, fresh);
     }
 
-    static Lines members(const StoragePool_t* pool) {
-        Lines ids;
+    static Texts members(const StoragePool_t* pool) {
+        Texts ids;
         for (const List_Entry_t* entry = pool->Drives->Head; entry != nullptr; entry = entry->Next)
             ids.emplace_back(static_cast<const char*>(entry->Data));
         return ids;
     }
 
     /// Forgets the log and the calls so far.
-    void forget() {
+    void startOver() {
         CapturedSyslog::clear();
         books().clearCalls();
     }
 
     /// Every call that the broker was asked for: "Associators <path> <assoc>/<result>".
-    Lines brokerCalls() {
-        Lines calls;
+    Texts brokerCalls() {
+        Texts calls;
         for (const testbed::CallRecord& call : books().calls()) {
             if (testbed::isObjectEntry(call.entry)) continue;
             std::string text = std::string(testbed::entryName(call.entry)) + " " + call.path;
@@ -72,8 +72,8 @@ protected:
     }
 
     /// Names of the properties read from instances of the class, in order; needs recordObjectCalls.
-    Lines propertiesRead(const std::string& className) {
-        Lines names;
+    Texts propertiesRead(const std::string& className) {
+        Texts names;
         for (const testbed::CallRecord& call : books().calls())
             if (call.entry == testbed::Entry::InstanceGetProperty && call.className == className)
                 names.push_back(call.name.value_or(""));
@@ -137,16 +137,16 @@ protected:
             linesWithLock_.push_back({lockIsFree() ? "free " : "held ", line});
         });
     }
-    Lines logWithLock(const AddressNames& names = {}) const {
-        Lines lines;
+    Texts logWithLock(const AddressNames& names = {}) const {
+        Texts lines;
         for (const auto& [mark, line] : linesWithLock_)
             lines.push_back(mark + logText(line, names));
         return lines;
     }
     /// Whether nobody, this thread included, holds CtrlMutex.
     bool lockIsFree() {
-        if (pthread_mutex_trylock(&ctrl_->CtrlMutex) != 0) return false;
-        pthread_mutex_unlock(&ctrl_->CtrlMutex);
+        if (pthread_mutex_trylock(&ctrl->CtrlMutex) != 0) return false;
+        pthread_mutex_unlock(&ctrl->CtrlMutex);
         return true;
     }
 
@@ -155,7 +155,7 @@ protected:
     void whileLockIsTaken(const std::function<void(const CMPIContext*)>& work,
                           const std::function<bool()>& reached,
                           const std::function<void()>& meanwhile) {
-        pthread_mutex_lock(&ctrl_->CtrlMutex);
+        pthread_mutex_lock(&ctrl->CtrlMutex);
         std::thread worker([&] {
             testbed::Broker::CallScope scope(broker);
             work(scope.context());
@@ -163,13 +163,13 @@ protected:
         EXPECT_TRUE(eventually(reached)) << "the thread waits for the lock too early";
         std::this_thread::sleep_for(std::chrono::milliseconds(5));
         meanwhile();
-        pthread_mutex_unlock(&ctrl_->CtrlMutex);
+        pthread_mutex_unlock(&ctrl->CtrlMutex);
         worker.join();
     }
 
     VendorObjects vendor;
-    VendorController card_;
-    RaidController_t* ctrl_ = nullptr;
+    VendorController card;
+    RaidController_t* ctrl = nullptr;
 
 private:
     std::vector<std::pair<std::string, LogLine>> linesWithLock_;

@@ -90,7 +90,7 @@ TEST_F(VolumeBuildFailures, PoolQueryFailingDespiteAResultTurnsTheVolumeAway) {
 TEST_F(VolumeBuildFailures, NoPoolTurnsTheVolumeAway) {
     repository.remove(poolPath_);
     expectTurnedAway();
-    Lines lines = logLines();
+    Texts lines = logLines();
     lines.erase(lines.begin(), lines.end() - 3);
     EXPECT_THAT(lines,
                 ElementsAre("DEBUG BuildVolumeInfo, CIM Query - AssociatorNames: " + kVolume +
@@ -148,9 +148,9 @@ TEST_F(VolumeBuildFailures, ElementsOfAnotherTypeAreNeverFollowed) {
 }
 
 TEST_F(VolumeBuildFailures, AnElementOfAnotherTypeGivesWayToTheNext) {
-    const VendorVolume other = vendor.volume(card_, "V2", poolPath_, "RAID0");
+    const VendorVolume other = vendor.volume(card, "V2", poolPath_, "RAID0");
     vendor.tie("CIM_ElementSettingData", objects_.volume, other.setting);
-    vendor.tie("CIM_AllocatedFromStoragePool", vendor.pool(card_, "P2"), objects_.volume);
+    vendor.tie("CIM_AllocatedFromStoragePool", vendor.pool(card, "P2"), objects_.volume);
     const std::pair<const char*, const char*> expected[] = {{"RAID0", "P1"}, {"RAID6", "P2"}};
     for (int wrong = 0; wrong < 2; wrong++) {
         testbed::FaultRule rule;
@@ -163,7 +163,7 @@ TEST_F(VolumeBuildFailures, AnElementOfAnotherTypeGivesWayToTheNext) {
         ASSERT_EQ(buildVolume(), 0);
         EXPECT_STREQ(volume()->RaidLevel, expected[wrong].first);
         EXPECT_STREQ(volume()->FromPool, expected[wrong].second);
-        ASSERT_EQ(DeleteVolume(ctrl_, volume()), 0);
+        ASSERT_EQ(DeleteVolume(ctrl, volume()), 0);
     }
 }
 
@@ -201,8 +201,8 @@ const VolumeAllocation kVolumeAllocations[] = {
 
 class VolumeBuildMemory : public VolumeTest, public testing::WithParamInterface<VolumeAllocation> {
 protected:
-    Lines complaints() {
-        Lines found;
+    Texts complaints() {
+        Texts found;
         for (std::string line : logLines()) {
             if (line.starts_with("DEBUG")) continue;
             for (const char* suffix : {" for volume ", " with volume "})
@@ -235,7 +235,7 @@ TEST_P(VolumeBuildMemory, HasThisOutcome) {
     EXPECT_EQ(volume()->RaidLevel == nullptr, label == "RaidLevel");
     EXPECT_STREQ(volume()->FromPool, "P1");
     EXPECT_EQ(volume()->OperationalStatus, 3);
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kStart);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kStart);
 }
 
 INSTANTIATE_TEST_SUITE_P(Volume, VolumeBuildMemory, testing::ValuesIn(kVolumeAllocations),
@@ -263,7 +263,7 @@ TEST_F(VolumeBuildFailures, ListFailureIsLoggedWithoutTheLock) {
         const auto fault = FailAllocation::nth(7);
         EXPECT_EQ(buildTurnedAway(), -2);
     }
-    Lines lines = logWithLock(names());
+    Texts lines = logWithLock(names());
     lines.erase(lines.begin(), lines.end() - 3);
     EXPECT_THAT(lines,
                 ElementsAre("held DEBUG Adding data <?> to the list <volumes> at the tail\n",
@@ -309,7 +309,7 @@ TEST_P(VolumeBuildValues, CountAsZeroWhenOdd) {
         ASSERT_EQ(buildVolume(), 0);
         EXPECT_EQ(GetParam().value(volume()), 0u);
         EXPECT_STREQ(volume()->FromPool, "P1");
-        ASSERT_EQ(DeleteVolume(ctrl_, volume()), 0);
+        ASSERT_EQ(DeleteVolume(ctrl, volume()), 0);
     }
 }
 
@@ -326,7 +326,7 @@ TEST_F(VolumeBuildFailures, OddTextsAreNull) {
         EXPECT_EQ(volume()->ElementName, nullptr);
         EXPECT_EQ(volume()->Name, nullptr);
         EXPECT_EQ(volume()->RaidLevel, nullptr);
-        ASSERT_EQ(DeleteVolume(ctrl_, volume()), 0);
+        ASSERT_EQ(DeleteVolume(ctrl, volume()), 0);
     }
 }
 
