@@ -21,8 +21,8 @@ TEST_F(ControllerBuild, ProfileWithoutControllers) {
     const Path profile = addProfile();
     EXPECT_EQ(build(), 0);
     EXPECT_THAT(controllers(), IsEmpty());
-    EXPECT_THAT(askedQueries(), ElementsAre("associators " + profile.text() +
-                                            " CIM_ElementConformsToProfile CIM_PortController"));
+    EXPECT_THAT(brokerCalls(), ElementsAre("associators " + profile.text() +
+                                           " CIM_ElementConformsToProfile/CIM_PortController"));
 }
 
 TEST_F(ControllerBuild, EveryFieldIsFilled) {
@@ -119,13 +119,13 @@ TEST_F(ControllerBuild, FourQueriesForEachController) {
     const VendorController card = addFullController(profile, "C0");
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(
-        askedQueries(),
+        brokerCalls(),
         ElementsAre(
-            "associators " + profile.text() + " CIM_ElementConformsToProfile CIM_PortController",
-            "associators " + card.port.text() + " CIM_LogicalIdentity CIM_ComputerSystem",
-            "associators " + card.port.text() + " CIM_Realizes CIM_PhysicalPackage",
+            "associators " + profile.text() + " CIM_ElementConformsToProfile/CIM_PortController",
+            "associators " + card.port.text() + " CIM_LogicalIdentity/CIM_ComputerSystem",
+            "associators " + card.port.text() + " CIM_Realizes/CIM_PhysicalPackage",
             "associators " + card.system.text() +
-                " CIM_ElementSoftwareIdentity CIM_SoftwareIdentity"));
+                " CIM_ElementSoftwareIdentity/CIM_SoftwareIdentity"));
     EXPECT_EQ(books().calls().size(), 4u);
 }
 
@@ -137,7 +137,7 @@ TEST_F(ControllerBuild, ControllersOfAllProfilesInTheirOrder) {
     addFullController(first, "C1");
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre("C0", "C1", "C2"));
-    EXPECT_EQ(askedQueries().size(), 2u + 3u * 3u);
+    EXPECT_EQ(brokerCalls().size(), 2u + 3u * 3u);
 }
 
 TEST_F(ControllerBuild, ControllerOfTwoProfilesIsCachedTwice) {
@@ -165,7 +165,7 @@ TEST_F(ControllerBuild, ProfileWithoutPathIsPassedOver) {
     failOnly(answerNull(Entry::InstanceGetObjectPath, 0));
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre("C1"));
-    EXPECT_EQ(askedQueries().size(), 4u);
+    EXPECT_EQ(brokerCalls().size(), 4u);
 }
 
 TEST_F(ControllerBuild, LaterBuildingsAppend) {
@@ -222,7 +222,7 @@ TEST_F(ControllerBuild, WithoutDeviceIdItIsNotCached) {
     EXPECT_TRUE(
         logged(LOG_ERR, "NULL DeviceID for PortController: " + nameless.port.text() + "\n"));
     // One for the profile, none for the nameless, three for the other.
-    EXPECT_EQ(askedQueries().size(), 4u);
+    EXPECT_EQ(brokerCalls().size(), 4u);
 }
 
 TEST_F(ControllerBuild, WithoutSystemItIsNotCached) {
@@ -233,7 +233,7 @@ TEST_F(ControllerBuild, WithoutSystemItIsNotCached) {
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre("C1"));
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
-    EXPECT_EQ(askedQueries().size(), 5u);
+    EXPECT_EQ(brokerCalls().size(), 5u);
 }
 
 TEST_F(ControllerBuild, RecordsOwnTheirTextsAndPaths) {

@@ -1,11 +1,11 @@
 // Profiles with controllers behind them, and the building of their records.
 #pragma once
 
-#include "inventory_fixture.h"
+#include "vendor_fixture.h"
 
 namespace plexortest {
 
-class ControllerTest : public InventoryTest {
+class ControllerTest : public VendorTest {
 protected:
     /// A registration that the building walks.
     Path addProfile(const std::string& id = "profile-1") {

@@ -1,5 +1,5 @@
 // What the search for registrations asks the broker, and what it leaves in the log.
-#include "inventory_fixture.h"
+#include "vendor_fixture.h"
 
 namespace plexortest {
 namespace {
@@ -12,7 +12,7 @@ const LogLine kEntering = debugLine("GetHHRCProfiles: entering...\n");
 const LogLine kQuery =
     debugLine("GetHHRCProfiles, CIM Query - EnumInstances root/interop:CIM_RegisteredProfile");
 
-class DiscoveryLog : public InventoryTest {
+class DiscoveryLog : public VendorTest {
 protected:
     int discover() {
         startOver();

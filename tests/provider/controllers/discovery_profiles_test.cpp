@@ -1,12 +1,12 @@
 // Which registrations of the RAID profile are taken up.
-#include "inventory_fixture.h"
+#include "vendor_fixture.h"
 
 namespace plexortest {
 namespace {
 
 using testbed::CimValue;
 
-class DiscoveryProfiles : public InventoryTest {
+class DiscoveryProfiles : public VendorTest {
 protected:
     int discover() {
         startOver();

@@ -78,31 +78,30 @@ protected:
 };
 
 TEST_P(DiskBuildQuery, FailingWithAMessage) {
-    failQuery(GetParam().entry, GetParam().assocClass, CMPI_RC_ERR_FAILED, "vendor is busy");
+    faults().add(along(GetParam().assocClass,
+                       refusal(GetParam().entry, CMPI_RC_ERR_FAILED, "vendor is busy")));
     EXPECT_EQ(buildDisk(), GetParam().result);
     EXPECT_THAT(errors(), ElementsAre(failureLine(1, "vendor is busy")));
     expectOutcome();
 }
 
 TEST_P(DiskBuildQuery, FailingWithoutAMessage) {
-    failQuery(GetParam().entry, GetParam().assocClass, CMPI_RC_ERR_NOT_SUPPORTED, {});
+    faults().add(
+        along(GetParam().assocClass, refusal(GetParam().entry, CMPI_RC_ERR_NOT_SUPPORTED, {})));
     EXPECT_EQ(buildDisk(), GetParam().result);
     EXPECT_THAT(errors(), ElementsAre(failureLine(7, "NULL")));
     expectOutcome();
 }
 
 TEST_P(DiskBuildQuery, FailingDespiteAResult) {
-    testbed::FaultRule rule = queryRule(GetParam().entry, GetParam().assocClass);
-    rule.rc = CMPI_RC_ERR_FAILED;
-    rule.keepResult = true;
-    faults().add(rule);
+    faults().add(along(GetParam().assocClass, refusalWithResult(GetParam().entry)));
     EXPECT_EQ(buildDisk(), GetParam().result);
     EXPECT_THAT(errors(), ElementsAre(failureLine(1, "NULL")));
     expectOutcome();
 }
 
 TEST_P(DiskBuildQuery, AnsweringNullWithoutAnError) {
-    answerNull(GetParam().entry, GetParam().assocClass);
+    faults().add(along(GetParam().assocClass, answerNull(GetParam().entry)));
     EXPECT_EQ(buildDisk(), GetParam().result);
     EXPECT_EQ(CapturedSyslog::countContaining(" failed, status: rc"), 0u);
     expectOutcome();
@@ -114,8 +113,8 @@ INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildQuery, testing::ValuesIn(kQueries),
 class DiskBuildFailures : public DiskTest {};
 
 TEST_F(DiskBuildFailures, EveryQueryAtOnceStopsAtTheFirst) {
-    failQuery(Entry::Associators, "", CMPI_RC_ERR_FAILED, "down");
-    failQuery(Entry::AssociatorNames, "", CMPI_RC_ERR_FAILED, "down");
+    faults().add(refusal(Entry::Associators, CMPI_RC_ERR_FAILED, "down"));
+    faults().add(refusal(Entry::AssociatorNames, CMPI_RC_ERR_FAILED, "down"));
     EXPECT_EQ(buildDisk(), -1);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
                 ElementsAre("Associators " + kDrive +
@@ -125,7 +124,8 @@ TEST_F(DiskBuildFailures, EveryQueryAtOnceStopsAtTheFirst) {
 }
 
 TEST_F(DiskBuildFailures, MediaQueryLogsItsFailureBeforeTheDriveGoes) {
-    failQuery(Entry::Associators, "CIM_MediaPresent", CMPI_RC_ERR_FAILED, "down");
+    faults().add(
+        along("CIM_MediaPresent", refusal(Entry::Associators, CMPI_RC_ERR_FAILED, "down")));
     EXPECT_EQ(buildDisk(), -1);
     EXPECT_THAT(logLines(),
                 ElementsAre("DEBUG BuildDiskInfo, ENTER...\n",
@@ -138,7 +138,7 @@ TEST_F(DiskBuildFailures, MediaQueryLogsItsFailureBeforeTheDriveGoes) {
 }
 
 TEST_F(DiskBuildFailures, PathCloneMissingIsToldByName) {
-    failClone(0);
+    faults().add(answerNull(Entry::Clone, 0));
     EXPECT_EQ(buildDisk(), 0);
     ASSERT_NE(disk(), nullptr);
     EXPECT_EQ(disk()->DiskOp, nullptr);
@@ -150,7 +150,7 @@ TEST_F(DiskBuildFailures, PathCloneMissingIsToldByName) {
 }
 
 TEST_F(DiskBuildFailures, ExtentCloneMissingMeansNoPool) {
-    failClone(1);
+    faults().add(answerNull(Entry::Clone, 1));
     EXPECT_EQ(buildDisk(), -1);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
                 ElementsAre("No pool associated with disk " + kDrive + "\n"));

@@ -25,7 +25,7 @@ TEST_F(DiskBuildLock, IsFreeAtEveryQueryAndRead) {
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_GT(watchedCalls_, 6);
     EXPECT_EQ(heldCalls_, 0);
-    EXPECT_TRUE(lockIsFree());
+    EXPECT_TRUE(isFree(ctrl->CtrlMutex));
 }
 
 TEST_F(DiskBuildLock, IsHeldFromThePoolsLookUpToTheInsertion) {

@@ -137,9 +137,9 @@ TEST_F(DiskBuildPool, LooksAtThePoolsAsTheyAreAtEachStep) {
     candidate("first");
     candidate("P2");
     StoragePool_t* late = nullptr;
-    whenCalled(
-        testbed::Entry::AssociatorNames, [&] { late = attach(ctrl, newPool("P2")); },
-        "CIM_ConcreteComponent");
+    faults().add(along("CIM_ConcreteComponent", watch(testbed::Entry::AssociatorNames, [&] {
+                           late = attach(ctrl, newPool("P2"));
+                       })));
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_THAT(members(late), ElementsAre("D1"));
 }

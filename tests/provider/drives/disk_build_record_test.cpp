@@ -142,10 +142,10 @@ TEST_F(DiskBuildRecord, ReadsTheExtentsPropertiesInOrder) {
 
 TEST_F(DiskBuildRecord, StampsTheRecordBeforeThePoolIsAskedFor) {
     using testbed::Entry;
-    whenCalled(
-        Entry::AssociatorNames, [] { VirtualClock::advance(3); }, "CIM_Container");
-    whenCalled(
-        Entry::AssociatorNames, [] { VirtualClock::advance(40); }, "CIM_ConcreteComponent");
+    faults().add(
+        along("CIM_Container", watch(Entry::AssociatorNames, [] { VirtualClock::advance(3); })));
+    faults().add(along("CIM_ConcreteComponent",
+                       watch(Entry::AssociatorNames, [] { VirtualClock::advance(40); })));
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_EQ(disk()->LastUpdateTime, kStart + 3);
     EXPECT_EQ(ctrl->DiskUpdateTime, kStart + 43);

@@ -139,7 +139,8 @@ TEST_F(DiskUpdatePool, ToldOfNoneRejoinsNothing) {
 }
 
 TEST_F(DiskUpdatePool, KeepsThePoolWhenTheQueryFails) {
-    failQuery(Entry::AssociatorNames, "CIM_ConcreteComponent", CMPI_RC_ERR_FAILED, "busy");
+    faults().add(along("CIM_ConcreteComponent",
+                       refusal(Entry::AssociatorNames, CMPI_RC_ERR_FAILED, "busy")));
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
                 ElementsAre("AssociatorNames " + kExtent +
@@ -149,7 +150,7 @@ TEST_F(DiskUpdatePool, KeepsThePoolWhenTheQueryFails) {
 }
 
 TEST_F(DiskUpdatePool, KeepsThePoolWhenTheQueryAnswersNull) {
-    answerNull(Entry::AssociatorNames, "CIM_ConcreteComponent");
+    faults().add(along("CIM_ConcreteComponent", answerNull(Entry::AssociatorNames)));
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
     expectUnchanged();

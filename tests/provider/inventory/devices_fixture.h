@@ -2,19 +2,17 @@
 #pragma once
 
 #include "PlexorProviderCfg.h"
-#include "inventory_fixture.h"
+#include "device_fixture.h"
 
 namespace plexortest {
 
 /// Said whenever the walk, at its end, waits for the queue to empty.
 inline const LogLine kWaiting = debugLine("BuildLogicalDeviceInfo: FIFO not empty, waiting...\n");
 
-class DevicesTest : public InventoryTest {
+class DevicesTest : public DeviceTest {
 protected:
     void SetUp() override {
-        InventoryTest::SetUp();
-        card = vendor.controller("C0");
-        ctrl = attach(newController("C0"));
+        DeviceTest::SetUp();
         ctrl->ControllerOp = clonedPath(card.system);
         setActiveThreads(1);
         takeInEachSleep(1000);
@@ -22,7 +20,7 @@ protected:
     }
     void TearDown() override {
         releaseTaken();
-        InventoryTest::TearDown();
+        DeviceTest::TearDown();
     }
 
     static void setActiveThreads(unsigned int count) {
@@ -96,8 +94,6 @@ protected:
         repository.defineClass("root/sample", definition);
     }
 
-    VendorController card;
-    RaidController_t* ctrl = nullptr;
     std::vector<Thread_Args_t*> taken_;
 };
 

@@ -1,16 +1,14 @@
 // One cached controller "C0" whose pools and enclosures are to be gathered.
 #pragma once
 
-#include "inventory_fixture.h"
+#include "device_fixture.h"
 
 namespace plexortest {
 
-class EnclosureTest : public InventoryTest {
+class EnclosureTest : public DeviceTest {
 protected:
     void SetUp() override {
-        InventoryTest::SetUp();
-        card = vendor.controller("C0");
-        ctrl = attach(newController("C0"));
+        DeviceTest::SetUp();
         ctrl->ControllerOp = clonedPath(card.system);
         startOver();
     }
@@ -29,9 +27,6 @@ protected:
         return BuildSingleChassisInfo(&mi, ctx(), ctrl, instanceAt(path), broker.makePath(path));
     }
     static std::string textOf(const char* text) { return text != nullptr ? text : "absent"; }
-
-    VendorController card;
-    RaidController_t* ctrl = nullptr;
 };
 
 /// Holds a mutex on a thread of its own until a line that contains `part` has been logged, then

@@ -72,7 +72,7 @@ TEST_F(BatteryBuild, LogsEveryStepAndHoldsTheLockForTheInsertionOnly) {
 TEST_F(BatteryBuild, OddStatusCountsAsZero) {
     for (const OddValue& odd : oddNumbers()) {
         SCOPED_TRACE(odd.label);
-        give(repository, path_, "BatteryStatus", odd);
+        give(path_, "BatteryStatus", odd);
         ASSERT_EQ(buildIt(), 0);
         EXPECT_EQ(record()->BatteryStatus, 0);
         ASSERT_EQ(DeleteBattery(ctrl, record()), 0);
@@ -224,7 +224,7 @@ TEST_F(BatteryUpdate, FailingWithoutMessageSaysNull) {
 
 TEST_F(BatteryUpdate, OfABatteryAnsweredNullOnlyStamps) {
     setStatus(6, 4);
-    answerNull(Entry::GetInstance, "");
+    faults().add(answerNull(Entry::GetInstance));
     ASSERT_EQ(updateBattery(nullptr), 0);
     EXPECT_THAT(logLines(), ElementsAre(kEnter, kGet, kExit));
     expectStatus(11, 7);
@@ -237,7 +237,7 @@ TEST_F(BatteryUpdate, OfARemovedBatteryOnlyStamps) {
 }
 
 TEST_F(BatteryUpdate, StampsAfterReading) {
-    whenCalled(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); });
+    faults().add(watch(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); }));
     ASSERT_EQ(updateBattery(), 0);
     EXPECT_EQ(ctrl->BatteryUpdateTime, kLater + 2);
 }

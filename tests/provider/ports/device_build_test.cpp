@@ -17,7 +17,7 @@ TYPED_TEST_SUITE(DeviceBuild, DeviceKinds, KindNames);
 TYPED_TEST(DeviceBuild, WithoutDeviceIdIsTurnedAway) {
     for (const OddValue& odd : oddTexts()) {
         SCOPED_TRACE(odd.label);
-        give(this->repository, this->path_, "DeviceID", odd);
+        this->give(this->path_, "DeviceID", odd);
         this->startOver();
         EXPECT_EQ(this->buildIt(), -1);
         EXPECT_THAT(logLines(),
@@ -30,7 +30,7 @@ TYPED_TEST(DeviceBuild, WithoutDeviceIdIsTurnedAway) {
 
 TYPED_TEST(DeviceBuild, WithoutDeviceIdAndCloneSaysNull) {
     this->repository.eraseProperty(this->path_, "DeviceID");
-    this->failClone(0);
+    this->faults().add(this->answerNull(testbed::Entry::Clone, 0));
     EXPECT_EQ(this->buildIt(), -1);
     EXPECT_EQ(logLines()[1], TypeParam::nullDeviceId + std::string("NULL\n"));
     this->expectNothingCached();
@@ -89,7 +89,7 @@ TYPED_TEST(DeviceBuild, TakesThePathThatIsHandedIn) {
 
 TYPED_TEST(DeviceBuild, WithoutCloneOfThePathHasNone) {
     if (std::string(TypeParam::name) == "Volume") return;  // needs the path for its pool
-    this->failClone(0);
+    this->faults().add(this->answerNull(testbed::Entry::Clone, 0));
     EXPECT_EQ(this->buildIt(), 0);
     ASSERT_NE(this->record(), nullptr);
     EXPECT_EQ(this->record()->*TypeParam::op, nullptr);
@@ -125,10 +125,10 @@ TYPED_TEST(DeviceBuild, StampsItsOwnTimesOnly) {
 
 TYPED_TEST(DeviceBuild, StampsTheRecordWhenItHasReadEverything) {
     int reads = 0;
-    this->whenCalled(testbed::Entry::InstanceGetProperty, [&reads] {
+    this->faults().add(this->watch(testbed::Entry::InstanceGetProperty, [&reads] {
         reads++;
         VirtualClock::advance(1);
-    });
+    }));
     ASSERT_EQ(this->buildIt(), 0);
     EXPECT_GE(reads, 3);
     EXPECT_EQ(this->record()->LastUpdateTime, this->kStart + reads);
@@ -144,7 +144,7 @@ TYPED_TEST(DeviceBuild, OwnsWhatItKeeps) {
 TYPED_TEST(DeviceBuild, ReadsOddStatusAsZero) {
     for (const OddValue& odd : oddArrays()) {
         SCOPED_TRACE(odd.label);
-        give(this->repository, this->path_, "OperationalStatus", odd);
+        this->give(this->path_, "OperationalStatus", odd);
         ASSERT_EQ(this->buildIt(), 0);
         EXPECT_EQ(this->record()->OperationalStatus, 0);
         ASSERT_EQ(TypeParam::remove(this->ctrl, this->record()), 0);

@@ -84,15 +84,15 @@ TEST_F(PortBuild, WithoutNameHasNone) {
 TEST_F(PortBuild, OddValuesCountAsNoneOrZero) {
     for (const OddValue& odd : oddTexts()) {
         SCOPED_TRACE(odd.label);
-        give(repository, path_, "ElementName", odd);
+        give(path_, "ElementName", odd);
         ASSERT_EQ(buildIt(), 0);
         EXPECT_EQ(record()->PortName, nullptr);
         ASSERT_EQ(DeletePort(ctrl, record()), 0);
     }
     for (const OddValue& odd : oddNumbers()) {
         SCOPED_TRACE(odd.label);
-        give(repository, path_, "PortType", odd);
-        give(repository, path_, "UsageRestriction", odd);
+        give(path_, "PortType", odd);
+        give(path_, "UsageRestriction", odd);
         ASSERT_EQ(buildIt(), 0);
         EXPECT_EQ(record()->PortType, 0);
         EXPECT_EQ(record()->UsageRestriction, 0);

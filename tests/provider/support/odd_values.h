@@ -64,14 +64,4 @@ inline std::vector<OddValue> oddArrays() {
             {"reference", oddReference()}};
 }
 
-/// Gives an object that value of a property.
-inline void give(testbed::Repository& repository, const testbed::ObjectPath& path,
-                 const std::string& property, const OddValue& odd) {
-    if (odd.value) {
-        repository.setProperty(path, property, *odd.value);
-    } else {
-        repository.eraseProperty(path, property);
-    }
-}
-
 }  // namespace plexortest

@@ -24,7 +24,8 @@ protected:
 };
 
 TEST_F(VolumeBuildFailures, SettingQueryFailingIsLoggedAndLivedWith) {
-    failQuery(Entry::Associators, "CIM_ElementSettingData", CMPI_RC_ERR_FAILED, "vendor is busy");
+    faults().add(along("CIM_ElementSettingData",
+                       refusal(Entry::Associators, CMPI_RC_ERR_FAILED, "vendor is busy")));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->RaidLevel, nullptr);
     EXPECT_STREQ(volume()->FromPool, "P1");
@@ -35,23 +36,21 @@ TEST_F(VolumeBuildFailures, SettingQueryFailingIsLoggedAndLivedWith) {
 }
 
 TEST_F(VolumeBuildFailures, SettingQueryAnsweringNullIsSilent) {
-    answerNull(Entry::Associators, "CIM_ElementSettingData");
+    faults().add(along("CIM_ElementSettingData", answerNull(Entry::Associators)));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->RaidLevel, nullptr);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
 }
 
 TEST_F(VolumeBuildFailures, SettingQueryFailingDespiteAResultIsNotUsed) {
-    testbed::FaultRule rule = queryRule(Entry::Associators, "CIM_ElementSettingData");
-    rule.rc = CMPI_RC_ERR_FAILED;
-    rule.keepResult = true;
-    faults().add(rule);
+    faults().add(along("CIM_ElementSettingData", refusalWithResult(Entry::Associators)));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->RaidLevel, nullptr);
 }
 
 TEST_F(VolumeBuildFailures, PoolQueryFailingTurnsTheVolumeAway) {
-    failQuery(Entry::AssociatorNames, "CIM_AllocatedFromStoragePool", CMPI_RC_ERR_NOT_FOUND, {});
+    faults().add(along("CIM_AllocatedFromStoragePool",
+                       refusal(Entry::AssociatorNames, CMPI_RC_ERR_NOT_FOUND, {})));
     expectTurnedAway();
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
                 ElementsAre("AssociatorNames " + kVolume +
@@ -63,9 +62,8 @@ TEST_F(VolumeBuildFailures, PoolQueryFailingTurnsTheVolumeAway) {
 
 // The pool was not asked for: nothing can be said of the volume, and nothing stays behind.
 TEST_F(VolumeBuildFailures, AStopBeforeThePoolQueryLeavesNothing) {
-    testbed::FaultRule rule = queryRule(Entry::Associators, "CIM_ElementSettingData");
-    rule.hook = [] { quiesceWorkers(); };
-    faults().add(rule);
+    faults().add(
+        along("CIM_ElementSettingData", watch(Entry::Associators, [] { quiesceWorkers(); })));
     EXPECT_EQ(buildVolume(), -1);
     expectNothingCached();
     EXPECT_EQ(books().count(Entry::AssociatorNames), 0u);
@@ -74,16 +72,13 @@ TEST_F(VolumeBuildFailures, AStopBeforeThePoolQueryLeavesNothing) {
 }
 
 TEST_F(VolumeBuildFailures, PoolQueryAnsweringNullTurnsTheVolumeAway) {
-    answerNull(Entry::AssociatorNames, "CIM_AllocatedFromStoragePool");
+    faults().add(along("CIM_AllocatedFromStoragePool", answerNull(Entry::AssociatorNames)));
     expectTurnedAway();
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), ElementsAre(kNoPool));
 }
 
 TEST_F(VolumeBuildFailures, PoolQueryFailingDespiteAResultTurnsTheVolumeAway) {
-    testbed::FaultRule rule = queryRule(Entry::AssociatorNames, "CIM_AllocatedFromStoragePool");
-    rule.rc = CMPI_RC_ERR_FAILED;
-    rule.keepResult = true;
-    faults().add(rule);
+    faults().add(along("CIM_AllocatedFromStoragePool", refusalWithResult(Entry::AssociatorNames)));
     expectTurnedAway();
 }
 
@@ -126,7 +121,7 @@ TEST_F(VolumeBuildFailures, PoolWithoutAnIdentifierIsFoundAndStillTurnsTheVolume
 }
 
 TEST_F(VolumeBuildFailures, CloneMissingMeansNoPool) {
-    failClone(0);
+    faults().add(answerNull(Entry::Clone, 0));
     EXPECT_EQ(
         [&] {
             DeliberateLeaks leaks;
@@ -305,7 +300,7 @@ class VolumeBuildValues : public VolumeTest, public testing::WithParamInterface<
 TEST_P(VolumeBuildValues, CountAsZeroWhenOdd) {
     for (const OddValue& odd : GetParam().isArray ? oddArrays() : oddNumbers()) {
         SCOPED_TRACE(odd.label);
-        give(repository, objects_.volume, GetParam().property, odd);
+        give(objects_.volume, GetParam().property, odd);
         ASSERT_EQ(buildVolume(), 0);
         EXPECT_EQ(GetParam().value(volume()), 0u);
         EXPECT_STREQ(volume()->FromPool, "P1");
@@ -319,9 +314,9 @@ INSTANTIATE_TEST_SUITE_P(Volume, VolumeBuildValues, testing::ValuesIn(kVolumeNum
 TEST_F(VolumeBuildFailures, OddTextsAreNull) {
     for (const OddValue& odd : oddTexts()) {
         SCOPED_TRACE(odd.label);
-        give(repository, objects_.volume, "ElementName", odd);
-        give(repository, objects_.volume, "Name", odd);
-        give(repository, objects_.setting, "ElementName", odd);
+        give(objects_.volume, "ElementName", odd);
+        give(objects_.volume, "Name", odd);
+        give(objects_.setting, "ElementName", odd);
         ASSERT_EQ(buildVolume(), 0);
         EXPECT_EQ(volume()->ElementName, nullptr);
         EXPECT_EQ(volume()->Name, nullptr);

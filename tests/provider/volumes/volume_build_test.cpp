@@ -113,8 +113,8 @@ TEST_F(VolumeBuild, LogsEveryStepInOrder) {
 }
 
 TEST_F(VolumeBuild, StampsTheRecordBeforeThePoolIsAskedFor) {
-    whenCalled(Entry::Associators, [] { VirtualClock::advance(3); });
-    whenCalled(Entry::AssociatorNames, [] { VirtualClock::advance(40); });
+    faults().add(watch(Entry::Associators, [] { VirtualClock::advance(3); }));
+    faults().add(watch(Entry::AssociatorNames, [] { VirtualClock::advance(40); }));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->LastUpdateTime, kStart + 3);
     EXPECT_EQ(ctrl->VolumeUpdateTime, kStart + 43);
@@ -165,7 +165,7 @@ TEST_F(VolumeBuild, HoldsTheLockForTheInsertionOnly) {
     EXPECT_THAT(held,
                 ElementsAre("held DEBUG Adding data <volume> to the list <volumes> at the tail\n",
                             "held DEBUG Data <volume> added to the list <volumes>, size 1\n"));
-    EXPECT_TRUE(lockIsFree());
+    EXPECT_TRUE(isFree(ctrl->CtrlMutex));
 }
 
 TEST_F(VolumeBuild, NeedsNoInterface) {

@@ -78,7 +78,7 @@ TEST_F(VolumeUpdate, OfAVolumeThatCannotBeFetchedOnlyStamps) {
 
 TEST_F(VolumeUpdate, OfAVolumeAnsweredNullOnlyStamps) {
     set("OperationalStatus", CimValue::uint16Array({6}));
-    answerNull(Entry::GetInstance, "");
+    faults().add(answerNull(Entry::GetInstance));
     ASSERT_EQ(updateVolume(nullptr), 0);
     EXPECT_THAT(logLines(), ElementsAre(kEnter, kGet, kExit));
     expectUnchanged();
@@ -277,7 +277,7 @@ TEST_F(VolumeUpdate, WaitsForTheLockWithTheInstanceInHand) {
 }
 
 TEST_F(VolumeUpdate, StampsAtTheEnd) {
-    whenCalled(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); });
+    faults().add(watch(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); }));
     ASSERT_EQ(updateVolume(), 0);
     EXPECT_EQ(ctrl->VolumeUpdateTime, kLater + 5);
 }

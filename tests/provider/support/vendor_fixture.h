@@ -1,5 +1,5 @@
-// What tests of the inventory's building share: a vendor, the log without the lists' chatter, and
-// the ways in which a vendor's answers can be bad.
+// What tests of discovery, walks, builders and updaters share: a vendor, what it was asked, and the
+// ways in which its answers can be bad.
 #pragma once
 
 #include <gmock/gmock.h>
@@ -9,6 +9,7 @@
 #include <utility>
 #include <vector>
 
+#include "log_text.h"
 #include "odd_values.h"
 #include "provider_fixture.h"
 #include "query_arguments.h"
@@ -18,33 +19,6 @@ namespace plexortest {
 
 /// What the profile that is looked for is registered as.
 inline constexpr char kProfileName[] = "Host Hardware RAID Controller";
-
-inline LogLine debugLine(std::string text) {
-    return {LOG_DEBUG, std::move(text)};
-}
-inline LogLine infoLine(std::string text) {
-    return {LOG_INFO, std::move(text)};
-}
-inline LogLine warningLine(std::string text) {
-    return {LOG_WARNING, std::move(text)};
-}
-inline LogLine errorLine(std::string text) {
-    return {LOG_ERR, std::move(text)};
-}
-
-/// The calling thread's lines without those of the lists and of released records.
-inline std::vector<LogLine> inventoryLog() {
-    constexpr const char* kListLines[] = {"Adding data ",  "Data ", "Removing data ",
-                                          "Freeing list ", "List ", "PutItem: Fifo("};
-    std::vector<LogLine> found;
-    for (const LogLine& line : CapturedSyslog::lines()) {
-        bool skipped =
-            line.thread != std::this_thread::get_id() || line.text.ends_with(" deleted\n");
-        for (const char* start : kListLines) skipped = skipped || line.text.starts_with(start);
-        if (!skipped) found.push_back(line);
-    }
-    return found;
-}
 
 /// One way in which a query fails, and the end of the line that says so; none when nothing is said.
 struct QueryFailure {
@@ -71,8 +45,14 @@ std::vector<Record*> recordsOf(const List_t* list) {
     return records;
 }
 
+/// The record at the head of a list; null without one.
+template <class Record>
+Record* firstOf(const List_t* list) {
+    return list->Head != nullptr ? static_cast<Record*>(list->Head->Data) : nullptr;
+}
+
 /// The provider over a vendor whose classes are known and who has no object yet.
-class InventoryTest : public ProviderTest {
+class VendorTest : public ProviderTest {
 protected:
     using Path = testbed::ObjectPath;
     using Entry = testbed::Entry;
@@ -90,11 +70,16 @@ protected:
         faults().clear();
         faults().add(std::move(rule));
     }
-    /// A rule for queries along that association.
-    static testbed::FaultRule along(const std::string& assocClass, testbed::FaultRule answer) {
-        answer.entry = Entry::Associators;
-        answer.assocClass = assocClass;
-        return answer;
+    /// Narrows a rule for queries down to that association.
+    static testbed::FaultRule along(const std::string& assocClass, testbed::FaultRule rule) {
+        rule.assocClass = assocClass;
+        return rule;
+    }
+    /// A rule by which queries fail and give their result all the same.
+    static testbed::FaultRule refusalWithResult(Entry entry) {
+        testbed::FaultRule rule = refusal(entry);
+        rule.keepResult = true;
+        return rule;
     }
     /// A rule that runs a hook at calls of that entry and leaves them alone.
     static testbed::FaultRule watch(Entry entry, std::function<void()> hook) {
@@ -138,19 +123,28 @@ protected:
     void unset(const Path& path, const char* property) {
         EXPECT_TRUE(repository.eraseProperty(path, property)) << path.text() << " " << property;
     }
+    /// Gives an object that value of a property, or takes the property away.
     void give(const Path& path, const std::string& property, const OddValue& odd) {
-        plexortest::give(repository, path, property, odd);
-    }
-    /// "<entry> <path> <association class> <result class>" for each query since startOver.
-    Texts askedQueries() {
-        Texts asked;
-        for (const testbed::CallRecord& call : books().queries()) {
-            asked.push_back(std::string(testbed::entryName(call.entry)) + " " + call.path + " " +
-                            call.assocClass.value_or("any") + " " +
-                            call.resultClass.value_or("any"));
-            EXPECT_TRUE(asksForAll(call)) << asked.back();
+        if (odd.value) {
+            repository.setProperty(path, property, *odd.value);
+        } else {
+            repository.eraseProperty(path, property);
         }
-        return asked;
+    }
+    /// Every call that the broker was asked for since startOver: "associators <path>
+    /// <assoc>/<result>".
+    Texts brokerCalls() {
+        Texts calls;
+        for (const testbed::CallRecord& call : books().calls()) {
+            if (testbed::isObjectEntry(call.entry)) continue;
+            std::string text = std::string(testbed::entryName(call.entry)) + " " + call.path;
+            if (call.entry != Entry::GetInstance) {
+                text += " " + call.assocClass.value_or("NULL") + "/" +
+                        call.resultClass.value_or("NULL");
+            }
+            calls.push_back(text + (asksForAll(call) ? "" : " with roles or properties"));
+        }
+        return calls;
     }
     /// Names of the properties read from instances of the class, in order; needs recordObjectCalls.
     Texts propertiesRead(const std::string& className) {
@@ -165,10 +159,8 @@ protected:
     VendorObjects vendor{repository};
 };
 
-inline std::vector<QueryFailure> InventoryTest::queryFailures() {
+inline std::vector<QueryFailure> VendorTest::queryFailures() {
     const Entry any = Entry::Associators;
-    QueryFailure withResult = {"status and a result", refusal(any), "status: rc 1, msg NULL"};
-    withResult.answer.keepResult = true;
     return {
         {"status alone", refusal(any, CMPI_RC_ERR_NOT_FOUND), "status: rc 6, msg NULL"},
         {"status and message", refusal(any, CMPI_RC_ERR_ACCESS_DENIED, "the vendor is busy"),
@@ -176,7 +168,7 @@ inline std::vector<QueryFailure> InventoryTest::queryFailures() {
         {"status and empty message", refusal(any, CMPI_RC_ERR_FAILED, ""), "status: rc 1, msg "},
         {"status and a message like a format", refusal(any, CMPI_RC_ERR_FAILED, "50%s %n %d%%"),
          "status: rc 1, msg 50%s %n %d%%"},
-        withResult,
+        {"status and a result", refusalWithResult(any), "status: rc 1, msg NULL"},
         {"NULL with status OK", answerNull(any), std::nullopt},
     };
 }
