@@ -19,8 +19,8 @@ class InventoryAsync : public RefreshTest {
 protected:
     RaidController_t* cachedController(const char* id) {
         RaidController_t* ctrl = attach(newController(id));
-        array_ = vendor_.controller(id);
-        ctrl->ControllerOp = clonedPath(array_.system);
+        card = vendor.controller(id);
+        ctrl->ControllerOp = clonedPath(card.system);
         clearLog();
         return ctrl;
     }
@@ -43,8 +43,7 @@ protected:
         }
     }
 
-    VendorObjects vendor_{repository};
-    VendorController array_;  // the latest
+    VendorController card;  // the latest
 };
 
 TEST_F(InventoryAsync, OneItemIsQueued) {
@@ -224,7 +223,7 @@ TEST_F(InventoryAsync, RefusedWalksAreDoneAsWell) {
 
 TEST_F(InventoryAsync, RequestsAreSkippedWhileItRunsAndServedAfterIt) {
     RaidController_t* const ctrl = cachedController("C0");
-    for (int i = 0; i < 30; i++) vendor_.port(array_, "P" + std::to_string(i));
+    for (int i = 0; i < 30; i++) vendor.port(card, "P" + std::to_string(i));
     Gate gate;
     FaultRule hold;
     hold.entry = Entry::Associators;

@@ -17,17 +17,17 @@ class RequestRefreshGate : public RefreshTest {
 protected:
     void SetUp() override {
         RefreshTest::SetUp();
-        ctrl_ = attach(newController("C0"));
+        ctrl = attach(newController("C0"));
         setAllUpdateTimes(kStart - 1000);
         ThreadActivityDone = 1;
         clearLog();
     }
     void setAllUpdateTimes(time_t time) {
-        for (auto field : kUpdateTimes) ctrl_->*field = time;
+        for (auto field : kUpdateTimes) ctrl->*field = time;
     }
-    int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl_, action); }
+    int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl, action); }
 
-    RaidController_t* ctrl_ = nullptr;
+    RaidController_t* ctrl = nullptr;
 };
 
 TEST_F(RequestRefreshGate, EntryIsTracedFirst) {
@@ -85,7 +85,7 @@ TEST_F(RequestRefreshGate, WrongActionsAreIgnored) {
 }
 
 TEST_F(RequestRefreshGate, SkipLineShowsBothTimes) {
-    ctrl_->VolumeUpdateTime = kStart - 19;
+    ctrl->VolumeUpdateTime = kStart - 19;
     EXPECT_EQ(request(101), 0);
     EXPECT_EQ(queuedItems(), 0u);
     EXPECT_EQ(CapturedSyslog::lines().size(), 2u);
@@ -95,7 +95,7 @@ TEST_F(RequestRefreshGate, SkipLineShowsBothTimes) {
 }
 
 TEST_F(RequestRefreshGate, DueFromTheIntervalOn) {
-    ctrl_->PortUpdateTime = kStart;
+    ctrl->PortUpdateTime = kStart;
     VirtualClock::set(kStart + 19);
     request(102);
     EXPECT_EQ(queuedItems(), 0u);
@@ -109,7 +109,7 @@ TEST_F(RequestRefreshGate, DueFromTheIntervalOn) {
 
 TEST_F(RequestRefreshGate, AnotherIntervalMovesTheLimit) {
     StateUpdateInterval = 45;
-    ctrl_->PortUpdateTime = kStart;
+    ctrl->PortUpdateTime = kStart;
     VirtualClock::set(kStart + 44);
     request(102);
     EXPECT_EQ(queuedItems(), 0u);
@@ -119,7 +119,7 @@ TEST_F(RequestRefreshGate, AnotherIntervalMovesTheLimit) {
 }
 
 TEST_F(RequestRefreshGate, UpdateTimeInTheFutureIsNotDue) {
-    ctrl_->BatteryUpdateTime = kStart + 3600;
+    ctrl->BatteryUpdateTime = kStart + 3600;
     EXPECT_EQ(request(103), 0);
     EXPECT_EQ(queuedItems(), 0u);
     EXPECT_TRUE(loggedOnce(LOG_DEBUG,
@@ -128,20 +128,20 @@ TEST_F(RequestRefreshGate, UpdateTimeInTheFutureIsNotDue) {
 }
 
 TEST_F(RequestRefreshGate, NeverRefreshedIsDue) {
-    ctrl_->DiskUpdateTime = 0;
+    ctrl->DiskUpdateTime = 0;
     EXPECT_EQ(request(100), 0);
     EXPECT_EQ(queuedItems(), 1u);
 }
 
 TEST_F(RequestRefreshGate, TheRequestItselfMovesNoUpdateTime) {
     for (int action = 100; action <= 105; action++) request(action);
-    for (auto field : kUpdateTimes) EXPECT_EQ(ctrl_->*field, kStart - 1000);
+    for (auto field : kUpdateTimes) EXPECT_EQ(ctrl->*field, kStart - 1000);
 }
 
 TEST_F(RequestRefreshGate, TakesNoLockOfTheController) {
     pthread_mutex_t* const mutexes[] = {
-        &ctrl_->CtrlMutex,       &ctrl_->DiskCfgMutex, &ctrl_->VolumeCfgMutex, &ctrl_->PortCfgMutex,
-        &ctrl_->BatteryCfgMutex, &ctrl_->PoolCfgMutex, &ctrl_->ChassisCfgMutex};
+        &ctrl->CtrlMutex,       &ctrl->DiskCfgMutex, &ctrl->VolumeCfgMutex, &ctrl->PortCfgMutex,
+        &ctrl->BatteryCfgMutex, &ctrl->PoolCfgMutex, &ctrl->ChassisCfgMutex};
     for (pthread_mutex_t* mutex : mutexes) pthread_mutex_lock(mutex);
     auto done = std::async(std::launch::async, [this] {
         for (int action = 100; action <= 105; action++) request(action);
@@ -172,14 +172,14 @@ class RequestRefreshTimes : public RequestRefreshGate,
                             public ::testing::WithParamInterface<ActionTime> {};
 
 TEST_P(RequestRefreshTimes, ItsOwnTimeTurnsItDown) {
-    ctrl_->*GetParam().updateTime = kStart - 19;
+    ctrl->*GetParam().updateTime = kStart - 19;
     EXPECT_EQ(request(GetParam().action), 0);
     EXPECT_EQ(queuedItems(), 0u);
 }
 
 TEST_P(RequestRefreshTimes, NoOtherTimeTurnsItDown) {
     setAllUpdateTimes(kStart);
-    ctrl_->*GetParam().updateTime = kStart - 20;
+    ctrl->*GetParam().updateTime = kStart - 20;
     EXPECT_EQ(request(GetParam().action), 0);
     EXPECT_EQ(queuedItems(), 1u);
 }

@@ -11,22 +11,12 @@ using testbed::CimValue;
 using testbed::Entry;
 using testbed::FaultRule;
 
-class WorkersQuiesce : public WorkersTest {
+class WorkersQuiesce : public WorkersCardTest {
 protected:
     void SetUp() override {
-        WorkersTest::SetUp();
-        array_ = vendor_.controller("C0");
-        ctrl_ = attach(newController("C0"));
-        ctrl_->ControllerOp = clonedPath(array_.system);
+        WorkersCardTest::SetUp();
         startWorkers();
     }
-    /// Makes a worker run an item that ends when the gate opens.
-    void occupyWorker(Gate& gate) {
-        ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-    }
-    VendorObjects vendor_{repository};
-    VendorController array_;
-    RaidController_t* ctrl_ = nullptr;
 };
 
 TEST_F(WorkersQuiesce, IdleWorkersNeedNoWaiting) {
@@ -41,10 +31,8 @@ TEST_F(WorkersQuiesce, IdleWorkersNeedNoWaiting) {
 TEST_F(WorkersQuiesce, ItWaitsForEveryRunningItem) {
     Gate first, second;
     const GateOpener firstOpener(first), secondOpener(second);
-    occupyWorker(first);
-    ASSERT_TRUE(first.awaitArrivals(1));
-    occupyWorker(second);
-    ASSERT_TRUE(second.awaitArrivals(1));
+    occupyWorkers(1, first);
+    occupyWorkers(1, second);
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
     ASSERT_TRUE(eventually(StopRequested));
@@ -61,10 +49,7 @@ TEST_F(WorkersQuiesce, AnItemRunsUntilItsThreadIsFlushed) {
     if (!kContextHasFlush) GTEST_SKIP() << "no context entry to hold up";
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule slowFlush;
-    slowFlush.entry = Entry::ContextFlush;
-    slowFlush.hook = [&] { gate.pass(); };
-    faults().add(slowFlush);
+    faults().add(watch(Entry::ContextFlush, [&] { gate.pass(); }));
     tasks_.queue([](CMPIContext*, void*) {});
     ASSERT_TRUE(gate.awaitArrivals(1));
 
@@ -99,9 +84,7 @@ TEST_F(WorkersQuiesce, NoItemBeginsInThisLifeNorByItsWorkersInTheNext) {
 TEST_F(WorkersQuiesce, WhatIsQueuedBehindARunningItemDoesNotBegin) {
     Gate gate;
     const GateOpener opener(gate);
-    occupyWorker(gate);
-    occupyWorker(gate);
-    ASSERT_TRUE(gate.awaitArrivals(2));
+    occupyWorkers(2, gate);
     for (int i = 0; i < 5; i++) tasks_.queue([](CMPIContext*, void*) {});
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
@@ -117,8 +100,7 @@ TEST_F(WorkersQuiesce, WhatIsQueuedBehindARunningItemDoesNotBegin) {
 TEST_F(WorkersQuiesce, AStuckItemIsWaitedForThirtySecondsInAll) {
     Gate gate;
     const GateOpener opener(gate);
-    occupyWorker(gate);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    occupyWorkers(1, gate);
     const HurriedWaits hurry;
 
     EXPECT_FALSE(quiesceWorkers());
@@ -133,40 +115,35 @@ TEST_F(WorkersQuiesce, AStuckItemIsWaitedForThirtySecondsInAll) {
 }
 
 TEST_F(WorkersQuiesce, ARefreshUnderWayAsksNothingMoreAndTouchesNoRecord) {
-    vendor_.port(array_, "P0");
-    vendor_.battery(array_, "B0");
-    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    ASSERT_EQ(ctrl_->PortList->Size, 1u);
+    vendor.port(card, "P0");
+    vendor.battery(card, "B0");
+    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
+    ASSERT_EQ(ctrl->PortList->Size, 1u);
     repository.clearInstances();
-    vendor_.controller("C0");
+    vendor.controller("C0");
     books().clearCalls();
     ASSERT_TRUE(quiesceWorkers());
 
-    ctrl_->PortUpdateTime = 0;
-    EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 101), 0);
+    ctrl->PortUpdateTime = 0;
+    EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
+    EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, 101), 0);
 
     EXPECT_TRUE(books().queries().empty());
-    EXPECT_EQ(ctrl_->PortList->Size, 1u);
+    EXPECT_EQ(ctrl->PortList->Size, 1u);
 }
 
 TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
-    const testbed::ObjectPath gone = vendor_.port(array_, "P0");
-    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    ASSERT_EQ(ctrl_->PortList->Size, 1u);
+    const testbed::ObjectPath gone = vendor.port(card, "P0");
+    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
+    ASSERT_EQ(ctrl->PortList->Size, 1u);
     repository.remove(gone);
-    for (const char* id : {"P1", "P2"}) vendor_.port(array_, id);
+    for (const char* id : {"P1", "P2"}) vendor.port(card, id);
     VirtualClock::advance(100);
     books().clearCalls();
     setThreadActivityDone(1);
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule slow;
-    slow.entry = Entry::Associators;
-    slow.hook = [&] { gate.pass(); };
-    faults().add(slow);
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    holdRefreshOfPorts(gate);
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
     ASSERT_TRUE(eventually(StopRequested));
@@ -176,17 +153,16 @@ TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
     EXPECT_EQ(associatorQueries(), std::vector<std::string>{"CIM_SystemDevice>CIM_SASSATAPort"});
     EXPECT_TRUE(
         loggedOnce(LOG_DEBUG, "CrossoutDuplicatedEntries EXITED, rc -100, remove 0, add 0\n"));
-    ASSERT_EQ(ctrl_->PortList->Size, 1u);
-    EXPECT_STREQ(static_cast<SASSATAPort_t*>(ctrl_->PortList->Head->Data)->DeviceID, "P0");
+    ASSERT_EQ(ctrl->PortList->Size, 1u);
+    EXPECT_STREQ(static_cast<SASSATAPort_t*>(ctrl->PortList->Head->Data)->DeviceID, "P0");
 }
 
 TEST_F(WorkersQuiesce, AnInventoryUnderWayIsGivenUp) {
     // More ports than fit into the queue, and a worker that does not get on with the first.
-    for (int i = 0; i < 60; i++) vendor_.port(array_, "P" + std::to_string(i));
+    for (int i = 0; i < 60; i++) vendor.port(card, "P" + std::to_string(i));
     Gate gate;
     const GateOpener opener(gate);
-    occupyWorker(gate);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    occupyWorkers(1, gate);
     ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
     ASSERT_TRUE(eventually([] {
         return timesLogged(LOG_ERR, "BuildLogicalDeviceInfo: FIFO full, waiting...\n") > 2;
@@ -197,7 +173,7 @@ TEST_F(WorkersQuiesce, AnInventoryUnderWayIsGivenUp) {
     gate.open();
     ASSERT_TRUE(quiet.get());
     EXPECT_EQ(activeThreads(), 0u);
-    EXPECT_EQ(ctrl_->PortList->Size, 0u);
+    EXPECT_EQ(ctrl->PortList->Size, 0u);
     EXPECT_EQ(queuedItems(), 20u);
 
     running_ = false;

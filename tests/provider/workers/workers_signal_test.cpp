@@ -5,17 +5,7 @@
 namespace plexortest {
 namespace {
 
-class WorkersSignal : public WorkersTest {
-protected:
-    void SetUp() override {
-        WorkersTest::SetUp();
-        ctrl_ = attach(newController("C0"));
-        ctrl_->ControllerOp = clonedPath(vendor_.controller("C0").system);
-    }
-
-    VendorObjects vendor_{repository};
-    RaidController_t* ctrl_ = nullptr;
-};
+using WorkersSignal = WorkersCardTest;
 
 TEST_F(WorkersSignal, AnItemThatNobodyWasWokenForIsFound) {
     const HurriedWaits hurry(HurriedWaits::Conditions);
@@ -29,7 +19,7 @@ TEST_F(WorkersSignal, ARequestWithALostSignalIsServed) {
     startWorkers();
     setThreadActivityDone(1);
     const LostWakeUps lost(LostWakeUps::Signals);
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
+    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
     EXPECT_EQ(LostWakeUps::count(), 1);
     EXPECT_TRUE(eventually([this] { return associatorQueries().size() == 1; }));
 }

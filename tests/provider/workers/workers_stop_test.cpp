@@ -76,8 +76,7 @@ TEST_F(WorkersStop, ABusyWorkerFinishesItsItemAndWaitsAgain) {
     startWorkers();
     Gate gate;
     const GateOpener opener(gate);
-    ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    occupyWorkers(1, gate);
     const std::size_t idle = idleLines();
 
     stopWithoutWaiting();
@@ -100,10 +99,7 @@ TEST_F(WorkersStop, WaitingForAStuckWorkerIsBounded) {
     startWorkers();
     Gate gate;
     const GateOpener opener(gate);
-    for (int i = 0; i < 2; i++) {
-        ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-    }
-    ASSERT_TRUE(gate.awaitArrivals(2));
+    occupyWorkers(2, gate);
     {
         const HurriedWaits hurry(HurriedWaits::Joins);
         CleanupPlexorThreads();
@@ -118,10 +114,7 @@ TEST_F(WorkersStop, WhatIsLeftInTheQueueIsReleased) {
     startWorkers();
     Gate gate;
     const GateOpener opener(gate);
-    for (int i = 0; i < 2; i++) {
-        ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-    }
-    ASSERT_TRUE(gate.awaitArrivals(2));
+    occupyWorkers(2, gate);
     putDeviceItem();
     tasks_.put([](CMPIContext*, void*) {});
     putDeviceItem();
