@@ -162,10 +162,8 @@ TEST_F(DiskBuildFailures, ExtentCloneMissingMeansNoPool) {
 }
 
 TEST_F(DiskBuildFailures, ExtentWithoutPathMeansNoPool) {
-    testbed::FaultRule rule;
-    rule.entry = Entry::InstanceGetObjectPath;
+    testbed::FaultRule rule = answerNull(Entry::InstanceGetObjectPath);
     rule.className = "Sample_StorageExtent";
-    rule.nullResult = true;
     faults().add(rule);
     EXPECT_EQ(buildDisk(), -1);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
@@ -174,10 +172,8 @@ TEST_F(DiskBuildFailures, ExtentWithoutPathMeansNoPool) {
 }
 
 TEST_F(DiskBuildFailures, SlotWithoutPathHasNoChassis) {
-    testbed::FaultRule rule;
-    rule.entry = Entry::InstanceGetObjectPath;
+    testbed::FaultRule rule = answerNull(Entry::InstanceGetObjectPath);
     rule.className = "Sample_Slot";
-    rule.nullResult = true;
     faults().add(rule);
     EXPECT_EQ(buildDisk(), 0);
     EXPECT_EQ(disk()->SlotNumber, 4);

@@ -7,13 +7,10 @@ namespace plexortest {
 
 class DiskUpdateTest : public DiskTest {
 protected:
-    static constexpr time_t kLater = kStart + 30;
-
     void SetUp() override {
         DiskTest::SetUp();
         ASSERT_EQ(buildDisk(), 0);
-        VirtualClock::set(kLater);
-        startOver();
+        goOnLater();
     }
 
     void setStatus(std::uint16_t operational, std::uint16_t extent) {

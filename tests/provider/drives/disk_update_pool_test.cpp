@@ -213,17 +213,12 @@ TEST_F(DiskUpdatePool, SurvivesEveryFailingAllocation) {
 TEST_F(DiskUpdatePool, WaitsForTheLockBeforeItChangesAnything) {
     setStatus(2, 2);
     CMPIInstance* fresh = instanceAt(objects_.drive);
-    whileLockIsTaken(
-        [&](const CMPIContext* context) {
-            EXPECT_EQ(CheckAndUpdateDiskInfo(&mi, context, ctrl, disk(), fresh), 0);
-        },
-        [&] { return books().queries().size() == 1; },
-        [&] {
-            EXPECT_EQ(disk()->OperationalStatus, 5);
-            EXPECT_EQ(disk()->ExtentStatus, 16);
-            EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
-            EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
-        });
+    updateWhileLockIsTaken(CheckAndUpdateDiskInfo, disk(), fresh, 1, [&] {
+        EXPECT_EQ(disk()->OperationalStatus, 5);
+        EXPECT_EQ(disk()->ExtentStatus, 16);
+        EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
+        EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
+    });
     EXPECT_EQ(disk()->OperationalStatus, 2);
     EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
 }
@@ -231,15 +226,10 @@ TEST_F(DiskUpdatePool, WaitsForTheLockBeforeItChangesAnything) {
 TEST_F(DiskUpdatePool, WaitsForTheLockToRejoinAndToStamp) {
     RemoveDiskFromPool(pool_, "D1");
     CMPIInstance* fresh = instanceAt(objects_.drive);
-    whileLockIsTaken(
-        [&](const CMPIContext* context) {
-            EXPECT_EQ(CheckAndUpdateDiskInfo(&mi, context, ctrl, disk(), fresh), 0);
-        },
-        [&] { return books().queries().size() == 2; },
-        [&] {
-            EXPECT_THAT(members(pool_), IsEmpty());
-            EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
-        });
+    updateWhileLockIsTaken(CheckAndUpdateDiskInfo, disk(), fresh, 2, [&] {
+        EXPECT_THAT(members(pool_), IsEmpty());
+        EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
+    });
     EXPECT_THAT(members(pool_), ElementsAre("D1"));
     EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
 }

@@ -15,7 +15,7 @@ protected:
                            nullptr);
     }
 };
-TYPED_TEST_SUITE(EnclosureFailures, EnclosureKinds, EnclosureKindNames);
+TYPED_TEST_SUITE(EnclosureFailures, EnclosureKinds, KindNames);
 
 TYPED_TEST(EnclosureFailures, MandatoryTextIsMissing) {
     for (const std::string& property : TypeParam::mandatory()) {

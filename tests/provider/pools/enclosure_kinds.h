@@ -89,13 +89,6 @@ struct ChassisKind {
 
 using EnclosureKinds = testing::Types<PoolKind, ChassisKind>;
 
-struct EnclosureKindNames {
-    template <class Kind>
-    static std::string GetName(int) {
-        return Kind::name;
-    }
-};
-
 /// A vendor's device of the kind with the kind's id, and what becomes of it.
 template <class Kind>
 class EnclosureKindTest : public EnclosureTest {

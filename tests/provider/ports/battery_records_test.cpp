@@ -109,13 +109,10 @@ TEST_F(BatteryBuild, SurvivesEveryFailingAllocation) {
 
 class BatteryUpdate : public BatteryTest {
 protected:
-    static constexpr time_t kLater = kStart + 30;
-
     void SetUp() override {
         BatteryTest::SetUp();
         ASSERT_EQ(buildIt(), 0);
-        VirtualClock::set(kLater);
-        startOver();
+        goOnLater();
     }
     int updateBattery(CMPIInstance* fresh) {
         return update(CheckAndUpdateBatteryInfo, record(), fresh);
@@ -244,16 +241,11 @@ TEST_F(BatteryUpdate, StampsAfterReading) {
 
 TEST_F(BatteryUpdate, WaitsForTheLockBeforeItChangesAnything) {
     setStatus(6, 4);
-    whileLockIsTaken(
-        [&](const CMPIContext* context) {
-            EXPECT_EQ(CheckAndUpdateBatteryInfo(&mi, context, ctrl, record(), nullptr), 0);
-        },
-        [&] { return books().queries().size() == 1; },
-        [&] {
-            EXPECT_EQ(record()->OperationalStatus, 11);
-            EXPECT_EQ(record()->BatteryStatus, 7);
-            EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
-        });
+    updateWhileLockIsTaken(CheckAndUpdateBatteryInfo, record(), nullptr, 1, [&] {
+        EXPECT_EQ(record()->OperationalStatus, 11);
+        EXPECT_EQ(record()->BatteryStatus, 7);
+        EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
+    });
     expectStatus(6, 4);
 }
 

@@ -101,13 +101,6 @@ struct BatteryKind {
 
 using DeviceKinds = testing::Types<DiskKind, VolumeKind, PortKind, BatteryKind>;
 
-struct KindNames {
-    template <class Kind>
-    static std::string GetName(int) {
-        return Kind::name;
-    }
-};
-
 /// A vendor's device "X1" of the kind, with what it needs around it to be accepted.
 template <class Kind>
 class KindTest : public DeviceTest {

@@ -13,8 +13,19 @@
 
 namespace plexortest {
 
+/// What a typed test over kinds of device is called for each of them.
+struct KindNames {
+    template <class Kind>
+    static std::string GetName(int) {
+        return Kind::name;
+    }
+};
+
 class DeviceTest : public VendorTest {
 protected:
+    /// When the tests of updates go on, the build being forgotten.
+    static constexpr time_t kLater = kStart + 30;
+
     void SetUp() override {
         VendorTest::SetUp();
         card = vendor.controller("C0");
@@ -27,6 +38,12 @@ protected:
     }
     int update(UpdateFunc_t updater, void* device, CMPIInstance* fresh) {
         return updater(&mi, ctx(), ctrl, device, fresh);
+    }
+
+    /// Lets some time go by after a build, and forgets its log and calls.
+    void goOnLater() {
+        VirtualClock::set(kLater);
+        startOver();
     }
 
     static Texts members(const StoragePool_t* pool) {
@@ -78,6 +95,16 @@ protected:
         meanwhile();
         pthread_mutex_unlock(&ctrl->CtrlMutex);
         worker.join();
+    }
+
+    /// Updates while the lock is taken, which the update needs once it has made that many queries.
+    void updateWhileLockIsTaken(UpdateFunc_t updater, void* device, CMPIInstance* fresh,
+                                std::size_t queries, const std::function<void()>& meanwhile) {
+        whileLockIsTaken(
+            [&](const CMPIContext* context) {
+                EXPECT_EQ(updater(&mi, context, ctrl, device, fresh), 0);
+            },
+            [&] { return books().queries().size() == queries; }, meanwhile);
     }
 
     VendorController card;

@@ -11,13 +11,10 @@ using testing::IsEmpty;
 
 class VolumeUpdate : public VolumeTest {
 protected:
-    static constexpr time_t kLater = kStart + 30;
-
     void SetUp() override {
         VolumeTest::SetUp();
         ASSERT_EQ(buildVolume(), 0);
-        VirtualClock::set(kLater);
-        startOver();
+        goOnLater();
     }
 
     void set(const char* property, const CimValue& value) {
@@ -262,16 +259,11 @@ TEST_F(VolumeUpdate, NeverRefreshesWhatTheBuildRead) {
 
 TEST_F(VolumeUpdate, WaitsForTheLockWithTheInstanceInHand) {
     set("OperationalStatus", CimValue::uint16Array({6}));
-    whileLockIsTaken(
-        [&](const CMPIContext* context) {
-            EXPECT_EQ(CheckAndUpdateVolumeInfo(&mi, context, ctrl, volume(), nullptr), 0);
-        },
-        [&] { return books().queries().size() == 1; },
-        [&] {
-            EXPECT_EQ(volume()->OperationalStatus, 3);
-            EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
-            EXPECT_EQ(ctrl->VolumeUpdateTime, kStart);
-        });
+    updateWhileLockIsTaken(CheckAndUpdateVolumeInfo, volume(), nullptr, 1, [&] {
+        EXPECT_EQ(volume()->OperationalStatus, 3);
+        EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
+        EXPECT_EQ(ctrl->VolumeUpdateTime, kStart);
+    });
     EXPECT_EQ(volume()->OperationalStatus, 6);
     EXPECT_EQ(ctrl->VolumeUpdateTime, kLater);
 }
