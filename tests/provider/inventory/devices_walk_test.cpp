@@ -40,7 +40,7 @@ TEST_F(DevicesWalk, OneQueryForDevicesOfAllKinds) {
     addPorts(3);
     vendor.battery(card, "B");
     EXPECT_EQ(walk(), 0);
-    EXPECT_THAT(brokerCalls(),
+    EXPECT_THAT(queries(),
                 ElementsAre("associators " + card.system.text() + " CIM_SystemDevice/NULL"));
 }
 

@@ -131,21 +131,13 @@ protected:
             repository.eraseProperty(path, property);
         }
     }
-    /// Every call that the broker was asked for since startOver: "associators <path>
-    /// <assoc>/<result>".
+    /// Every call to the broker since startOver: "associators <path> <assoc>/<result>".
     Texts brokerCalls() {
-        Texts calls;
-        for (const testbed::CallRecord& call : books().calls()) {
-            if (testbed::isObjectEntry(call.entry)) continue;
-            std::string text = std::string(testbed::entryName(call.entry)) + " " + call.path;
-            if (call.entry != Entry::GetInstance) {
-                text += " " + call.assocClass.value_or("NULL") + "/" +
-                        call.resultClass.value_or("NULL");
-            }
-            calls.push_back(text + (asksForAll(call) ? "" : " with roles or properties"));
-        }
-        return calls;
+        return callTexts(books().calls(),
+                         [](testbed::Entry entry) { return !testbed::isObjectEntry(entry); });
     }
+    /// Those of them that the vendor was asked.
+    Texts queries() { return callTexts(books().calls(), testbed::isQuery); }
     /// Names of the properties read from instances of the class, in order; needs recordObjectCalls.
     Texts propertiesRead(const std::string& className) {
         Texts names;
@@ -157,6 +149,22 @@ protected:
     }
 
     VendorObjects vendor{repository};
+
+private:
+    template <class Filter>
+    static Texts callTexts(const std::vector<testbed::CallRecord>& calls, Filter isWanted) {
+        Texts texts;
+        for (const testbed::CallRecord& call : calls) {
+            if (!isWanted(call.entry)) continue;
+            std::string text = std::string(testbed::entryName(call.entry)) + " " + call.path;
+            if (call.entry != Entry::GetInstance) {
+                text += " " + call.assocClass.value_or("NULL") + "/" +
+                        call.resultClass.value_or("NULL");
+            }
+            texts.push_back(text + (asksForAll(call) ? "" : " with roles or properties"));
+        }
+        return texts;
+    }
 };
 
 inline std::vector<QueryFailure> VendorTest::queryFailures() {
