@@ -83,11 +83,7 @@ TEST_F(MeetingCallsTest, TerminatingItWaitsThreeSeconds) {
 TEST_F(MeetingCallsTest, ACleanupEndsTheInitialisationAfterItsVendorCall) {
     Gate gate;
     const GateOpener opener(gate);
-    testbed::FaultRule slow = waitingAt(Entry::EnumerateInstances, gate);
-    slow.className = "CIM_RegisteredProfile";
-    faults().add(slow);
-    auto factory = callFactoryElsewhere();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto factory = factoryHeldAtTheProfiles(gate);
     auto cleanup = cleanupThatWaits(true);
     gate.open();
     EXPECT_NE(factory.get(), nullptr);
@@ -103,11 +99,7 @@ TEST_F(MeetingCallsTest, ACleanupEndsTheInitialisationAfterItsVendorCall) {
 TEST_F(MeetingCallsTest, AFactoryCallThatWaitsForItsTurnLeavesWithTheCleanup) {
     Gate gate;
     const GateOpener opener(gate);
-    testbed::FaultRule slow = waitingAt(Entry::EnumerateInstances, gate);
-    slow.className = "CIM_RegisteredProfile";
-    faults().add(slow);
-    auto first = callFactoryElsewhere();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto first = factoryHeldAtTheProfiles(gate);
     auto second = callFactoryElsewhere();
     ASSERT_TRUE(plexortest::eventually(
         [] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 2; }));

@@ -127,10 +127,13 @@ protected:
     }
     int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl, action); }
     /// Holds walks over that class at the gate.
-    void holdWalk(const std::string& resultClass, Gate& gate) {
-        FaultRule rule = walkOver(resultClass);
+    /// Asks for a refresh of the ports that comes as far as its walk, and waits there.
+    void holdRefreshOfPorts(Gate& gate) {
+        FaultRule rule = walkOver("CIM_SASSATAPort");
         rule.hook = [&gate] { gate.pass(); };
         faults().add(rule);
+        ASSERT_EQ(request(102), 0);
+        ASSERT_TRUE(gate.awaitArrivals(1));
     }
     std::size_t countOfLists() {
         pthread_mutex_lock(&ctrl->CtrlMutex);
@@ -140,52 +143,46 @@ protected:
     }
 };
 
-TEST_F(ReconcileTwoWorkers, TheSameClassIsRefreshedOnce) {
+/// Two workers, which may pass the gate at the end of the scope at the latest.
+struct WorkersAtAGate {
+    explicit WorkersAtAGate(const CMPIContext* creator) : first(creator, 0), second(creator, 1) {}
     Gate gate;
-    holdWalk("CIM_SASSATAPort", gate);
-    Worker first(ctx(), 0);
-    Worker second(ctx(), 1);
-    const GateOpener opener(gate);
+    Worker first, second;
+    GateOpener opener{gate};
+};
 
-    ASSERT_EQ(request(102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+TEST_F(ReconcileTwoWorkers, TheSameClassIsRefreshedOnce) {
+    WorkersAtAGate workers(ctx());
+    holdRefreshOfPorts(workers.gate);
     ASSERT_EQ(request(102), 0);
     // The other worker has taken the second request and waits for the class.
     ASSERT_TRUE(eventually(
         [] { return timesLogged(LOG_DEBUG, "ProcessDeviceConfigChange, ENTER(102)...\n") == 2; }));
-    gate.open();
+    workers.gate.open();
     ASSERT_TRUE(workersComeToRest());
 
     EXPECT_EQ(walks().size(), 1u);
     EXPECT_EQ(CapturedSyslog::countContaining(", skip"), 1u);
-    first.stop();
-    second.stop();
+    workers.first.stop();
+    workers.second.stop();
     EXPECT_EQ(ports(), Ids{"P0"});
 }
 
 TEST_F(ReconcileTwoWorkers, DifferentClassesDoNotWaitForEachOther) {
-    Gate gate;
-    holdWalk("CIM_SASSATAPort", gate);
-    Worker first(ctx(), 0);
-    Worker second(ctx(), 1);
-    const GateOpener opener(gate);
-
-    ASSERT_EQ(request(102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    WorkersAtAGate workers(ctx());
+    holdRefreshOfPorts(workers.gate);
     ASSERT_EQ(request(103), 0);
     EXPECT_TRUE(eventually([this] { return countOfLists() == 1; })) << "the battery";
-    gate.open();
+    workers.gate.open();
     EXPECT_TRUE(eventually([this] { return countOfLists() == 2; })) << "and the port";
     ASSERT_TRUE(workersComeToRest());
 }
 
 TEST_F(ReconcileTwoWorkers, ReadersAreNotHeldUpByASlowWalk) {
     Gate gate;
-    holdWalk("CIM_SASSATAPort", gate);
     Worker worker(ctx(), 0);
     const GateOpener opener(gate);
-    ASSERT_EQ(request(102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    holdRefreshOfPorts(gate);
     EXPECT_EQ(held(), "P");
     gate.open();
     ASSERT_TRUE(workersComeToRest());

@@ -26,6 +26,12 @@ protected:
         for (auto field : kUpdateTimes) ctrl->*field = time;
     }
     int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl, action); }
+    /// How many items are in the queue when the ports have been asked for at that time too.
+    unsigned int queuedAfterRequestAt(time_t time) {
+        VirtualClock::set(time);
+        request(102);
+        return queuedItems();
+    }
 
     RaidController_t* ctrl = nullptr;
 };
@@ -96,26 +102,16 @@ TEST_F(RequestRefreshGate, SkipLineShowsBothTimes) {
 
 TEST_F(RequestRefreshGate, DueFromTheIntervalOn) {
     ctrl->PortUpdateTime = kStart;
-    VirtualClock::set(kStart + 19);
-    request(102);
-    EXPECT_EQ(queuedItems(), 0u);
-    VirtualClock::set(kStart + 20);
-    request(102);
-    EXPECT_EQ(queuedItems(), 1u);
-    VirtualClock::set(kStart + 21);
-    request(102);
-    EXPECT_EQ(queuedItems(), 2u);
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 19), 0u);
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 20), 1u);
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 21), 2u);
 }
 
 TEST_F(RequestRefreshGate, AnotherIntervalMovesTheLimit) {
     StateUpdateInterval = 45;
     ctrl->PortUpdateTime = kStart;
-    VirtualClock::set(kStart + 44);
-    request(102);
-    EXPECT_EQ(queuedItems(), 0u);
-    VirtualClock::set(kStart + 45);
-    request(102);
-    EXPECT_EQ(queuedItems(), 1u);
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 44), 0u);
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 45), 1u);
 }
 
 TEST_F(RequestRefreshGate, UpdateTimeInTheFutureIsNotDue) {
