@@ -184,12 +184,7 @@ TEST_F(DiskBuildFailures, SlotWithoutPathHasNoChassis) {
 class DiskBuildWrongElement : public DiskTest, public testing::WithParamInterface<int> {};
 
 TEST_P(DiskBuildWrongElement, IsNeverFollowed) {
-    testbed::FaultRule rule;
-    rule.entry = Entry::EnumerationGetNext;
-    rule.wrongType = true;
-    rule.skip = GetParam();
-    rule.times = 1;
-    faults().add(rule);
+    faults().add(wrongElement(GetParam()));
     const bool mediaOrPool = GetParam() == 0 || GetParam() == 5;
     EXPECT_EQ(buildDisk(), mediaOrPool ? -1 : 0);
     EXPECT_EQ(ctrl->DiskList->Size, mediaOrPool ? 0u : 1u);
@@ -224,12 +219,7 @@ TEST_P(DiskBuildWrongElement, GivesWayToTheNext) {
         {2000, "FW-D1", 4, "C0_32", "P1"},   {blocks, "FW-D2", 4, "C0_32", "P1"},
         {blocks, "FW-D1", 9, "C0_32", "P1"}, {blocks, "FW-D1", 9, "C0_32", "P1"},
         {blocks, "FW-D1", 4, "C0_33", "P1"}, {blocks, "FW-D1", 4, "C0_32", "P2"}};
-    testbed::FaultRule rule;
-    rule.entry = Entry::EnumerationGetNext;
-    rule.wrongType = true;
-    rule.skip = GetParam();
-    rule.times = 1;
-    faults().add(rule);
+    faults().add(wrongElement(GetParam()));
     ASSERT_EQ(buildDisk(), 0);
     const DiskDrive_t* built = disk();
     const auto text = [](const char* field) { return field != nullptr ? field : "absent"; };

@@ -1,4 +1,7 @@
 // Refreshes that fail: logged, the cache as it was, and no second try before the next interval.
+#include <optional>
+#include <string>
+
 #include "reconcile_fixture.h"
 
 namespace plexortest {
@@ -27,36 +30,27 @@ protected:
         process(102);
         EXPECT_EQ(walks().size(), 1u) << "asked again before the next interval";
     }
+    /// A walk that is refused like this leaves one error line, which ends so.
+    void expectLogged(CMPIrc rc, const std::optional<std::string>& message, const char* end) {
+        FaultRule refused = walkOver("CIM_SASSATAPort");
+        refused.rc = rc;
+        refused.message = message;
+        faults().add(refused);
+        EXPECT_EQ(process(102), 0);
+        EXPECT_TRUE(loggedOnce(LOG_ERR, formatted("Associators %s (assocClass: CIM_SystemDevice, "
+                                                  "resultClass: CIM_SASSATAPort) failed, %s",
+                                                  kSystemText, end)));
+        EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR).size(), 1u);
+        expectOldCacheAndStamp();
+    }
 };
 
 TEST_F(ReconcileFailure, ARefusedWalkIsLoggedWithItsMessage) {
-    FaultRule refused = walkOver("CIM_SASSATAPort");
-    refused.rc = CMPI_RC_ERR_FAILED;
-    refused.message = "array is rebooting";
-    faults().add(refused);
-
-    EXPECT_EQ(process(102), 0);
-
-    EXPECT_TRUE(loggedOnce(
-        LOG_ERR, formatted("Associators %s (assocClass: CIM_SystemDevice, resultClass: "
-                           "CIM_SASSATAPort) failed, status: rc 1, msg array is rebooting",
-                           kSystemText)));
-    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR).size(), 1u);
-    expectOldCacheAndStamp();
+    expectLogged(CMPI_RC_ERR_FAILED, "array is rebooting", "status: rc 1, msg array is rebooting");
 }
 
 TEST_F(ReconcileFailure, ARefusedWalkWithoutMessage) {
-    FaultRule refused = walkOver("CIM_SASSATAPort");
-    refused.rc = CMPI_RC_ERR_NOT_SUPPORTED;
-    faults().add(refused);
-
-    EXPECT_EQ(process(102), 0);
-
-    EXPECT_TRUE(
-        loggedOnce(LOG_ERR, formatted("Associators %s (assocClass: CIM_SystemDevice, resultClass: "
-                                      "CIM_SASSATAPort) failed, status: rc 7, msg NULL",
-                                      kSystemText)));
-    expectOldCacheAndStamp();
+    expectLogged(CMPI_RC_ERR_NOT_SUPPORTED, {}, "status: rc 7, msg NULL");
 }
 
 TEST_F(ReconcileFailure, ResultsOfARefusedWalkAreNotUsed) {

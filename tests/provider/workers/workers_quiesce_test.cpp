@@ -17,6 +17,13 @@ protected:
         WorkersCardTest::SetUp();
         startWorkers();
     }
+    /// A quiet stop that has begun before the gate opens; whether it ends well.
+    static bool quietOnceOpened(Gate& gate) {
+        auto quiet = std::async(std::launch::async, quiesceWorkers);
+        EXPECT_TRUE(eventually(StopRequested));
+        gate.open();
+        return quiet.get();
+    }
 };
 
 TEST_F(WorkersQuiesce, IdleWorkersNeedNoWaiting) {
@@ -87,10 +94,7 @@ TEST_F(WorkersQuiesce, WhatIsQueuedBehindARunningItemDoesNotBegin) {
     occupyWorkers(2, gate);
     for (int i = 0; i < 5; i++) tasks_.queue([](CMPIContext*, void*) {});
 
-    auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(eventually(StopRequested));
-    gate.open();
-    ASSERT_TRUE(quiet.get());
+    ASSERT_TRUE(quietOnceOpened(gate));
     EXPECT_EQ(tasks_.ended(), 2);
     EXPECT_EQ(queuedItems(), 5u);
     running_ = false;
@@ -145,10 +149,7 @@ TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
     const GateOpener opener(gate);
     holdRefreshOfPorts(gate);
 
-    auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(eventually(StopRequested));
-    gate.open();
-    ASSERT_TRUE(quiet.get());
+    ASSERT_TRUE(quietOnceOpened(gate));
 
     EXPECT_EQ(associatorQueries(), std::vector<std::string>{"CIM_SystemDevice>CIM_SASSATAPort"});
     EXPECT_TRUE(
@@ -168,10 +169,7 @@ TEST_F(WorkersQuiesce, AnInventoryUnderWayIsGivenUp) {
         return timesLogged(LOG_ERR, "BuildLogicalDeviceInfo: FIFO full, waiting...\n") > 2;
     }));
 
-    auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(eventually(StopRequested));
-    gate.open();
-    ASSERT_TRUE(quiet.get());
+    ASSERT_TRUE(quietOnceOpened(gate));
     EXPECT_EQ(activeThreads(), 0u);
     EXPECT_EQ(ctrl->PortList->Size, 0u);
     EXPECT_EQ(queuedItems(), 20u);
