@@ -11,6 +11,7 @@ namespace {
 using testbed::CallRecord;
 using testbed::Entry;
 using testbed::Instance;
+using testbed::ObjectPath;
 using testbed::PropertyList;
 using testbed::Response;
 
