@@ -108,13 +108,4 @@ void ProviderTest::stopWorkers() {
     PlexorThreads[0] = PlexorThreads[1] = 0;
 }
 
-bool ProviderTest::eventually(const std::function<bool()>& condition) {
-    const auto limit = std::chrono::steady_clock::now() + std::chrono::seconds(5);
-    while (!condition()) {
-        if (std::chrono::steady_clock::now() > limit) return false;
-        std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    }
-    return true;
-}
-
 }  // namespace plexortest

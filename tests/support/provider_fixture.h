@@ -3,7 +3,6 @@
 
 #include <gtest/gtest.h>
 
-#include <functional>
 #include <optional>
 #include <string>
 #include <vector>
@@ -12,6 +11,7 @@
 #include "allocation_faults.h"
 #include "broker.h"
 #include "captured_syslog.h"
+#include "eventually.h"
 #include "records.h"
 #include "repository.h"
 #include "virtual_clock.h"
@@ -47,8 +47,6 @@ protected:
     void startWorkers();
     /// Lets running work end and both workers leave; a test's own clean-up may have come before.
     void stopWorkers();
-    /// Really waits until the condition holds, five seconds at most; whether it does.
-    static bool eventually(const std::function<bool()>& condition);
 
     /// Clones that the test expects to be left behind.
     void expectLeftClones(std::size_t count) { leftClones_ = count; }

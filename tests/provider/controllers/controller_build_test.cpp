@@ -21,14 +21,14 @@ TEST_F(ControllerBuild, ProfileWithoutControllers) {
     const Path profile = addProfile();
     EXPECT_EQ(build(), 0);
     EXPECT_THAT(controllers(), IsEmpty());
-    EXPECT_THAT(askedQueries(), ElementsAre("associators " + profile.text() +
-                                            " CIM_ElementConformsToProfile CIM_PortController"));
+    EXPECT_THAT(brokerCalls(), ElementsAre("associators " + profile.text() +
+                                           " CIM_ElementConformsToProfile/CIM_PortController"));
 }
 
 TEST_F(ControllerBuild, EveryFieldIsFilled) {
-    const VendorController vendor = addFullController(addProfile(), "C0");
-    set(vendor.package, "HealthState", CimValue::uint16(15));
-    set(vendor.system, "OperationalStatus", CimValue::uint16Array({3, 2}));
+    const VendorController card = addFullController(addProfile(), "C0");
+    set(card.package, "HealthState", CimValue::uint16(15));
+    set(card.system, "OperationalStatus", CimValue::uint16Array({3, 2}));
     ASSERT_EQ(build(), 0);
     ASSERT_EQ(controllers().size(), 1u);
     const RaidController_t* ctrl = controllers().front();
@@ -40,8 +40,8 @@ TEST_F(ControllerBuild, EveryFieldIsFilled) {
     EXPECT_STREQ(ctrl->BundleVersion, "PKG-C0");
     EXPECT_EQ(ctrl->HealthState, 15);
     EXPECT_EQ(ctrl->OperationalStatus, 3);
-    EXPECT_EQ(Broker::toPath(ctrl->PortControllerOp), vendor.port);
-    EXPECT_EQ(Broker::toPath(ctrl->ControllerOp), vendor.system);
+    EXPECT_EQ(Broker::toPath(ctrl->PortControllerOp), card.port);
+    EXPECT_EQ(Broker::toPath(ctrl->ControllerOp), card.system);
 }
 
 TEST_F(ControllerBuild, OnlyTheControllersOwnTimeIsSet) {
@@ -116,16 +116,16 @@ TEST_F(ControllerBuild, MutexesAreReadyToUse) {
 
 TEST_F(ControllerBuild, FourQueriesForEachController) {
     const Path profile = addProfile();
-    const VendorController vendor = addFullController(profile, "C0");
+    const VendorController card = addFullController(profile, "C0");
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(
-        askedQueries(),
+        brokerCalls(),
         ElementsAre(
-            "associators " + profile.text() + " CIM_ElementConformsToProfile CIM_PortController",
-            "associators " + vendor.port.text() + " CIM_LogicalIdentity CIM_ComputerSystem",
-            "associators " + vendor.port.text() + " CIM_Realizes CIM_PhysicalPackage",
-            "associators " + vendor.system.text() +
-                " CIM_ElementSoftwareIdentity CIM_SoftwareIdentity"));
+            "associators " + profile.text() + " CIM_ElementConformsToProfile/CIM_PortController",
+            "associators " + card.port.text() + " CIM_LogicalIdentity/CIM_ComputerSystem",
+            "associators " + card.port.text() + " CIM_Realizes/CIM_PhysicalPackage",
+            "associators " + card.system.text() +
+                " CIM_ElementSoftwareIdentity/CIM_SoftwareIdentity"));
     EXPECT_EQ(books().calls().size(), 4u);
 }
 
@@ -137,14 +137,14 @@ TEST_F(ControllerBuild, ControllersOfAllProfilesInTheirOrder) {
     addFullController(first, "C1");
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre("C0", "C1", "C2"));
-    EXPECT_EQ(askedQueries().size(), 2u + 3u * 3u);
+    EXPECT_EQ(brokerCalls().size(), 2u + 3u * 3u);
 }
 
 TEST_F(ControllerBuild, ControllerOfTwoProfilesIsCachedTwice) {
     const Path first = addProfile("profile-1");
     const Path second = addProfile("profile-2");
-    const VendorController vendor = addFullController(first, "C0");
-    vendor_.tie("CIM_ElementConformsToProfile", second, vendor.port);
+    const VendorController card = addFullController(first, "C0");
+    vendor.tie("CIM_ElementConformsToProfile", second, card.port);
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre("C0", "C0"));
     EXPECT_NE(controllers()[0], controllers()[1]);
@@ -165,7 +165,7 @@ TEST_F(ControllerBuild, ProfileWithoutPathIsPassedOver) {
     failOnly(answerNull(Entry::InstanceGetObjectPath, 0));
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre("C1"));
-    EXPECT_EQ(askedQueries().size(), 4u);
+    EXPECT_EQ(brokerCalls().size(), 4u);
 }
 
 TEST_F(ControllerBuild, LaterBuildingsAppend) {
@@ -176,29 +176,29 @@ TEST_F(ControllerBuild, LaterBuildingsAppend) {
 }
 
 TEST_F(ControllerBuild, OnlyTheFirstSystemCounts) {
-    const VendorController vendor = addFullController(addProfile(), "C0");
-    const VendorController other = vendor_.controller("other");
+    const VendorController card = addFullController(addProfile(), "C0");
+    const VendorController other = vendor.controller("other");
     set(other.system, "OperationalStatus", CimValue::uint16Array({6}));
-    vendor_.tie("CIM_LogicalIdentity", vendor.port, other.system);
+    vendor.tie("CIM_LogicalIdentity", card.port, other.system);
     ASSERT_EQ(build(), 0);
     ASSERT_THAT(cached(), ElementsAre("C0"));
-    EXPECT_EQ(Broker::toPath(controllers()[0]->ControllerOp), vendor.system);
+    EXPECT_EQ(Broker::toPath(controllers()[0]->ControllerOp), card.system);
     EXPECT_EQ(controllers()[0]->OperationalStatus, 2);
 }
 
 TEST_F(ControllerBuild, OnlyTheFirstPackageCounts) {
-    const VendorController vendor = addFullController(addProfile(), "C0");
-    const VendorController other = vendor_.controller("other");
+    const VendorController card = addFullController(addProfile(), "C0");
+    const VendorController other = vendor.controller("other");
     set(other.package, "HealthState", CimValue::uint16(30));
-    vendor_.tie("CIM_Realizes", other.package, vendor.port);
+    vendor.tie("CIM_Realizes", other.package, card.port);
     ASSERT_EQ(build(), 0);
     EXPECT_STREQ(controllers()[0]->Model, "Model C0");
     EXPECT_EQ(controllers()[0]->HealthState, 5);
 }
 
 TEST_F(ControllerBuild, WithoutPackageModelIsAbsent) {
-    const VendorController vendor = addFullController(addProfile(), "C0");
-    ASSERT_TRUE(repository.remove(vendor.package));
+    const VendorController card = addFullController(addProfile(), "C0");
+    ASSERT_TRUE(repository.remove(card.package));
     ASSERT_EQ(build(), 0);
     ASSERT_THAT(cached(), ElementsAre("C0"));
     EXPECT_EQ(summary(controllers()[0]), "absent FW-C0 BIOS-C0 DRV-C0 PKG-C0 0 2");
@@ -206,7 +206,7 @@ TEST_F(ControllerBuild, WithoutPackageModelIsAbsent) {
 }
 
 TEST_F(ControllerBuild, WithoutSoftwareVersionsAreAbsent) {
-    vendor_.controller("C0", addProfile());
+    vendor.controller("C0", addProfile());
     ASSERT_EQ(build(), 0);
     ASSERT_THAT(cached(), ElementsAre("C0"));
     EXPECT_EQ(summary(controllers()[0]), "Model C0 absent absent absent absent 5 2");
@@ -222,7 +222,7 @@ TEST_F(ControllerBuild, WithoutDeviceIdItIsNotCached) {
     EXPECT_TRUE(
         logged(LOG_ERR, "NULL DeviceID for PortController: " + nameless.port.text() + "\n"));
     // One for the profile, none for the nameless, three for the other.
-    EXPECT_EQ(askedQueries().size(), 4u);
+    EXPECT_EQ(brokerCalls().size(), 4u);
 }
 
 TEST_F(ControllerBuild, WithoutSystemItIsNotCached) {
@@ -233,7 +233,7 @@ TEST_F(ControllerBuild, WithoutSystemItIsNotCached) {
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre("C1"));
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
-    EXPECT_EQ(askedQueries().size(), 5u);
+    EXPECT_EQ(brokerCalls().size(), 5u);
 }
 
 TEST_F(ControllerBuild, RecordsOwnTheirTextsAndPaths) {

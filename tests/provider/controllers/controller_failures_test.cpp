@@ -43,7 +43,7 @@ TEST_F(ControllerFailures, ProfilesQueryCostsTheProfile) {
         failOnly(rule);
         EXPECT_EQ(build(), 0);
         EXPECT_THAT(cached(), ElementsAre("C1"));
-        EXPECT_EQ(askedQueries().size(), 5u);
+        EXPECT_EQ(brokerCalls().size(), 5u);
         expectOnlyFailure(failure, profile,
                           "CIM_ElementConformsToProfile, resultClass: CIM_PortController");
     }
@@ -58,7 +58,7 @@ TEST_F(ControllerFailures, SystemsQueryCostsTheController) {
         failOnly(rule);
         EXPECT_EQ(build(), 0);
         EXPECT_THAT(cached(), ElementsAre("C1"));
-        EXPECT_EQ(askedQueries().size(), 5u);
+        EXPECT_EQ(brokerCalls().size(), 5u);
         expectOnlyFailure(failure, first.port,
                           "CIM_LogicalIdentity, resultClass: CIM_ComputerSystem");
     }
@@ -75,7 +75,7 @@ TEST_F(ControllerFailures, PackagesQueryCostsModelAndHealth) {
         ASSERT_THAT(cached(), ElementsAre("C0", "C1"));
         EXPECT_EQ(summary(controllers()[0]), "absent FW-C0 BIOS-C0 DRV-C0 PKG-C0 0 2");
         EXPECT_EQ(summary(controllers()[1]), "Model C1 FW-C1 BIOS-C1 DRV-C1 PKG-C1 5 2");
-        EXPECT_EQ(askedQueries().size(), 7u);
+        EXPECT_EQ(brokerCalls().size(), 7u);
         expectOnlyFailure(failure, first.port, "CIM_Realizes, resultClass: CIM_PhysicalPackage");
     }
 }
@@ -91,7 +91,7 @@ TEST_F(ControllerFailures, SoftwareQueryCostsTheVersions) {
         ASSERT_THAT(cached(), ElementsAre("C0", "C1"));
         EXPECT_EQ(summary(controllers()[0]), "Model C0 absent absent absent absent 5 2");
         EXPECT_EQ(summary(controllers()[1]), "Model C1 FW-C1 BIOS-C1 DRV-C1 PKG-C1 5 2");
-        EXPECT_EQ(askedQueries().size(), 7u);
+        EXPECT_EQ(brokerCalls().size(), 7u);
         expectOnlyFailure(failure, first.system,
                           "CIM_ElementSoftwareIdentity, resultClass: CIM_SoftwareIdentity");
     }
@@ -102,7 +102,7 @@ TEST_F(ControllerFailures, EverythingFails) {
     failOnly(refusal(Entry::Associators));
     EXPECT_EQ(build(), 0);
     EXPECT_THAT(controllers(), IsEmpty());
-    EXPECT_EQ(askedQueries().size(), 1u);
+    EXPECT_EQ(brokerCalls().size(), 1u);
 }
 
 // The allocations of one controller: record, DeviceID, Model, four versions, list entry.
@@ -176,7 +176,7 @@ TEST_F(ControllerFailures, ShortageEmptiesTheListOfAllProfiles) {
                                                   reinterpret_cast<void*>(FreeController))),
                   1u);
         // The third profile is not walked any more.
-        for (const std::string& query : askedQueries()) {
+        for (const std::string& query : brokerCalls()) {
             EXPECT_THAT(query, testing::Not(testing::HasSubstr("profile-3")));
         }
     }
@@ -278,10 +278,10 @@ TEST_F(ControllerFailures, NullInstanceInAnEnumeration) {
 
 TEST_F(ControllerFailures, DeviceIdThatIsNoText) {
     addTwo();
-    for (const BadValue& bad : notTexts()) {
-        set(first.port, "DeviceID", bad.value);
+    for (const OddValue& odd : oddTexts()) {
+        give(first.port, "DeviceID", odd);
         EXPECT_EQ(build(), 0);
-        EXPECT_THAT(cached(), ElementsAre("C1")) << bad.name;
+        EXPECT_THAT(cached(), ElementsAre("C1")) << odd.label;
         EXPECT_TRUE(
             logged(LOG_ERR, "NULL DeviceID for PortController: " + first.port.text() + "\n"));
     }
@@ -289,21 +289,21 @@ TEST_F(ControllerFailures, DeviceIdThatIsNoText) {
 
 TEST_F(ControllerFailures, OtherPropertiesMayHoldAnything) {
     addTwo();
-    for (const BadValue& bad : notTexts()) {
-        set(first.package, "Model", bad.value);
+    for (const OddValue& odd : oddTexts()) {
+        give(first.package, "Model", odd);
         EXPECT_EQ(build(), 0);
-        ASSERT_THAT(cached(), ElementsAre("C0", "C1")) << bad.name;
-        EXPECT_EQ(summary(controllers()[0]), "absent FW-C0 BIOS-C0 DRV-C0 PKG-C0 5 2") << bad.name;
+        ASSERT_THAT(cached(), ElementsAre("C0", "C1")) << odd.label;
+        EXPECT_EQ(summary(controllers()[0]), "absent FW-C0 BIOS-C0 DRV-C0 PKG-C0 5 2") << odd.label;
     }
-    for (const BadValue& bad : notNumbers()) {
-        set(first.package, "HealthState", bad.value);
+    for (const OddValue& odd : oddNumbers()) {
+        give(first.package, "HealthState", odd);
         EXPECT_EQ(build(), 0);
-        EXPECT_EQ(controllers()[0]->HealthState, 0) << bad.name;
+        EXPECT_EQ(controllers()[0]->HealthState, 0) << odd.label;
     }
-    for (const BadValue& bad : notNumberArrays()) {
-        set(first.system, "OperationalStatus", bad.value);
+    for (const OddValue& odd : oddArrays()) {
+        give(first.system, "OperationalStatus", odd);
         EXPECT_EQ(build(), 0);
-        EXPECT_EQ(controllers()[0]->OperationalStatus, 0) << bad.name;
+        EXPECT_EQ(controllers()[0]->OperationalStatus, 0) << odd.label;
     }
 }
 
@@ -318,18 +318,18 @@ TEST_F(ControllerFailures, MissingPropertiesAreEmptyFields) {
 
 TEST_F(ControllerFailures, VeryLongTexts) {
     const std::string text(65536, 'x');
-    const VendorController vendor = addFullController(addProfile(), "C0");
-    set(vendor.package, "Model", CimValue::string(text));
-    set(vendor.port, "DeviceID", CimValue::string(text));
+    const VendorController card = addFullController(addProfile(), "C0");
+    set(card.package, "Model", CimValue::string(text));
+    set(card.port, "DeviceID", CimValue::string(text));
     EXPECT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre(text));
     EXPECT_EQ(controllers()[0]->Model, text);
 }
 
 TEST_F(ControllerFailures, EmptyTextsAreTexts) {
-    const VendorController vendor = addFullController(addProfile(), "C0");
-    set(vendor.package, "Model", CimValue::string(""));
-    set(vendor.port, "DeviceID", CimValue::string(""));
+    const VendorController card = addFullController(addProfile(), "C0");
+    set(card.package, "Model", CimValue::string(""));
+    set(card.port, "DeviceID", CimValue::string(""));
     EXPECT_EQ(build(), 0);
     EXPECT_THAT(cached(), ElementsAre(""));
     EXPECT_STREQ(controllers()[0]->Model, "");

@@ -1,26 +1,26 @@
 // Profiles with controllers behind them, and the building of their records.
 #pragma once
 
-#include "inventory_fixture.h"
+#include "vendor_fixture.h"
 
 namespace plexortest {
 
-class ControllerTest : public InventoryTest {
+class ControllerTest : public VendorTest {
 protected:
     /// A registration that the building walks.
     Path addProfile(const std::string& id = "profile-1") {
-        const Path path = vendor_.profile(kProfileName, id);
+        const Path path = vendor.profile(kProfileName, id);
         profiles_.Array[profiles_.Count++] = instanceAt(path);
         return path;
     }
     /// A controller with software of every kind: firmware "FW-<id>", BIOS "BIOS-<id>", driver
     /// "DRV-<id>", bundle "PKG-<id>", in this order.
     VendorController addFullController(const Path& profile, const std::string& id) {
-        const VendorController controller = vendor_.controller(id, profile);
-        vendor_.software(controller.system, 10, "FW-" + id);
-        vendor_.software(controller.system, 11, "BIOS-" + id);
-        vendor_.software(controller.system, 2, "DRV-" + id);
-        vendor_.software(controller.system, 13, "PKG-" + id);
+        const VendorController controller = vendor.controller(id, profile);
+        vendor.software(controller.system, 10, "FW-" + id);
+        vendor.software(controller.system, 11, "BIOS-" + id);
+        vendor.software(controller.system, 2, "DRV-" + id);
+        vendor.software(controller.system, 13, "PKG-" + id);
         return controller;
     }
     static Path softwarePath(const std::string& version) {

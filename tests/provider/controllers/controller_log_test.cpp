@@ -39,21 +39,21 @@ TEST_F(ControllerLog, NoProfile) {
 
 TEST_F(ControllerLog, CompleteController) {
     const Path profile = addProfile();
-    const VendorController vendor = addFullController(profile, "C0");
-    set(vendor.package, "HealthState", CimValue::uint16(20));
+    const VendorController card = addFullController(profile, "C0");
+    set(card.package, "HealthState", CimValue::uint16(20));
     ASSERT_EQ(build(), 0);
-    const std::string port = vendor.port.text();
+    const std::string port = card.port.text();
     EXPECT_THAT(
         inventoryLog(),
         ElementsAre(
-            kBuildEnter, profileQuery(profile), systemQuery(vendor.port),
-            debugLine("PortController: " + port + "\n"), packageQuery(vendor.port),
-            softwareQuery(vendor.system),
+            kBuildEnter, profileQuery(profile), systemQuery(card.port),
+            debugLine("PortController: " + port + "\n"), packageQuery(card.port),
+            softwareQuery(card.system),
             debugLine("BuildControllerInfo: ctrl C0, swClass 10, versionStr FW-C0\n"),
             debugLine("BuildControllerInfo: ctrl C0, swClass 11, versionStr BIOS-C0\n"),
             debugLine("BuildControllerInfo: ctrl C0, swClass 2, versionStr DRV-C0\n"),
             debugLine("BuildControllerInfo: ctrl C0, swClass 13, versionStr PKG-C0\n"),
-            infoLine("\nPortControllerOp: " + port + "\nControllerOp:     " + vendor.system.text() +
+            infoLine("\nPortControllerOp: " + port + "\nControllerOp:     " + card.system.text() +
                      "\n\tDeviceID          - C0\n"
                      "\tModel             - Model C0\n"
                      "\tFirmwareVersion   - FW-C0\n"
@@ -68,8 +68,8 @@ TEST_F(ControllerLog, CompleteController) {
 }
 
 TEST_F(ControllerLog, BareControllerIsStillDumped) {
-    const VendorController vendor = vendor_.controller("C0", addProfile());
-    ASSERT_TRUE(repository.remove(vendor.package));
+    const VendorController card = vendor.controller("C0", addProfile());
+    ASSERT_TRUE(repository.remove(card.package));
     ASSERT_EQ(build(), 0);
     ASSERT_EQ(CapturedSyslog::linesAt(LOG_INFO).size(), 1u);
     const std::string dump = CapturedSyslog::linesAt(LOG_INFO)[0];
@@ -79,20 +79,20 @@ TEST_F(ControllerLog, BareControllerIsStillDumped) {
 
 TEST_F(ControllerLog, ControllerWithoutDeviceId) {
     const Path profile = addProfile();
-    const VendorController vendor = addFullController(profile, "C0");
-    unset(vendor.port, "DeviceID");
+    const VendorController card = addFullController(profile, "C0");
+    unset(card.port, "DeviceID");
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(
         inventoryLog(),
         ElementsAre(kBuildEnter, profileQuery(profile),
-                    errorLine("NULL DeviceID for PortController: " + vendor.port.text() + "\n"),
+                    errorLine("NULL DeviceID for PortController: " + card.port.text() + "\n"),
                     kBuildExit));
 }
 
 TEST_F(ControllerLog, ControllerWithoutDeviceIdAndPath) {
     const Path profile = addProfile();
-    const VendorController vendor = addFullController(profile, "C0");
-    unset(vendor.port, "DeviceID");
+    const VendorController card = addFullController(profile, "C0");
+    unset(card.port, "DeviceID");
     failOnly(answerNull(Entry::Clone));
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(inventoryLog(),
@@ -102,17 +102,17 @@ TEST_F(ControllerLog, ControllerWithoutDeviceIdAndPath) {
 
 TEST_F(ControllerLog, ControllerWithoutSystem) {
     const Path profile = addProfile();
-    const VendorController vendor = addFullController(profile, "C0");
-    ASSERT_TRUE(repository.remove(vendor.system));
+    const VendorController card = addFullController(profile, "C0");
+    ASSERT_TRUE(repository.remove(card.system));
     ASSERT_EQ(build(), 0);
     EXPECT_THAT(inventoryLog(),
-                ElementsAre(kBuildEnter, profileQuery(profile), systemQuery(vendor.port),
-                            debugLine("PortController: " + vendor.port.text() + "\n"), kBuildExit));
+                ElementsAre(kBuildEnter, profileQuery(profile), systemQuery(card.port),
+                            debugLine("PortController: " + card.port.text() + "\n"), kBuildExit));
 }
 
 TEST_F(ControllerLog, VendorsTextsAreNoFormats) {
-    const VendorController vendor = addFullController(addProfile(), "C%s%n");
-    set(vendor.package, "Model", CimValue::string("%d%s%n"));
+    const VendorController card = addFullController(addProfile(), "C%s%n");
+    set(card.package, "Model", CimValue::string("%d%s%n"));
     ASSERT_EQ(build(), 0);
     EXPECT_STREQ(controllers()[0]->DeviceID, "C%s%n");
     EXPECT_TRUE(

@@ -13,14 +13,14 @@ class ControllerUpdate : public ControllerTest {
 protected:
     void SetUp() override {
         ControllerTest::SetUp();
-        vendor = addFullController(addProfile(), "C0");
+        card = addFullController(addProfile(), "C0");
         ASSERT_EQ(build(), 0);
         ctrl = controllers()[0];
         startOver();
     }
     int update() { return CheckAndUpdateControllerInfo(&mi, ctx(), ctrl, nullptr, nullptr); }
 
-    VendorController vendor;
+    VendorController card;
     RaidController_t* ctrl = nullptr;
 };
 
@@ -33,8 +33,8 @@ TEST(ControllerNeedUpdate, IsAlwaysOne) {
 }
 
 TEST_F(ControllerUpdate, MovesTheTimeAlone) {
-    set(vendor.system, "OperationalStatus", testbed::CimValue::uint16Array({6}));
-    set(vendor.package, "Model", testbed::CimValue::string("another"));
+    set(card.system, "OperationalStatus", testbed::CimValue::uint16Array({6}));
+    set(card.package, "Model", testbed::CimValue::string("another"));
     VirtualClock::set(kStart + 77);
     EXPECT_EQ(update(), 0);
     EXPECT_EQ(ctrl->ControllerUpdateTime, kStart + 77);
@@ -49,7 +49,7 @@ TEST_F(ControllerUpdate, MovesTheTimeAlone) {
 
 TEST_F(ControllerUpdate, DeviceAndInstanceAreIgnored) {
     VirtualClock::advance(1);
-    EXPECT_EQ(CheckAndUpdateControllerInfo(nullptr, nullptr, ctrl, ctrl, instanceAt(vendor.system)),
+    EXPECT_EQ(CheckAndUpdateControllerInfo(nullptr, nullptr, ctrl, ctrl, instanceAt(card.system)),
               0);
     EXPECT_EQ(ctrl->ControllerUpdateTime, kStart + 1);
 }

@@ -1,5 +1,5 @@
 // What the search for registrations asks the broker, and what it leaves in the log.
-#include "inventory_fixture.h"
+#include "vendor_fixture.h"
 
 namespace plexortest {
 namespace {
@@ -12,7 +12,7 @@ const LogLine kEntering = debugLine("GetHHRCProfiles: entering...\n");
 const LogLine kQuery =
     debugLine("GetHHRCProfiles, CIM Query - EnumInstances root/interop:CIM_RegisteredProfile");
 
-class DiscoveryLog : public InventoryTest {
+class DiscoveryLog : public VendorTest {
 protected:
     int discover() {
         startOver();
@@ -26,8 +26,8 @@ protected:
 };
 
 TEST_F(DiscoveryLog, AsksOnceForAllRegistrations) {
-    vendor_.profile(kProfileName, "P0");
-    vendor_.profile(kProfileName, "P1");
+    vendor.profile(kProfileName, "P0");
+    vendor.profile(kProfileName, "P1");
     ASSERT_EQ(discover(), 2);
     const auto calls = books().calls();
     ASSERT_EQ(calls.size(), 2u);
@@ -39,8 +39,8 @@ TEST_F(DiscoveryLog, AsksOnceForAllRegistrations) {
 }
 
 TEST_F(DiscoveryLog, OneRegistrationAndAnother) {
-    vendor_.profile(kProfileName, "P1");
-    vendor_.profile("Fan", "F");
+    vendor.profile(kProfileName, "P1");
+    vendor.profile("Fan", "F");
     ASSERT_EQ(discover(), 1);
     EXPECT_THAT(
         inventoryLog(),
@@ -55,7 +55,7 @@ TEST_F(DiscoveryLog, OneRegistrationAndAnother) {
 }
 
 TEST_F(DiscoveryLog, ReadsNameOrganizationVersionInThisOrder) {
-    vendor_.profile(kProfileName, "P1");
+    vendor.profile(kProfileName, "P1");
     books().recordObjectCalls(true);
     ASSERT_EQ(discover(), 1);
     std::vector<std::string> read;
@@ -86,7 +86,7 @@ TEST_F(DiscoveryLog, PathCannotBeMade) {
 }
 
 TEST_F(DiscoveryLog, NoPathInSpiteOfAnOkStatus) {
-    vendor_.profile(kProfileName, "P1");
+    vendor.profile(kProfileName, "P1");
     failOnly(answerNull(Entry::NewObjectPath));
     EXPECT_EQ(discover(), 0);
     EXPECT_THAT(inventoryLog(),
@@ -95,7 +95,7 @@ TEST_F(DiscoveryLog, NoPathInSpiteOfAnOkStatus) {
 }
 
 TEST_F(DiscoveryLog, FailedEnumerationIsNoErrorResult) {
-    vendor_.profile(kProfileName, "P1");
+    vendor.profile(kProfileName, "P1");
     for (const QueryFailure& failure : queryFailures()) {
         SCOPED_TRACE(failure.name);
         auto rule = failure.answer;
@@ -116,7 +116,7 @@ TEST_F(DiscoveryLog, FailedEnumerationIsNoErrorResult) {
 }
 
 TEST_F(DiscoveryLog, TooManyRegistrations) {
-    for (int i = 0; i < 9; i++) vendor_.profile(kProfileName, "P" + std::to_string(i));
+    for (int i = 0; i < 9; i++) vendor.profile(kProfileName, "P" + std::to_string(i));
     EXPECT_EQ(discover(), -5);
     const auto log = inventoryLog();
     ASSERT_EQ(log.size(), 2u + 8u * 2u + 2u);
@@ -125,14 +125,14 @@ TEST_F(DiscoveryLog, TooManyRegistrations) {
 }
 
 TEST_F(DiscoveryLog, RegistrationWithoutPath) {
-    vendor_.profile(kProfileName, "P1");
+    vendor.profile(kProfileName, "P1");
     failOnly(answerNull(Entry::InstanceGetObjectPath));
     EXPECT_EQ(discover(), 1);
     EXPECT_TRUE(logged(LOG_INFO, "Found a HHRC profile: NULL\n"));
 }
 
 TEST_F(DiscoveryLog, AbsentTextsArePrintedAsNull) {
-    const Path bare = vendor_.profile(kProfileName, "bare");
+    const Path bare = vendor.profile(kProfileName, "bare");
     for (const char* name : {"RegisteredName", "RegisteredVersion", "RegisteredOrganization"}) {
         unset(bare, name);
     }
@@ -143,7 +143,7 @@ TEST_F(DiscoveryLog, AbsentTextsArePrintedAsNull) {
 }
 
 TEST_F(DiscoveryLog, VendorsTextsAreNoFormats) {
-    set(vendor_.profile(kProfileName, "P%s"), "RegisteredVersion", CimValue::string("%n%s%d%%"));
+    set(vendor.profile(kProfileName, "P%s"), "RegisteredVersion", CimValue::string("%n%s%d%%"));
     EXPECT_EQ(discover(), 1);
     EXPECT_TRUE(logged(LOG_DEBUG,
                        "CIM_RegisteredProfile: RegisteredName Host Hardware RAID "
@@ -155,7 +155,7 @@ TEST_F(DiscoveryLog, VendorsTextsAreNoFormats) {
 }
 
 TEST_F(DiscoveryLog, MaskedLinesCostNoCallForTheirTexts) {
-    vendor_.profile(kProfileName, "P1");
+    vendor.profile(kProfileName, "P1");
     books().recordObjectCalls(true);
     setlogmask(LOG_UPTO(LOG_ERR));
     EXPECT_EQ(discover(), 1);

@@ -51,8 +51,8 @@ protected:
     }
 
     /// Error lines other than the refusal of a drive without a pool.
-    Lines errors() const {
-        Lines lines = CapturedSyslog::linesAt(LOG_ERR);
+    Texts errors() const {
+        Texts lines = CapturedSyslog::linesAt(LOG_ERR);
         std::erase(lines, "No pool associated with disk " + kDrive + "\n");
         return lines;
     }
@@ -73,36 +73,35 @@ protected:
         EXPECT_STREQ(disk()->Pool, "P1");
         EXPECT_EQ(disk()->NumberOfBlocks, 0x1'0000'0002u);
         EXPECT_THAT(members(pool_), ElementsAre("D1"));
-        EXPECT_EQ(ctrl_->DiskUpdateTime, kStart);
+        EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
     }
 };
 
 TEST_P(DiskBuildQuery, FailingWithAMessage) {
-    failQuery(GetParam().entry, GetParam().assocClass, CMPI_RC_ERR_FAILED, "vendor is busy");
+    faults().add(along(GetParam().assocClass,
+                       refusal(GetParam().entry, CMPI_RC_ERR_FAILED, "vendor is busy")));
     EXPECT_EQ(buildDisk(), GetParam().result);
     EXPECT_THAT(errors(), ElementsAre(failureLine(1, "vendor is busy")));
     expectOutcome();
 }
 
 TEST_P(DiskBuildQuery, FailingWithoutAMessage) {
-    failQuery(GetParam().entry, GetParam().assocClass, CMPI_RC_ERR_NOT_SUPPORTED, {});
+    faults().add(
+        along(GetParam().assocClass, refusal(GetParam().entry, CMPI_RC_ERR_NOT_SUPPORTED, {})));
     EXPECT_EQ(buildDisk(), GetParam().result);
     EXPECT_THAT(errors(), ElementsAre(failureLine(7, "NULL")));
     expectOutcome();
 }
 
 TEST_P(DiskBuildQuery, FailingDespiteAResult) {
-    testbed::FaultRule rule = queryRule(GetParam().entry, GetParam().assocClass);
-    rule.rc = CMPI_RC_ERR_FAILED;
-    rule.keepResult = true;
-    faults().add(rule);
+    faults().add(along(GetParam().assocClass, refusalWithResult(GetParam().entry)));
     EXPECT_EQ(buildDisk(), GetParam().result);
     EXPECT_THAT(errors(), ElementsAre(failureLine(1, "NULL")));
     expectOutcome();
 }
 
 TEST_P(DiskBuildQuery, AnsweringNullWithoutAnError) {
-    answerNull(GetParam().entry, GetParam().assocClass);
+    faults().add(along(GetParam().assocClass, answerNull(GetParam().entry)));
     EXPECT_EQ(buildDisk(), GetParam().result);
     EXPECT_EQ(CapturedSyslog::countContaining(" failed, status: rc"), 0u);
     expectOutcome();
@@ -114,8 +113,8 @@ INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildQuery, testing::ValuesIn(kQueries),
 class DiskBuildFailures : public DiskTest {};
 
 TEST_F(DiskBuildFailures, EveryQueryAtOnceStopsAtTheFirst) {
-    failQuery(Entry::Associators, "", CMPI_RC_ERR_FAILED, "down");
-    failQuery(Entry::AssociatorNames, "", CMPI_RC_ERR_FAILED, "down");
+    faults().add(refusal(Entry::Associators, CMPI_RC_ERR_FAILED, "down"));
+    faults().add(refusal(Entry::AssociatorNames, CMPI_RC_ERR_FAILED, "down"));
     EXPECT_EQ(buildDisk(), -1);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
                 ElementsAre("Associators " + kDrive +
@@ -125,7 +124,8 @@ TEST_F(DiskBuildFailures, EveryQueryAtOnceStopsAtTheFirst) {
 }
 
 TEST_F(DiskBuildFailures, MediaQueryLogsItsFailureBeforeTheDriveGoes) {
-    failQuery(Entry::Associators, "CIM_MediaPresent", CMPI_RC_ERR_FAILED, "down");
+    faults().add(
+        along("CIM_MediaPresent", refusal(Entry::Associators, CMPI_RC_ERR_FAILED, "down")));
     EXPECT_EQ(buildDisk(), -1);
     EXPECT_THAT(logLines(),
                 ElementsAre("DEBUG BuildDiskInfo, ENTER...\n",
@@ -138,7 +138,7 @@ TEST_F(DiskBuildFailures, MediaQueryLogsItsFailureBeforeTheDriveGoes) {
 }
 
 TEST_F(DiskBuildFailures, PathCloneMissingIsToldByName) {
-    failClone(0);
+    faults().add(answerNull(Entry::Clone, 0));
     EXPECT_EQ(buildDisk(), 0);
     ASSERT_NE(disk(), nullptr);
     EXPECT_EQ(disk()->DiskOp, nullptr);
@@ -150,7 +150,7 @@ TEST_F(DiskBuildFailures, PathCloneMissingIsToldByName) {
 }
 
 TEST_F(DiskBuildFailures, ExtentCloneMissingMeansNoPool) {
-    failClone(1);
+    faults().add(answerNull(Entry::Clone, 1));
     EXPECT_EQ(buildDisk(), -1);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
                 ElementsAre("No pool associated with disk " + kDrive + "\n"));
@@ -162,10 +162,8 @@ TEST_F(DiskBuildFailures, ExtentCloneMissingMeansNoPool) {
 }
 
 TEST_F(DiskBuildFailures, ExtentWithoutPathMeansNoPool) {
-    testbed::FaultRule rule;
-    rule.entry = Entry::InstanceGetObjectPath;
+    testbed::FaultRule rule = answerNull(Entry::InstanceGetObjectPath);
     rule.className = "Sample_StorageExtent";
-    rule.nullResult = true;
     faults().add(rule);
     EXPECT_EQ(buildDisk(), -1);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
@@ -174,10 +172,8 @@ TEST_F(DiskBuildFailures, ExtentWithoutPathMeansNoPool) {
 }
 
 TEST_F(DiskBuildFailures, SlotWithoutPathHasNoChassis) {
-    testbed::FaultRule rule;
-    rule.entry = Entry::InstanceGetObjectPath;
+    testbed::FaultRule rule = answerNull(Entry::InstanceGetObjectPath);
     rule.className = "Sample_Slot";
-    rule.nullResult = true;
     faults().add(rule);
     EXPECT_EQ(buildDisk(), 0);
     EXPECT_EQ(disk()->SlotNumber, 4);
@@ -188,15 +184,10 @@ TEST_F(DiskBuildFailures, SlotWithoutPathHasNoChassis) {
 class DiskBuildWrongElement : public DiskTest, public testing::WithParamInterface<int> {};
 
 TEST_P(DiskBuildWrongElement, IsNeverFollowed) {
-    testbed::FaultRule rule;
-    rule.entry = Entry::EnumerationGetNext;
-    rule.wrongType = true;
-    rule.skip = GetParam();
-    rule.times = 1;
-    faults().add(rule);
+    faults().add(wrongElement(GetParam()));
     const bool mediaOrPool = GetParam() == 0 || GetParam() == 5;
     EXPECT_EQ(buildDisk(), mediaOrPool ? -1 : 0);
-    EXPECT_EQ(ctrl_->DiskList->Size, mediaOrPool ? 0u : 1u);
+    EXPECT_EQ(ctrl->DiskList->Size, mediaOrPool ? 0u : 1u);
 }
 
 /// What a drive has from its extent, firmware, slot, chassis and pool.
@@ -216,24 +207,19 @@ void PrintTo(const Origins& origins, std::ostream* out) {
 
 TEST_P(DiskBuildWrongElement, GivesWayToTheNext) {
     // Each look-up finds a second object: those of another drive, an enclosure, a pool.
-    const VendorDrive other = vendor.drive(card_, "D2", poolPath_, chassis_, 9);
+    const VendorDrive other = vendor.drive(card, "D2", poolPath_, chassis_, 9);
     vendor.tie("CIM_MediaPresent", objects_.drive, other.extent);
     vendor.tie("CIM_ElementSoftwareIdentity", other.software, objects_.drive);
     vendor.tie("CIM_Realizes", other.package, objects_.drive);
     vendor.tie("CIM_PackageInConnector", other.slot, objects_.package);
-    vendor.tie("CIM_Container", vendor.chassis(card_, "C0_33"), objects_.slot);
-    vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, "P2"), objects_.extent);
+    vendor.tie("CIM_Container", vendor.chassis(card, "C0_33"), objects_.slot);
+    vendor.tie("CIM_ConcreteComponent", vendor.pool(card, "P2"), objects_.extent);
     const CMPIUint64 blocks = 0x1'0000'0002;
     const Origins expected[] = {
         {2000, "FW-D1", 4, "C0_32", "P1"},   {blocks, "FW-D2", 4, "C0_32", "P1"},
         {blocks, "FW-D1", 9, "C0_32", "P1"}, {blocks, "FW-D1", 9, "C0_32", "P1"},
         {blocks, "FW-D1", 4, "C0_33", "P1"}, {blocks, "FW-D1", 4, "C0_32", "P2"}};
-    testbed::FaultRule rule;
-    rule.entry = Entry::EnumerationGetNext;
-    rule.wrongType = true;
-    rule.skip = GetParam();
-    rule.times = 1;
-    faults().add(rule);
+    faults().add(wrongElement(GetParam()));
     ASSERT_EQ(buildDisk(), 0);
     const DiskDrive_t* built = disk();
     const auto text = [](const char* field) { return field != nullptr ? field : "absent"; };
@@ -256,7 +242,7 @@ TEST_F(DiskBuildFailures, ChassisPathsWithoutATextAsTagGiveNoChassis) {
         ASSERT_EQ(buildDisk(), 0);
         EXPECT_EQ(disk()->Chassis, nullptr);
         EXPECT_EQ(disk()->SlotNumber, 4);
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
     }
 }
 

@@ -11,8 +11,8 @@ using testing::IsEmpty;
 class DiskBuildLock : public DiskTest {
 protected:
     /// The last `count` lines of the log, with the state of the lock.
-    Lines tail(std::size_t count) {
-        Lines lines = logWithLock(names());
+    Texts tail(std::size_t count) {
+        Texts lines = logWithLock(names());
         EXPECT_GE(lines.size(), count);
         if (lines.size() > count)
             lines.erase(lines.begin(), lines.end() - static_cast<std::ptrdiff_t>(count));
@@ -25,7 +25,7 @@ TEST_F(DiskBuildLock, IsFreeAtEveryQueryAndRead) {
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_GT(watchedCalls_, 6);
     EXPECT_EQ(heldCalls_, 0);
-    EXPECT_TRUE(lockIsFree());
+    EXPECT_TRUE(isFree(ctrl->CtrlMutex));
 }
 
 TEST_F(DiskBuildLock, IsHeldFromThePoolsLookUpToTheInsertion) {
@@ -49,7 +49,7 @@ TEST_F(DiskBuildLock, IsHeldFromThePoolsLookUpToTheInsertion) {
 
 TEST_F(DiskBuildLock, IsHeldForAnInsertionWithoutCachedPool) {
     repository.dissociate("Sample_ConcreteComponent", poolPath_, objects_.extent);
-    vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, "unknown"), objects_.extent);
+    vendor.tie("CIM_ConcreteComponent", vendor.pool(card, "unknown"), objects_.extent);
     watchLog();
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_THAT(
@@ -80,18 +80,18 @@ TEST_F(DiskBuildLock, IsHeldForTheWithdrawalAndFreeForTheRelease) {
 TEST_F(DiskBuildLock, IsWaitedForBeforeThePoolIsJoined) {
     whileLockIsTaken(
         [&](const CMPIContext* context) {
-            EXPECT_EQ(BuildDiskInfo(&mi, context, ctrl_, instanceAt(objects_.drive),
+            EXPECT_EQ(BuildDiskInfo(&mi, context, ctrl, instanceAt(objects_.drive),
                                     broker.makePath(objects_.drive)),
                       0);
         },
         [&] { return books().queries().size() == 6; },
         [&] {
-            EXPECT_EQ(ctrl_->DiskList->Size, 0u);
-            EXPECT_EQ(ctrl_->DiskUpdateTime, 0);
+            EXPECT_EQ(ctrl->DiskList->Size, 0u);
+            EXPECT_EQ(ctrl->DiskUpdateTime, 0);
             EXPECT_THAT(members(pool_), IsEmpty());
             EXPECT_EQ(CapturedSyslog::countContaining("FindStoragePoolByID"), 0u);
         });
-    EXPECT_EQ(ctrl_->DiskList->Size, 1u);
+    EXPECT_EQ(ctrl->DiskList->Size, 1u);
     EXPECT_THAT(members(pool_), ElementsAre("D1"));
 }
 

@@ -31,8 +31,8 @@ const DiskAllocation kDiskAllocations[] = {
 class DiskBuildMemory : public DiskTest, public testing::WithParamInterface<DiskAllocation> {
 protected:
     /// Warnings and errors, those with a path in them cut before it.
-    Lines complaints() {
-        Lines found;
+    Texts complaints() {
+        Texts found;
         for (std::string line : logLines(names())) {
             if (line.starts_with("DEBUG") || line.starts_with("INFO")) continue;
             for (const char* suffix : {" for disk ", " with disk "})
@@ -62,7 +62,7 @@ TEST_P(DiskBuildMemory, HasThisOutcome) {
     EXPECT_EQ(disk()->Chassis == nullptr, label == "Chassis");
     EXPECT_STREQ(disk()->Pool, "P1");
     const bool listed = label != "Member" && label != "MemberEntry";
-    EXPECT_EQ(members(pool_), listed ? Lines{"D1"} : Lines{});
+    EXPECT_EQ(members(pool_), listed ? Texts{"D1"} : Texts{});
     EXPECT_EQ(disk()->SlotNumber, 4);
 }
 
@@ -76,7 +76,7 @@ protected:
         if (rc != 0) return expectNothingCached();
         ASSERT_NE(disk(), nullptr);
         EXPECT_THAT(members(pool_), testing::AnyOf(IsEmpty(), ElementsAre("D1")));
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
         EXPECT_THAT(members(pool_), IsEmpty());
     }
 };
@@ -84,7 +84,7 @@ protected:
 TEST_F(DiskBuildOutOfMemory, LeavesAConsistentInventoryAtEveryPoint) {
     const std::size_t allocations = forEachFailingAllocation([&](std::size_t n) {
         SCOPED_TRACE(n);
-        ctrl_->DiskUpdateTime = 0;
+        ctrl->DiskUpdateTime = 0;
         expectConsistent(buildDisk());
         broker.flushThread();
     });
@@ -114,7 +114,7 @@ TEST_F(DiskBuildOutOfMemory, OfTheDeviceIdComplainsTwice) {
 TEST_F(DiskBuildOutOfMemory, OfTheListEntryWithdrawsTheDriveFromItsPool) {
     const auto fault = FailAllocation::nth(9);
     EXPECT_EQ(buildDisk(), -2);
-    Lines lines = logLines(names());
+    Texts lines = logLines(names());
     ASSERT_GE(lines.size(), 8u);
     lines.erase(lines.begin(), lines.end() - 8);
     EXPECT_THAT(lines,
@@ -130,7 +130,7 @@ TEST_F(DiskBuildOutOfMemory, OfTheListEntryWithdrawsTheDriveFromItsPool) {
 
 TEST_F(DiskBuildOutOfMemory, OfTheListEntryWithoutCachedPoolWithdrawsNothing) {
     repository.dissociate("Sample_ConcreteComponent", poolPath_, objects_.extent);
-    vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, "unknown"), objects_.extent);
+    vendor.tie("CIM_ConcreteComponent", vendor.pool(card, "unknown"), objects_.extent);
     const auto fault = FailAllocation::nth(7);
     EXPECT_EQ(buildDisk(), -2);
     EXPECT_EQ(CapturedSyslog::countContaining("failed to add disk"), 1u);
@@ -139,11 +139,11 @@ TEST_F(DiskBuildOutOfMemory, OfTheListEntryWithoutCachedPoolWithdrawsNothing) {
 }
 
 TEST_F(DiskBuildOutOfMemory, OfTheListEntryKeepsTheOtherDrives) {
-    attach(ctrl_, newDisk("D0", "P1"));
+    attach(ctrl, newDisk("D0", "P1"));
     addMember(pool_, "D0");
     const auto fault = FailAllocation::nth(9);
     EXPECT_EQ(buildDisk(), -2);
-    EXPECT_EQ(ctrl_->DiskList->Size, 1u);
+    EXPECT_EQ(ctrl->DiskList->Size, 1u);
     EXPECT_STREQ(disk()->DeviceID, "D0");
     EXPECT_THAT(members(pool_), ElementsAre("D0"));
 }

@@ -18,7 +18,7 @@ protected:
 
     /// Adds a candidate of that InstanceID, behind those added before.
     void candidate(const std::string& id) {
-        vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, id), objects_.extent);
+        vendor.tie("CIM_ConcreteComponent", vendor.pool(card, id), objects_.extent);
     }
     /// Adds a candidate whose path has that InstanceID, or none.
     void oddCandidate(const std::optional<CimValue>& id) {
@@ -28,8 +28,8 @@ protected:
         vendor.tie("CIM_ConcreteComponent", path, objects_.extent);
     }
     /// How the log tells of each candidate's look-up.
-    Lines lookUps() {
-        Lines found;
+    Texts lookUps() {
+        Texts found;
         for (const std::string& line : logLines(names()))
             if (line.find("FindStoragePoolByID") != std::string::npos) found.push_back(line);
         return found;
@@ -37,7 +37,7 @@ protected:
 };
 
 TEST_F(DiskBuildPool, TakesTheFirstCachedCandidate) {
-    StoragePool_t* second = attach(ctrl_, newPool("P2"));
+    StoragePool_t* second = attach(ctrl, newPool("P2"));
     candidate("not cached");
     candidate("P2");
     candidate("P1");
@@ -68,15 +68,15 @@ TEST_F(DiskBuildPool, KeepsTheLastCandidateWhenNoneIsCached) {
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_STREQ(disk()->Pool, "last");
     EXPECT_THAT(members(pool_), IsEmpty());
-    EXPECT_EQ(ctrl_->DiskList->Size, 1u);
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kStart);
+    EXPECT_EQ(ctrl->DiskList->Size, 1u);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
     EXPECT_EQ(CapturedSyslog::countContaining("BuildDiskInfo: found a pool"), 0u);
 }
 
 TEST_F(DiskBuildPool, WithoutCachedPoolInsertsWithoutMembership) {
     candidate("unknown");
     ASSERT_EQ(buildDisk(), 0);
-    Lines lines = logLines(names());
+    Texts lines = logLines(names());
     ASSERT_GE(lines.size(), 5u);
     lines.erase(lines.begin(), lines.end() - 6);
     EXPECT_THAT(lines,
@@ -123,7 +123,7 @@ TEST_F(DiskBuildPool, TurnsAwayADriveWithoutCandidates) {
 
 TEST_F(DiskBuildPool, GoesOnBehindACandidateThatCannotBeCopied) {
     candidate("P1");
-    StoragePool_t* second = attach(ctrl_, newPool("P2"));
+    StoragePool_t* second = attach(ctrl, newPool("P2"));
     candidate("P2");
     const auto fault = FailAllocation::strdupOf("P1");
     ASSERT_EQ(buildDisk(), 0);
@@ -137,9 +137,9 @@ TEST_F(DiskBuildPool, LooksAtThePoolsAsTheyAreAtEachStep) {
     candidate("first");
     candidate("P2");
     StoragePool_t* late = nullptr;
-    whenCalled(
-        testbed::Entry::AssociatorNames, [&] { late = attach(ctrl_, newPool("P2")); },
-        "CIM_ConcreteComponent");
+    faults().add(along("CIM_ConcreteComponent", watch(testbed::Entry::AssociatorNames, [&] {
+                           late = attach(ctrl, newPool("P2"));
+                       })));
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_THAT(members(late), ElementsAre("D1"));
 }

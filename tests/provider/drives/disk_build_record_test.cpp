@@ -13,7 +13,7 @@ class DiskBuildRecord : public DiskTest {};
 TEST_F(DiskBuildRecord, HoldsWhatTheVendorSays) {
     ASSERT_EQ(buildDisk(), 0);
 
-    ASSERT_EQ(ctrl_->DiskList->Size, 1u);
+    ASSERT_EQ(ctrl->DiskList->Size, 1u);
     EXPECT_EQ(testbed::Broker::toPath(disk()->DiskOp), objects_.drive);
     EXPECT_EQ(testbed::Broker::toPath(disk()->ExtentOp), objects_.extent);
     EXPECT_STREQ(disk()->DeviceID, "D1");
@@ -76,7 +76,7 @@ TEST_F(DiskBuildRecord, WithoutSlotHasNoPlace) {
 }
 
 TEST_F(DiskBuildRecord, TakesTheChassisThatIsNotCached) {
-    ASSERT_EQ(ctrl_->ChassisList->Size, 0u);
+    ASSERT_EQ(ctrl->ChassisList->Size, 0u);
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_STREQ(disk()->Chassis, "C0_32");
     EXPECT_EQ(CapturedSyslog::countContaining("FindChassisByTag"), 0u);
@@ -84,12 +84,12 @@ TEST_F(DiskBuildRecord, TakesTheChassisThatIsNotCached) {
 
 TEST_F(DiskBuildRecord, TakesTheFirstOfSeveralObjects) {
     const VendorDrive other =
-        vendor.drive(card_, "D2", poolPath_, vendor.chassis(card_, "C0_33"), 11);
+        vendor.drive(card, "D2", poolPath_, vendor.chassis(card, "C0_33"), 11);
     vendor.tie("CIM_MediaPresent", objects_.drive, other.extent);
     vendor.tie("CIM_ElementSoftwareIdentity", other.software, objects_.drive);
     vendor.tie("CIM_Realizes", other.package, objects_.drive);
     vendor.tie("CIM_PackageInConnector", other.slot, objects_.package);
-    vendor.tie("CIM_Container", vendor.chassis(card_, "C0_34"), objects_.slot);
+    vendor.tie("CIM_Container", vendor.chassis(card, "C0_34"), objects_.slot);
 
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_EQ(testbed::Broker::toPath(disk()->ExtentOp), objects_.extent);
@@ -142,13 +142,13 @@ TEST_F(DiskBuildRecord, ReadsTheExtentsPropertiesInOrder) {
 
 TEST_F(DiskBuildRecord, StampsTheRecordBeforeThePoolIsAskedFor) {
     using testbed::Entry;
-    whenCalled(
-        Entry::AssociatorNames, [] { VirtualClock::advance(3); }, "CIM_Container");
-    whenCalled(
-        Entry::AssociatorNames, [] { VirtualClock::advance(40); }, "CIM_ConcreteComponent");
+    faults().add(
+        along("CIM_Container", watch(Entry::AssociatorNames, [] { VirtualClock::advance(3); })));
+    faults().add(along("CIM_ConcreteComponent",
+                       watch(Entry::AssociatorNames, [] { VirtualClock::advance(40); })));
     ASSERT_EQ(buildDisk(), 0);
     EXPECT_EQ(disk()->LastUpdateTime, kStart + 3);
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kStart + 43);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kStart + 43);
 }
 
 TEST_F(DiskBuildRecord, ReleasesTheRecordsOfATurnedAwayDrive) {

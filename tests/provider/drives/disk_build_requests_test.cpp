@@ -22,9 +22,9 @@ protected:
     void SetUp() override {
         DiskTest::SetUp();
         makeLockFair();
-        volume_ = attach(ctrl_, newVolume("V1", "P1"));
+        volume_ = attach(ctrl, newVolume("V1", "P1"));
         addMember(pool_, "D0");
-        attach(ctrl_, newDisk("D0", "P1"));
+        attach(ctrl, newDisk("D0", "P1"));
         const void* const list = pool_->Drives;
         const std::string joined = formatted(" added to the list %p, ", list);
         CapturedSyslog::onLine([this, joined](const LogLine& line) {
@@ -34,11 +34,11 @@ protected:
 
     /// With priority inheritance the kernel passes the lock on to the waiting thread.
     void makeLockFair() {
-        pthread_mutex_destroy(&ctrl_->CtrlMutex);
+        pthread_mutex_destroy(&ctrl->CtrlMutex);
         pthread_mutexattr_t attributes;
         pthread_mutexattr_init(&attributes);
         ASSERT_EQ(pthread_mutexattr_setprotocol(&attributes, PTHREAD_PRIO_INHERIT), 0);
-        ASSERT_EQ(pthread_mutex_init(&ctrl_->CtrlMutex, &attributes), 0);
+        ASSERT_EQ(pthread_mutex_init(&ctrl->CtrlMutex, &attributes), 0);
         pthread_mutexattr_destroy(&attributes);
     }
 
@@ -73,32 +73,32 @@ protected:
     bool anyMemberWithoutRecord() const {
         const List_Entry_t* entry = pool_->Drives->Head;
         for (; entry != nullptr; entry = entry->Next)
-            if (FindDiskByDeviceID(ctrl_, static_cast<char*>(entry->Data)) == nullptr) return true;
+            if (FindDiskByDeviceID(ctrl, static_cast<char*>(entry->Data)) == nullptr) return true;
         return false;
     }
 
     /// What a request would wait for in vain it does not render here, but counts.
     void request() {
-        pthread_mutex_lock(&ctrl_->CtrlMutex);
+        pthread_mutex_lock(&ctrl->CtrlMutex);
         if (anyMemberWithoutRecord()) {
             orphans_++;
         } else {
             testbed::Broker::CallScope scope(broker);
             const Path path{"root/cimv2", "Tovexa_PlexorStorageVolume", {}};
             CMPIInstance* inst = broker.makeInstance({path, {}});
-            FillVolumeInstance(inst, ctrl_, volume_);
+            FillVolumeInstance(inst, ctrl, volume_);
             const testbed::Instance rendered = testbed::Broker::toInstance(inst);
             const testbed::CimValue* name = rendered.find("ElementName");
             complete_ += name != nullptr && name->text().find("(D0,D1)") != std::string::npos;
         }
-        pthread_mutex_unlock(&ctrl_->CtrlMutex);
+        pthread_mutex_unlock(&ctrl->CtrlMutex);
     }
 
     void buildAndDelete() {
         ASSERT_EQ(buildDisk(), 0);
         while (serving_) sched_yield();
-        void* built = ctrl_->DiskList->Tail->Data;
-        ASSERT_EQ(DeleteDisk(ctrl_, built), 0);
+        void* built = ctrl->DiskList->Tail->Data;
+        ASSERT_EQ(DeleteDisk(ctrl, built), 0);
         broker.flushThread();
         CapturedSyslog::clear();
     }

@@ -13,7 +13,7 @@ class DiskBuildTrace : public DiskTest {};
 
 TEST_F(DiskBuildTrace, AsksSixQueriesInOrder) {
     ASSERT_EQ(buildDisk(), 0);
-    const Lines expected = {
+    const Texts expected = {
         "associators " + kDrive + " CIM_MediaPresent/NULL",
         "associators " + kDrive + " CIM_ElementSoftwareIdentity/CIM_SoftwareIdentity",
         "associatorNames " + kDrive + " CIM_Realizes/CIM_PhysicalPackage",
@@ -38,7 +38,7 @@ TEST_F(DiskBuildTrace, LogsEveryStepInOrder) {
                              "\tOperationalStatus - 5\n"
                              "\tSlot              - 4\n"
                              "\tChassis           - C0_32\n";
-    const Lines expected = {
+    const Texts expected = {
         "DEBUG BuildDiskInfo, ENTER...\n",
         "DEBUG BuildDiskInfo, CIM Query - Associators: " + kDrive +
             " (assocClass: CIM_MediaPresent, resultClass: NULL)",
@@ -70,7 +70,7 @@ TEST_F(DiskBuildTrace, LogsEveryStepInOrder) {
 TEST_F(DiskBuildTrace, DumpSaysNoChassis) {
     repository.remove(chassis_);
     ASSERT_EQ(buildDisk(), 0);
-    const Lines dumps = CapturedSyslog::linesAt(LOG_INFO);
+    const Texts dumps = CapturedSyslog::linesAt(LOG_INFO);
     ASSERT_EQ(dumps.size(), 1u);
     EXPECT_THAT(dumps[0], testing::EndsWith("\tSlot              - 4\n"
                                             "\tChassis           - No Chassis\n"));
@@ -79,7 +79,7 @@ TEST_F(DiskBuildTrace, DumpSaysNoChassis) {
 TEST_F(DiskBuildTrace, DumpShowsZeroSlotWithoutPlace) {
     repository.remove(objects_.package);
     ASSERT_EQ(buildDisk(), 0);
-    const Lines dumps = CapturedSyslog::linesAt(LOG_INFO);
+    const Texts dumps = CapturedSyslog::linesAt(LOG_INFO);
     ASSERT_EQ(dumps.size(), 1u);
     EXPECT_THAT(dumps[0], testing::EndsWith("\tSlot              - 0\n"
                                             "\tChassis           - No Chassis\n"));
@@ -142,7 +142,7 @@ TEST_F(DiskBuildTrace, OfADriveWithoutSlotIsSilentAboutIt) {
 TEST_F(DiskBuildTrace, OfADriveWithoutPoolEndsWithTheRefusal) {
     repository.remove(poolPath_);
     EXPECT_EQ(buildDisk(), -1);
-    Lines lines = logLines();
+    Texts lines = logLines();
     ASSERT_GE(lines.size(), 4u);
     lines.erase(lines.begin(), lines.end() - 4);
     EXPECT_THAT(lines, ElementsAre("DEBUG BuildDiskInfo, CIM Query - AssociatorNames: " + kExtent +
@@ -165,7 +165,7 @@ TEST_P(DiskBuildArguments, AreRefusedWhenNull) {
     const MissingArgument& given = GetParam();
     const CMPIInstance* inst = given.instance ? instanceAt(objects_.drive) : nullptr;
     const CMPIObjectPath* path = given.path ? broker.makePath(objects_.drive) : nullptr;
-    EXPECT_EQ(BuildDiskInfo(&mi, ctx(), given.controller ? ctrl_ : nullptr, inst, path), -1);
+    EXPECT_EQ(BuildDiskInfo(&mi, ctx(), given.controller ? ctrl : nullptr, inst, path), -1);
     EXPECT_THAT(logLines(),
                 ElementsAre("DEBUG BuildDiskInfo, ENTER...\n", "DEBUG BuildDiskInfo, EXIT(-1).\n"));
     EXPECT_THAT(brokerCalls(), IsEmpty());
@@ -179,7 +179,7 @@ INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildArguments,
                          [](const auto& given) { return given.param.name; });
 
 TEST_F(DiskBuildTrace, NeedsNoInterface) {
-    EXPECT_EQ(BuildDiskInfo(nullptr, ctx(), ctrl_, instanceAt(objects_.drive),
+    EXPECT_EQ(BuildDiskInfo(nullptr, ctx(), ctrl, instanceAt(objects_.drive),
                             broker.makePath(objects_.drive)),
               0);
     EXPECT_NE(disk(), nullptr);

@@ -38,11 +38,11 @@ protected:
 TEST_P(DiskBuildValues, CountAsZeroWhenOdd) {
     for (const OddValue& odd : GetParam().isArray ? oddArrays() : oddNumbers()) {
         SCOPED_TRACE(odd.label);
-        give(repository, owner(), GetParam().property, odd);
+        give(owner(), GetParam().property, odd);
         ASSERT_EQ(buildDisk(), 0);
         EXPECT_EQ(GetParam().value(disk()), 0u);
         EXPECT_STREQ(disk()->DeviceID, "D1");
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
     }
 }
 
@@ -62,12 +62,12 @@ TEST_F(DiskBuildOddities, StatusIsTheFirstElement) {
 TEST_F(DiskBuildOddities, AreNullWhenOdd) {
     for (const OddValue& odd : oddTexts()) {
         SCOPED_TRACE(odd.label);
-        give(repository, objects_.drive, "Name", odd);
-        give(repository, objects_.software, "VersionString", odd);
+        give(objects_.drive, "Name", odd);
+        give(objects_.software, "VersionString", odd);
         ASSERT_EQ(buildDisk(), 0);
         EXPECT_EQ(disk()->Name, nullptr);
         EXPECT_EQ(disk()->FwVersion, nullptr);
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
     }
 }
 
@@ -83,11 +83,11 @@ TEST_F(DiskBuildOddities, MayBeEmptyOrVeryLong) {
 TEST_F(DiskBuildOddities, OddSlotNumbersCountAsZero) {
     for (const OddValue& odd : oddNumbers()) {
         SCOPED_TRACE(odd.label);
-        give(repository, objects_.slot, "Number", odd);
+        give(objects_.slot, "Number", odd);
         ASSERT_EQ(buildDisk(), 0);
         EXPECT_EQ(disk()->SlotNumber, 0);
         EXPECT_STREQ(disk()->Chassis, "C0_32");
-        ASSERT_EQ(DeleteDisk(ctrl_, disk()), 0);
+        ASSERT_EQ(DeleteDisk(ctrl, disk()), 0);
     }
 }
 

@@ -24,28 +24,28 @@ protected:
     void SetUp() override {
         using testbed::CimValue;
         DeviceTest::SetUp();
-        chassis_ = vendor.chassis(card_, "C0_32");
-        poolPath_ = vendor.pool(card_, "P1");
-        objects_ = vendor.drive(card_, "D1", poolPath_, chassis_, 4);
+        chassis_ = vendor.chassis(card, "C0_32");
+        poolPath_ = vendor.pool(card, "P1");
+        objects_ = vendor.drive(card, "D1", poolPath_, chassis_, 4);
         repository.setProperty(objects_.drive, "EnabledState", CimValue::uint16(3));
         repository.setProperty(objects_.drive, "OperationalStatus", CimValue::uint16Array({5, 2}));
         const Path& extent = objects_.extent;
         repository.setProperty(extent, "NumberOfBlocks", CimValue::uint64(0x1'0000'0002));
         repository.setProperty(extent, "ConsumableBlocks", CimValue::uint64(0xFFFF'FFFF'FFFF'FFFF));
         repository.setProperty(extent, "ExtentStatus", CimValue::uint16Array({16, 2}));
-        pool_ = attach(ctrl_, newPool("P1"));
+        pool_ = attach(ctrl, newPool("P1"));
     }
 
     int buildDisk() { return build(BuildDiskInfo, objects_.drive); }
     int updateDisk(CMPIInstance* fresh) { return update(CheckAndUpdateDiskInfo, disk(), fresh); }
     /// With the drive's instance as it is now.
     int updateDisk() { return updateDisk(instanceAt(objects_.drive)); }
-    DiskDrive_t* disk() const { return firstOf<DiskDrive_t>(ctrl_->DiskList); }
+    DiskDrive_t* disk() const { return firstOf<DiskDrive_t>(ctrl->DiskList); }
 
     /// Names for the addresses in the log.
     AddressNames names() const {
-        AddressNames known = {{ctrl_->DiskList, "disks"},
-                              {ctrl_->PoolList, "pools"},
+        AddressNames known = {{ctrl->DiskList, "disks"},
+                              {ctrl->PoolList, "pools"},
                               {pool_, "pool"},
                               {pool_->Drives, "members"}};
         if (disk() != nullptr) known.emplace_back(disk(), "disk");
@@ -55,10 +55,10 @@ protected:
 
     /// The drive was turned away and nothing of it is left.
     void expectNothingCached() {
-        EXPECT_EQ(ctrl_->DiskList->Size, 0u);
-        EXPECT_EQ(ctrl_->DiskList->Head, nullptr);
+        EXPECT_EQ(ctrl->DiskList->Size, 0u);
+        EXPECT_EQ(ctrl->DiskList->Head, nullptr);
         EXPECT_THAT(members(pool_), testing::IsEmpty());
-        EXPECT_EQ(ctrl_->DiskUpdateTime, 0);
+        EXPECT_EQ(ctrl->DiskUpdateTime, 0);
         EXPECT_EQ(books().liveClones(), 0u);
     }
 

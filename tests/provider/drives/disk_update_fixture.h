@@ -7,13 +7,10 @@ namespace plexortest {
 
 class DiskUpdateTest : public DiskTest {
 protected:
-    static constexpr time_t kLater = kStart + 30;
-
     void SetUp() override {
         DiskTest::SetUp();
         ASSERT_EQ(buildDisk(), 0);
-        VirtualClock::set(kLater);
-        forget();
+        goOnLater();
     }
 
     void setStatus(std::uint16_t operational, std::uint16_t extent) {
@@ -29,7 +26,7 @@ protected:
         EXPECT_EQ(disk()->ExtentStatus, 16);
         EXPECT_STREQ(disk()->Pool, "P1");
         EXPECT_THAT(members(pool_), testing::ElementsAre("D1"));
-        EXPECT_EQ(ctrl_->DiskUpdateTime, kLater);
+        EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
         EXPECT_EQ(disk()->LastUpdateTime, kStart);
     }
 

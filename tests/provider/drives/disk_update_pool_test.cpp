@@ -14,7 +14,7 @@ protected:
     /// The vendor's drive is in that pool only.
     void moveTo(const std::string& id) {
         leavePool();
-        vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, id), objects_.extent);
+        vendor.tie("CIM_ConcreteComponent", vendor.pool(card, id), objects_.extent);
     }
     void leavePool() {
         repository.dissociate("Sample_ConcreteComponent", poolPath_, objects_.extent);
@@ -22,18 +22,18 @@ protected:
 };
 
 TEST_F(DiskUpdatePool, MovesTheDriveWithItsMembership) {
-    StoragePool_t* second = attach(ctrl_, newPool("P2"));
+    StoragePool_t* second = attach(ctrl, newPool("P2"));
     addMember(pool_, "D0");
     moveTo("P2");
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_STREQ(disk()->Pool, "P2");
     EXPECT_THAT(members(pool_), ElementsAre("D0"));
     EXPECT_THAT(members(second), ElementsAre("D1"));
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kLater);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
 }
 
 TEST_F(DiskUpdatePool, LogsTheMove) {
-    StoragePool_t* second = attach(ctrl_, newPool("P2"));
+    StoragePool_t* second = attach(ctrl, newPool("P2"));
     AddressNames known = names();
     known.emplace_back(second, "second");
     known.emplace_back(second->Drives, "members of second");
@@ -59,7 +59,7 @@ TEST_F(DiskUpdatePool, LogsTheMove) {
 }
 
 TEST_F(DiskUpdatePool, HoldsTheLockForTheMoveAndNotForTheQuery) {
-    attach(ctrl_, newPool("P2"));
+    attach(ctrl, newPool("P2"));
     moveTo("P2");
     watchLock();
     watchLog();
@@ -83,7 +83,7 @@ TEST_F(DiskUpdatePool, MovesToAPoolThatIsNotCached) {
 TEST_F(DiskUpdatePool, JoinsAPoolThatIsCachedLater) {
     moveTo("late");
     ASSERT_EQ(updateDisk(), 0);
-    StoragePool_t* late = attach(ctrl_, newPool("late"));
+    StoragePool_t* late = attach(ctrl, newPool("late"));
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_THAT(members(late), ElementsAre("D1"));
     ASSERT_EQ(updateDisk(), 0);
@@ -91,8 +91,8 @@ TEST_F(DiskUpdatePool, JoinsAPoolThatIsCachedLater) {
 }
 
 TEST_F(DiskUpdatePool, MovesFromAPoolThatIsCachedNoLonger) {
-    ASSERT_EQ(DeletePool(ctrl_, pool_), 0);
-    pool_ = attach(ctrl_, newPool("P2"));
+    ASSERT_EQ(DeletePool(ctrl, pool_), 0);
+    pool_ = attach(ctrl, newPool("P2"));
     moveTo("P2");
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_STREQ(disk()->Pool, "P2");
@@ -100,18 +100,18 @@ TEST_F(DiskUpdatePool, MovesFromAPoolThatIsCachedNoLonger) {
 }
 
 TEST_F(DiskUpdatePool, RejoinsAPoolThatWasBuiltAnew) {
-    ASSERT_EQ(DeletePool(ctrl_, pool_), 0);
-    pool_ = attach(ctrl_, newPool("P1"));
+    ASSERT_EQ(DeletePool(ctrl, pool_), 0);
+    pool_ = attach(ctrl, newPool("P1"));
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_THAT(members(pool_), ElementsAre("D1"));
     EXPECT_EQ(CapturedSyslog::countContaining("pool changed"), 0u);
 }
 
 TEST_F(DiskUpdatePool, LooksAtTheFirstCandidateOnly) {
-    StoragePool_t* second = attach(ctrl_, newPool("P2"));
+    StoragePool_t* second = attach(ctrl, newPool("P2"));
     leavePool();
-    vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, "unknown"), objects_.extent);
-    vendor.tie("CIM_ConcreteComponent", vendor.pool(card_, "P2"), objects_.extent);
+    vendor.tie("CIM_ConcreteComponent", vendor.pool(card, "unknown"), objects_.extent);
+    vendor.tie("CIM_ConcreteComponent", vendor.pool(card, "P2"), objects_.extent);
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_STREQ(disk()->Pool, "unknown");
     EXPECT_THAT(members(second), IsEmpty());
@@ -139,7 +139,8 @@ TEST_F(DiskUpdatePool, ToldOfNoneRejoinsNothing) {
 }
 
 TEST_F(DiskUpdatePool, KeepsThePoolWhenTheQueryFails) {
-    failQuery(Entry::AssociatorNames, "CIM_ConcreteComponent", CMPI_RC_ERR_FAILED, "busy");
+    faults().add(along("CIM_ConcreteComponent",
+                       refusal(Entry::AssociatorNames, CMPI_RC_ERR_FAILED, "busy")));
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
                 ElementsAre("AssociatorNames " + kExtent +
@@ -149,7 +150,7 @@ TEST_F(DiskUpdatePool, KeepsThePoolWhenTheQueryFails) {
 }
 
 TEST_F(DiskUpdatePool, KeepsThePoolWhenTheQueryAnswersNull) {
-    answerNull(Entry::AssociatorNames, "CIM_ConcreteComponent");
+    faults().add(along("CIM_ConcreteComponent", answerNull(Entry::AssociatorNames)));
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
     expectUnchanged();
@@ -166,13 +167,13 @@ TEST_F(DiskUpdatePool, SurvivesACandidateWithoutIdentifier) {
         repository.put({path, {}});
         vendor.tie("CIM_ConcreteComponent", path, objects_.extent);
         ASSERT_EQ(updateDisk(), 0);
-        EXPECT_EQ(ctrl_->DiskUpdateTime, kLater);
+        EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
         repository.dissociate("Sample_ConcreteComponent", path, objects_.extent);
     }
 }
 
 TEST_F(DiskUpdatePool, LosesAPoolWhoseIdentifierCannotBeCopied) {
-    attach(ctrl_, newPool("P2"));
+    attach(ctrl, newPool("P2"));
     moveTo("P2");
     {
         const auto fault = FailAllocation::strdupOf("P2");
@@ -182,7 +183,7 @@ TEST_F(DiskUpdatePool, LosesAPoolWhoseIdentifierCannotBeCopied) {
                 ElementsAre("strdup() failed to duplicate string P2\n"));
     EXPECT_EQ(disk()->Pool, nullptr);
     EXPECT_THAT(members(pool_), IsEmpty());
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kLater);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
 
     CapturedSyslog::clear();
     ASSERT_EQ(updateDisk(), 0);
@@ -192,8 +193,8 @@ TEST_F(DiskUpdatePool, LosesAPoolWhoseIdentifierCannotBeCopied) {
 }
 
 TEST_F(DiskUpdatePool, SurvivesEveryFailingAllocation) {
-    StoragePool_t* second = attach(ctrl_, newPool("P2"));
-    const Path secondPath = vendor.pool(card_, "P2");
+    StoragePool_t* second = attach(ctrl, newPool("P2"));
+    const Path secondPath = vendor.pool(card, "P2");
     const std::size_t allocations = forEachFailingAllocation([&](std::size_t n) {
         SCOPED_TRACE(n);
         const bool forth = disk()->Pool == nullptr || std::string(disk()->Pool) == "P1";
@@ -212,35 +213,25 @@ TEST_F(DiskUpdatePool, SurvivesEveryFailingAllocation) {
 TEST_F(DiskUpdatePool, WaitsForTheLockBeforeItChangesAnything) {
     setStatus(2, 2);
     CMPIInstance* fresh = instanceAt(objects_.drive);
-    whileLockIsTaken(
-        [&](const CMPIContext* context) {
-            EXPECT_EQ(CheckAndUpdateDiskInfo(&mi, context, ctrl_, disk(), fresh), 0);
-        },
-        [&] { return books().queries().size() == 1; },
-        [&] {
-            EXPECT_EQ(disk()->OperationalStatus, 5);
-            EXPECT_EQ(disk()->ExtentStatus, 16);
-            EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
-            EXPECT_EQ(ctrl_->DiskUpdateTime, kStart);
-        });
+    updateWhileLockIsTaken(CheckAndUpdateDiskInfo, disk(), fresh, 1, [&] {
+        EXPECT_EQ(disk()->OperationalStatus, 5);
+        EXPECT_EQ(disk()->ExtentStatus, 16);
+        EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
+        EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
+    });
     EXPECT_EQ(disk()->OperationalStatus, 2);
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kLater);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
 }
 
 TEST_F(DiskUpdatePool, WaitsForTheLockToRejoinAndToStamp) {
     RemoveDiskFromPool(pool_, "D1");
     CMPIInstance* fresh = instanceAt(objects_.drive);
-    whileLockIsTaken(
-        [&](const CMPIContext* context) {
-            EXPECT_EQ(CheckAndUpdateDiskInfo(&mi, context, ctrl_, disk(), fresh), 0);
-        },
-        [&] { return books().queries().size() == 2; },
-        [&] {
-            EXPECT_THAT(members(pool_), IsEmpty());
-            EXPECT_EQ(ctrl_->DiskUpdateTime, kStart);
-        });
+    updateWhileLockIsTaken(CheckAndUpdateDiskInfo, disk(), fresh, 2, [&] {
+        EXPECT_THAT(members(pool_), IsEmpty());
+        EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
+    });
     EXPECT_THAT(members(pool_), ElementsAre("D1"));
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kLater);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
 }
 
 }  // namespace

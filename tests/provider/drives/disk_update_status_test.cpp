@@ -130,7 +130,7 @@ TEST_F(DiskUpdateStatus, ChangesNothingWhenTheExtentIsGone) {
 
 TEST_F(DiskUpdateStatus, ChangesNothingWhenTheExtentIsNullWithoutAnError) {
     setStatus(2, 2);
-    answerNull(Entry::GetInstance, "");
+    faults().add(answerNull(Entry::GetInstance));
     ASSERT_EQ(updateDisk(), 0);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
     EXPECT_EQ(books().queries().size(), 2u);
@@ -203,7 +203,7 @@ TEST_F(DiskUpdateFetch, FailingWithoutMessageSaysNull) {
 
 TEST_F(DiskUpdateFetch, AnsweredNullEndsTheUpdateWithAStamp) {
     setStatus(2, 2);
-    answerNull(Entry::GetInstance, "");
+    faults().add(answerNull(Entry::GetInstance));
     ASSERT_EQ(updateDisk(nullptr), 0);
     EXPECT_THAT(logLines(), ElementsAre("DEBUG CheckAndUpdateDiskInfo: ENTER. disk - Disk D1\n",
                                         kGetDrive, "DEBUG CheckAndUpdateDiskInfo, exit\n"));
@@ -223,10 +223,10 @@ TEST_F(DiskUpdateFetch, OfADriveWithoutExtentReadsNothingFurther) {
 }
 
 TEST_F(DiskUpdateFetch, StampsAtTheEnd) {
-    whenCalled(Entry::GetInstance, [] { VirtualClock::advance(2); });
-    whenCalled(Entry::AssociatorNames, [] { VirtualClock::advance(50); });
+    faults().add(watch(Entry::GetInstance, [] { VirtualClock::advance(2); }));
+    faults().add(watch(Entry::AssociatorNames, [] { VirtualClock::advance(50); }));
     ASSERT_EQ(updateDisk(nullptr), 0);
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kLater + 2 + 2 + 50);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kLater + 2 + 2 + 50);
 }
 
 TEST_F(DiskUpdateFetch, OfANamelessDriveIsTraced) {

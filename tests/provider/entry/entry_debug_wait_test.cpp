@@ -119,7 +119,7 @@ TEST_F(EntryDebugWaitTest, LaterCallsWaitToo) {
 TEST_F(EntryDebugWaitTest, TheMarkIsReadAnewOnEachPass) {
     setenv("WAIT_PROC", "1", 1);
     std::thread debugger([] {
-        plexortest::soon([] { return CapturedSyslog::count(waitingLine()) >= 2; });
+        plexortest::eventually([] { return CapturedSyslog::count(waitingLine()) >= 2; });
         pokeMark(0);
     });
     callFactory();

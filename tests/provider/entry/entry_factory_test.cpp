@@ -219,7 +219,7 @@ protected:
         EntryFactoryTest::SetUp();
         made = callFactory();
         ASSERT_TRUE(inventoryTaken());
-        ASSERT_TRUE(plexortest::soon([] {
+        ASSERT_TRUE(plexortest::eventually([] {
             const WorkersHeld held;
             return ActiveThreads == 0;
         }));

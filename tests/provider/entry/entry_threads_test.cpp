@@ -81,8 +81,8 @@ protected:
     }
     /// All six are inside the factory, and none has come out of it.
     static void expectAllWait(const std::atomic<int>& returned) {
-        EXPECT_TRUE(
-            plexortest::soon([] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 6; }));
+        EXPECT_TRUE(plexortest::eventually(
+            [] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 6; }));
         // Long enough for one that does not wait to get out.
         std::this_thread::sleep_for(std::chrono::milliseconds(20));
         EXPECT_EQ(returned, 0);
@@ -121,8 +121,8 @@ TEST_F(EntryThreadsTest, WhenTheFirstFailsTheNextTriesAndTheOthersWaitForIt) {
     crew.add([&] { failed = callFactoryHere(); });
     ASSERT_TRUE(gate.awaitArrivals(1));
     callForAllClasses(crew, outcomes, returned);
-    EXPECT_TRUE(
-        plexortest::soon([] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 7; }));
+    EXPECT_TRUE(plexortest::eventually(
+        [] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 7; }));
     EXPECT_EQ(returned, 0);
 
     gate.open();

@@ -138,7 +138,7 @@ TEST_F(DevicesFailures, ClassNameWithoutText) {
 }
 
 TEST_F(DevicesFailures, PropertiesAreTheBuildersBusiness) {
-    const Path bare = vendor_.port(vendor, "bare");
+    const Path bare = vendor.port(card, "bare");
     for (const char* name : {"DeviceID", "ElementName", "PortType"}) unset(bare, name);
     EXPECT_EQ(walk(), 0);
     EXPECT_THAT(taken(), ElementsAre("2 0", "2 1", "2 2", "2 bare"));

@@ -2,27 +2,25 @@
 #pragma once
 
 #include "PlexorProviderCfg.h"
-#include "inventory_fixture.h"
+#include "device_fixture.h"
 
 namespace plexortest {
 
 /// Said whenever the walk, at its end, waits for the queue to empty.
 inline const LogLine kWaiting = debugLine("BuildLogicalDeviceInfo: FIFO not empty, waiting...\n");
 
-class DevicesTest : public InventoryTest {
+class DevicesTest : public DeviceTest {
 protected:
     void SetUp() override {
-        InventoryTest::SetUp();
-        vendor = vendor_.controller("C0");
-        ctrl = attach(newController("C0"));
-        ctrl->ControllerOp = clonedPath(vendor.system);
+        DeviceTest::SetUp();
+        ctrl->ControllerOp = clonedPath(card.system);
         setActiveThreads(1);
         takeInEachSleep(1000);
         startOver();
     }
     void TearDown() override {
         releaseTaken();
-        InventoryTest::TearDown();
+        DeviceTest::TearDown();
     }
 
     static void setActiveThreads(unsigned int count) {
@@ -74,7 +72,7 @@ protected:
     Texts addPorts(int count) {
         Texts expected;
         for (int i = 0; i < count; i++) {
-            vendor_.port(vendor, std::to_string(i));
+            vendor.port(card, std::to_string(i));
             expected.push_back("2 " + std::to_string(i));
         }
         return expected;
@@ -86,7 +84,7 @@ protected:
         device.path.key("DeviceID", testbed::CimValue::string(id));
         device.set("DeviceID", testbed::CimValue::string(id));
         repository.put(device);
-        vendor_.tie("CIM_SystemDevice", vendor.system, device.path);
+        vendor.tie("CIM_SystemDevice", card.system, device.path);
         return device.path;
     }
     void defineClass(const std::string& name, const std::string& superclass) {
@@ -96,8 +94,6 @@ protected:
         repository.defineClass("root/sample", definition);
     }
 
-    VendorController vendor;
-    RaidController_t* ctrl = nullptr;
     std::vector<Thread_Args_t*> taken_;
 };
 

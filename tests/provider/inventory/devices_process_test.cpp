@@ -86,7 +86,7 @@ INSTANTIATE_TEST_SUITE_P(Every, DevicesProcessKind, testing::ValuesIn(kProcessed
 
 TEST_P(DevicesProcessKind, IsBuiltIntoItsList) {
     const ProcessedKind& kind = GetParam();
-    const Path path = kind.add(vendor_, vendor);
+    const Path path = kind.add(vendor, card);
     VirtualClock::set(kStart + 4);
     process(itemFor(kind.code, path));
     EXPECT_EQ(records(), 1u);
@@ -102,7 +102,7 @@ TEST_P(DevicesProcessKind, IsBuiltIntoItsList) {
 
 TEST_P(DevicesProcessKind, IsBuiltUnderItsClassMutexAlone) {
     const ProcessedKind& kind = GetParam();
-    const Path path = kind.add(vendor_, vendor);
+    const Path path = kind.add(vendor, card);
     Thread_Args_t* item = itemFor(kind.code, path);
     int watched = 0;
     auto rule = watch(Entry::InstanceGetProperty, [&] {
@@ -121,7 +121,7 @@ TEST_P(DevicesProcessKind, IsBuiltUnderItsClassMutexAlone) {
 
 TEST_P(DevicesProcessKind, WaitsForItsClassMutex) {
     const ProcessedKind& kind = GetParam();
-    Thread_Args_t* item = itemFor(kind.code, kind.add(vendor_, vendor));
+    Thread_Args_t* item = itemFor(kind.code, kind.add(vendor, card));
     CMPIContext* prepared = ::Broker->bft->prepareAttachThread(::Broker, ctx());
     pthread_mutex_lock(&(ctrl->*kind.classMutex));
     std::atomic<bool> begun = false;
@@ -141,7 +141,7 @@ TEST_P(DevicesProcessKind, WaitsForItsClassMutex) {
 
 TEST_P(DevicesProcessKind, ThePathGoesBeforeTheInstance) {
     const ProcessedKind& kind = GetParam();
-    Thread_Args_t* item = itemFor(kind.code, kind.add(vendor_, vendor));
+    Thread_Args_t* item = itemFor(kind.code, kind.add(vendor, card));
     const auto* path = reinterpret_cast<const void*>(item->Arg3);
     const auto* instance = reinterpret_cast<const void*>(item->Arg4);
     std::vector<std::pair<bool, bool>> alive;  // path and instance, at each release
@@ -155,7 +155,7 @@ TEST_P(DevicesProcessKind, ThePathGoesBeforeTheInstance) {
 
 TEST_P(DevicesProcessKind, RejectedDeviceLeavesNothing) {
     const ProcessedKind& kind = GetParam();
-    const Path path = kind.add(vendor_, vendor);
+    const Path path = kind.add(vendor, card);
     unset(path, "DeviceID");
     process(itemFor(kind.code, path));
     EXPECT_EQ(records(), 0u);
@@ -166,7 +166,7 @@ TEST_P(DevicesProcessKind, RejectedDeviceLeavesNothing) {
 
 TEST_P(DevicesProcessKind, NoMemoryForItsRecord) {
     const ProcessedKind& kind = GetParam();
-    Thread_Args_t* item = itemFor(kind.code, kind.add(vendor_, vendor));
+    Thread_Args_t* item = itemFor(kind.code, kind.add(vendor, card));
     const auto fault = FailAllocation::from(1);
     process(item);
     EXPECT_EQ(records(), 0u);
@@ -182,7 +182,7 @@ INSTANTIATE_TEST_SUITE_P(Unknown, DevicesProcessCode, testing::Values(0, 5, 6, 9
                          });
 
 TEST_P(DevicesProcessCode, IsLoggedAndTheClonesAreReleased) {
-    const Path path = vendor_.battery(vendor, "b1");
+    const Path path = vendor.battery(card, "b1");
     process(itemFor(static_cast<uintptr_t>(GetParam()), path));
     EXPECT_EQ(inventoryLog(),
               std::vector<LogLine>{errorLine(
@@ -207,7 +207,7 @@ TEST_F(DevicesProcess, ItemWithoutClones) {
 
 TEST_F(DevicesProcess, ClonesOutliveTheBuilder) {
     // The record's path is a clone of its own: the item's may go.
-    process(itemFor(4, vendor_.battery(vendor, "b1")));
+    process(itemFor(4, vendor.battery(card, "b1")));
     broker.flushThread();
     const auto* battery = recordsOf<Battery_t>(ctrl->BatteryList).at(0);
     EXPECT_STREQ(battery->DeviceID, "b1");

@@ -89,15 +89,15 @@ TEST_F(DevicesWorkers, AWorkerThatIsAloneBuildsThemAll) {
 }
 
 TEST_F(DevicesWorkers, DevicesOfAllKinds) {
-    const Path pool = vendor_.pool(vendor, "P1");
+    const Path pool = vendor.pool(card, "P1");
     attach(ctrl, newPool("P1"));
     for (int i = 0; i < 8; i++) {
         const std::string id = std::to_string(i);
-        vendor_.drive(vendor, "d" + id, pool);
-        vendor_.volume(vendor, "v" + id, pool);
-        vendor_.port(vendor, "p" + id);
-        vendor_.fan(vendor, "f" + id);
-        vendor_.battery(vendor, "b" + id);
+        vendor.drive(card, "d" + id, pool);
+        vendor.volume(card, "v" + id, pool);
+        vendor.port(card, "p" + id);
+        vendor.fan(card, "f" + id);
+        vendor.battery(card, "b" + id);
     }
     startWalk();
     ASSERT_TRUE(walkEnds());

@@ -19,8 +19,8 @@ class InventoryAsync : public RefreshTest {
 protected:
     RaidController_t* cachedController(const char* id) {
         RaidController_t* ctrl = attach(newController(id));
-        array_ = vendor_.controller(id);
-        ctrl->ControllerOp = clonedPath(array_.system);
+        card = vendor.controller(id);
+        ctrl->ControllerOp = clonedPath(card.system);
         clearLog();
         return ctrl;
     }
@@ -43,8 +43,7 @@ protected:
         }
     }
 
-    VendorObjects vendor_{repository};
-    VendorController array_;  // the latest
+    VendorController card;  // the latest
 };
 
 TEST_F(InventoryAsync, OneItemIsQueued) {
@@ -100,7 +99,7 @@ TEST_F(InventoryAsync, FullQueueMeansNoInventoryAndNoRefreshEver) {
     EXPECT_EQ(WakeUpCounter::signals(), 0);
     {
         Worker worker(ctx());
-        ASSERT_TRUE(comesTrue([] { return queuedItems() == 0; }));
+        ASSERT_TRUE(eventually([] { return queuedItems() == 0; }));
         ASSERT_TRUE(workersComeToRest());
     }
     EXPECT_EQ(ThreadActivityDone, 0u);
@@ -177,7 +176,7 @@ TEST_F(InventoryAsync, TheTimesAreWrittenWithoutTheControllersMutex) {
     pthread_mutex_lock(&ctrl->CtrlMutex);
     {
         Worker worker(ctx());
-        EXPECT_TRUE(comesTrue([] { return threadActivityDone() == 1; }));
+        EXPECT_TRUE(eventually([] { return threadActivityDone() == 1; }));
         pthread_mutex_unlock(&ctrl->CtrlMutex);
         EXPECT_TRUE(workersComeToRest());
     }
@@ -224,7 +223,7 @@ TEST_F(InventoryAsync, RefusedWalksAreDoneAsWell) {
 
 TEST_F(InventoryAsync, RequestsAreSkippedWhileItRunsAndServedAfterIt) {
     RaidController_t* const ctrl = cachedController("C0");
-    for (int i = 0; i < 30; i++) vendor_.port(array_, "P" + std::to_string(i));
+    for (int i = 0; i < 30; i++) vendor.port(card, "P" + std::to_string(i));
     Gate gate;
     FaultRule hold;
     hold.entry = Entry::Associators;
@@ -245,7 +244,7 @@ TEST_F(InventoryAsync, RequestsAreSkippedWhileItRunsAndServedAfterIt) {
     EXPECT_EQ(queuedItems(), 0u);
 
     gate.open();
-    ASSERT_TRUE(comesTrue([] { return threadActivityDone() == 1; }));
+    ASSERT_TRUE(eventually([] { return threadActivityDone() == 1; }));
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(ctrl->PortList->Size, 30u);
     VirtualClock::advance(20);

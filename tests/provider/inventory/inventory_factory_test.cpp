@@ -34,7 +34,7 @@ protected:
         ASSERT_NE(served_, nullptr);
     }
     void awaitInventory() {
-        ASSERT_TRUE(comesTrue([] { return threadActivityDone() == 1; }));
+        ASSERT_TRUE(eventually([] { return threadActivityDone() == 1; }));
         ASSERT_TRUE(workersComeToRest());
     }
     /// For slow sanitizers: as long as it takes, within reason.
@@ -169,7 +169,7 @@ TEST_F(InventoryFactory, ReadersOfAllClassesWhileItIsBuiltAndChanges) {
         const auto volume = vendor_.addVolume(1, "C1N" + std::to_string(step));
         const int before = rounds;
         VirtualClock::advance(20);
-        comesTrue([&] { return rounds >= before + 4; });
+        eventually([&] { return rounds >= before + 4; });
         repository.setProperty(volume, "ElementName", CimValue::string("renamed"));
         if (step % 2 == 0) {
             repository.remove(path);

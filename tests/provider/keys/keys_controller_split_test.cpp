@@ -58,19 +58,9 @@ TEST_F(KeysControllerSplitTest, MissingKeyIsLoggedWithKeyAndPath) {
 }
 
 TEST_F(KeysControllerSplitTest, EveryStatusButOkIsAMissingKey) {
-    ScriptedPath path;
-    static char text[] = "tvxControllerC0";
-    path.answer.type = CMPI_chars;
-    path.answer.value.chars = text;
-    for (const CMPIrc rc : {CMPI_RC_ERR_FAILED, CMPI_RC_ERR_INVALID_HANDLE, CMPI_RC_ERR_NOT_FOUND,
-                            CMPI_RC_ERR_NO_SUCH_PROPERTY}) {
-        path.answerStatus = rc;
-        CapturedSyslog::clear();
-        EXPECT_EQ(splitController(path.handle()), refusedKey(-3)) << rc;
-        EXPECT_EQ(CapturedSyslog::lines(),
-                  (Lines{{LOG_ERR, "Name key not found in object path the path\n"}}))
-            << rc;
-    }
+    expectMissingWhateverTheStatus(
+        "tvxControllerC0", [](const CMPIObjectPath* path) { return splitController(path); },
+        "Name key not found in object path the path\n");
 }
 
 TEST_F(KeysControllerSplitTest, PathWithoutTextIsLoggedAsNull) {

@@ -119,19 +119,9 @@ TEST_F(KeysDeviceSplitTest, MissingKeyIsLoggedWithThePath) {
 }
 
 TEST_F(KeysDeviceSplitTest, EveryStatusButOkIsAMissingKey) {
-    ScriptedPath path;
-    static char text[] = "tvxPort12_5";
-    path.answer.type = CMPI_chars;
-    path.answer.value.chars = text;
-    for (const CMPIrc rc :
-         {CMPI_RC_ERR_FAILED, CMPI_RC_ERR_INVALID_HANDLE, CMPI_RC_ERR_NO_SUCH_PROPERTY}) {
-        path.answerStatus = rc;
-        CapturedSyslog::clear();
-        EXPECT_EQ(splitDevice(path.handle(), "tvxPort"), refusedKey(-3)) << rc;
-        EXPECT_EQ(CapturedSyslog::lines(),
-                  (Lines{{LOG_ERR, "DeviceID key not found in object path the path\n"}}))
-            << rc;
-    }
+    expectMissingWhateverTheStatus(
+        "tvxPort12_5", [](const CMPIObjectPath* path) { return splitDevice(path, "tvxPort"); },
+        "DeviceID key not found in object path the path\n");
 }
 
 TEST_F(KeysDeviceSplitTest, WithoutMemoryNothingIsStoredAndNothingLeaks) {

@@ -3,6 +3,7 @@
 
 #include <stdlib.h>
 
+#include <functional>
 #include <optional>
 #include <ostream>
 #include <string>
@@ -55,6 +56,24 @@ protected:
         key.controller = taken(controller, untouched);
         key.device = taken(device, untouched);
         return key;
+    }
+
+    /// Splits a path whose key comes with each status that is not OK: it counts as missing, and the
+    /// line says so.
+    static void expectMissingWhateverTheStatus(
+        const std::string& key, const std::function<SplitKey(const CMPIObjectPath* path)>& split,
+        const std::string& line) {
+        std::string text = key;
+        ScriptedPath path;
+        path.answer.type = CMPI_chars;
+        path.answer.value.chars = text.data();
+        for (const CMPIrc rc : {CMPI_RC_ERR_FAILED, CMPI_RC_ERR_INVALID_HANDLE,
+                                CMPI_RC_ERR_NOT_FOUND, CMPI_RC_ERR_NO_SUCH_PROPERTY}) {
+            path.answerStatus = rc;
+            CapturedSyslog::clear();
+            EXPECT_EQ(split(path.handle()), (SplitKey{-3, std::nullopt, std::nullopt})) << rc;
+            EXPECT_EQ(CapturedSyslog::lines(), (std::vector<LogLine>{{LOG_ERR, line}})) << rc;
+        }
     }
 
     /// A client's path with one key.

@@ -83,11 +83,7 @@ TEST_F(MeetingCallsTest, TerminatingItWaitsThreeSeconds) {
 TEST_F(MeetingCallsTest, ACleanupEndsTheInitialisationAfterItsVendorCall) {
     Gate gate;
     const GateOpener opener(gate);
-    testbed::FaultRule slow = waitingAt(Entry::EnumerateInstances, gate);
-    slow.className = "CIM_RegisteredProfile";
-    faults().add(slow);
-    auto factory = callFactoryElsewhere();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto factory = factoryHeldAtTheProfiles(gate);
     auto cleanup = cleanupThatWaits(true);
     gate.open();
     EXPECT_NE(factory.get(), nullptr);
@@ -103,14 +99,10 @@ TEST_F(MeetingCallsTest, ACleanupEndsTheInitialisationAfterItsVendorCall) {
 TEST_F(MeetingCallsTest, AFactoryCallThatWaitsForItsTurnLeavesWithTheCleanup) {
     Gate gate;
     const GateOpener opener(gate);
-    testbed::FaultRule slow = waitingAt(Entry::EnumerateInstances, gate);
-    slow.className = "CIM_RegisteredProfile";
-    faults().add(slow);
-    auto first = callFactoryElsewhere();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto first = factoryHeldAtTheProfiles(gate);
     auto second = callFactoryElsewhere();
-    ASSERT_TRUE(
-        plexortest::soon([] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 2; }));
+    ASSERT_TRUE(plexortest::eventually(
+        [] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 2; }));
     EXPECT_TRUE(stillWaits(second));
     auto cleanup = cleanUpElsewhere(true);
     EXPECT_NE(second.get(), nullptr) << "before the first has its answer";
@@ -132,7 +124,7 @@ TEST_F(MeetingCallsTest, AFactoryCallDuringACleanupBuildsAnewAfterIt) {
     EXPECT_EQ(initialized(), 1);
     EXPECT_EQ(controllers(), 1u);
     CapturedSyslog::onLine(nullptr);
-    EXPECT_TRUE(plexortest::soon([this] { return requestDrives().get() == 1; }));
+    EXPECT_TRUE(plexortest::eventually([this] { return requestDrives().get() == 1; }));
 }
 
 TEST_F(MeetingCallsTest, AnInitialisationThatHangsIsGivenUp) {
@@ -158,7 +150,7 @@ TEST_F(MeetingCallsTest, AnInitialisationThatHangsIsGivenUp) {
     EXPECT_EQ(controllers(), 1u);
     EXPECT_EQ(initialized(), 1);
     EXPECT_EQ(CapturedSyslog::countContaining("thread 0 created"), 1u);
-    EXPECT_TRUE(plexortest::soon([this] { return requestDrives().get() == 1; }));
+    EXPECT_TRUE(plexortest::eventually([this] { return requestDrives().get() == 1; }));
 }
 
 TEST_F(MeetingCallsTest, NineCleanupsAtOnceAreOne) {

@@ -51,7 +51,7 @@ protected:
 TEST_F(CancelledTest, AnIdleWorkerLeavesTheOtherAtWork) {
     load();
     cancelWorker(0);
-    EXPECT_TRUE(plexortest::soon([this] {
+    EXPECT_TRUE(plexortest::eventually([this] {
         plexortest::VirtualClock::advance(100);
         return requestDrives().get() == 1 &&
                CapturedSyslog::countContaining("ProcessDeviceConfigChange, EXIT") > 1;
@@ -74,10 +74,10 @@ TEST_F(CancelledTest, ABusyWorkerIsCountedNoLonger) {
     };
     PutItem(&__FIFO, item);
     pthread_cond_signal(&PlexorThreadCond);
-    ASSERT_TRUE(plexortest::soon([] { return busy != 0; }));
+    ASSERT_TRUE(plexortest::eventually([] { return busy != 0; }));
     EXPECT_EQ(active(), 1u);
     EXPECT_EQ(pthread_cancel(busy), 0);
-    EXPECT_TRUE(plexortest::soon([] { return active() == 0; }));
+    EXPECT_TRUE(plexortest::eventually([] { return active() == 0; }));
     EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
     EXPECT_EQ(CapturedSyslog::countContaining("still busy"), 0u);
 }

@@ -47,6 +47,15 @@ protected:
             return PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr);
         });
     }
+    /// A factory call that has come as far as asking for the profiles, and waits there.
+    std::future<CMPIInstanceMI*> factoryHeldAtTheProfiles(Gate& gate) {
+        testbed::FaultRule slow = waitingAt(testbed::Entry::EnumerateInstances, gate);
+        slow.className = "CIM_RegisteredProfile";
+        faults().add(slow);
+        auto factory = callFactoryElsewhere();
+        EXPECT_TRUE(gate.awaitArrivals(1));
+        return factory;
+    }
     /// A request for the drives that has come as far as its first call of `entry`, and waits there.
     std::future<std::size_t> requestHeldAt(testbed::Entry entry, Gate& gate) {
         faults().add(waitingAt(entry, gate));
@@ -63,7 +72,7 @@ protected:
         return cleanup;
     }
     static bool cleanupsInside(std::size_t count) {
-        return soon([count] {
+        return eventually([count] {
             return CapturedSyslog::count("PlexorProviderCleanup: ENTER...\n") == count;
         });
     }

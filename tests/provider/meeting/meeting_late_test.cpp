@@ -38,7 +38,7 @@ protected:
         EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
     }
     static bool servesOneDrive(LateCallsTest& test) {
-        return plexortest::soon([&test] { return test.requestDrives().get() == 1; });
+        return plexortest::eventually([&test] { return test.requestDrives().get() == 1; });
     }
     static std::size_t givenUpLines() { return CapturedSyslog::countContaining("still busy"); }
 };
@@ -74,8 +74,8 @@ TEST_F(LateCallsTest, ACleanupOvertakesAFactoryCallThatWaitsForARequest) {
     Gate gate;
     auto request = requestHeldAt(Entry::ResultReturnDone, gate);
     auto overtaken = callFactoryElsewhere();
-    ASSERT_TRUE(
-        plexortest::soon([] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 1; }));
+    ASSERT_TRUE(plexortest::eventually(
+        [] { return CapturedSyslog::count("PlexorInit: ENTER...\n") == 1; }));
     EXPECT_TRUE(stillWaits(overtaken));
     cleanUpSoon();
     EXPECT_NE(overtaken.get(), nullptr);
@@ -121,7 +121,7 @@ TEST_F(LateCallsTest, ARequestThatWasGivenUpQueuesNothingForTheNextLife) {
     const GivenUpInventory givenUp;
     cleanUpSoon();
     callFactory();
-    ASSERT_TRUE(plexortest::soon(
+    ASSERT_TRUE(plexortest::eventually(
         [] { return CapturedSyslog::count("DoBuildDeviceInfoAsync done.") == 1; }));
     settleWorkers();
     gate.open();

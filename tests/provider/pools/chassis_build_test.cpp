@@ -12,14 +12,14 @@ class ChassisBuild : public EnclosureTest {
 protected:
     void SetUp() override {
         EnclosureTest::SetUp();
-        path = vendor_.chassis(vendor, "C0_E");
+        path = vendor.chassis(card, "C0_E");
     }
 
     Path path;
 };
 
 TEST_F(ChassisBuild, EveryFieldIsFilled) {
-    const Path second = vendor_.chassis(vendor, "C0_Enclosure2");
+    const Path second = vendor.chassis(card, "C0_Enclosure2");
     set(second, "OperationalStatus", CimValue::uint16Array({5, 2}));
     ASSERT_EQ(buildChassis(second), 0);
     ASSERT_EQ(chassis().size(), 1u);
@@ -47,7 +47,7 @@ TEST_P(ChassisInternalTag, IsTheTagWithoutTheControllersPrefix) {
     const Tags& tags = GetParam();
     free(ctrl->DeviceID);
     ctrl->DeviceID = ownedCopy(tags.deviceId);
-    ASSERT_EQ(buildChassis(vendor_.chassis(vendor, tags.tag)), 0);
+    ASSERT_EQ(buildChassis(vendor.chassis(card, tags.tag)), 0);
     ASSERT_EQ(chassis().size(), 1u);
     EXPECT_STREQ(chassis()[0]->Tag, tags.tag);
     EXPECT_EQ(textOf(chassis()[0]->InternalTag), tags.internalTag);
@@ -85,7 +85,7 @@ TEST_F(ChassisBuild, Log) {
 }
 
 TEST_F(ChassisBuild, AbsentInternalTagIsPrintedAsNull) {
-    const Path foreign = vendor_.chassis(vendor, "X1_E");
+    const Path foreign = vendor.chassis(card, "X1_E");
     ASSERT_EQ(buildChassis(foreign), 0);
     EXPECT_TRUE(logged(LOG_DEBUG, "\nChassisOp: " + foreign.text() +
                                       "\n\tTag               - X1_E"

@@ -25,7 +25,7 @@ protected:
     }
     std::vector<std::string> lines_;
 };
-TYPED_TEST_SUITE(EnclosureBuild, EnclosureKinds, EnclosureKindNames);
+TYPED_TEST_SUITE(EnclosureBuild, EnclosureKinds, KindNames);
 
 TYPED_TEST(EnclosureBuild, StampsItsOwnTimesOnly) {
     VirtualClock::set(this->kStart + 9);

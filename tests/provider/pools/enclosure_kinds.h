@@ -89,13 +89,6 @@ struct ChassisKind {
 
 using EnclosureKinds = testing::Types<PoolKind, ChassisKind>;
 
-struct EnclosureKindNames {
-    template <class Kind>
-    static std::string GetName(int) {
-        return Kind::name;
-    }
-};
-
 /// A vendor's device of the kind with the kind's id, and what becomes of it.
 template <class Kind>
 class EnclosureKindTest : public EnclosureTest {
@@ -107,7 +100,7 @@ protected:
         path_ = make(Kind::id);
     }
 
-    Path make(const std::string& id) { return Kind::make(vendor_, vendor, id); }
+    Path make(const std::string& id) { return Kind::make(vendor, card, id); }
     int build(const Path& path) {
         return Kind::build(&mi, ctx(), ctrl, instanceAt(path), broker.makePath(path));
     }

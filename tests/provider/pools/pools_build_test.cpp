@@ -12,7 +12,7 @@ class PoolsBuild : public EnclosureTest {
 protected:
     void SetUp() override {
         EnclosureTest::SetUp();
-        path = vendor_.pool(vendor, "P1", true);
+        path = vendor.pool(card, "P1", true);
     }
     static LogLine dump(const Path& path, const std::string& id, const std::string& rest) {
         return infoLine("\nPoolOp: " + path.text() + "\n\tInstanceID            - " + id + rest);
@@ -70,16 +70,16 @@ TEST_F(PoolsBuild, OtherPropertiesMayBeMissing) {
 }
 
 TEST_F(PoolsBuild, OtherPropertiesMayHoldAnything) {
-    for (const BadValue& bad : notNumbers()) {
+    for (const OddValue& odd : oddNumbers()) {
         for (const char* property : {"TotalManagedSpace", "RemainingManagedSpace", "Primordial"}) {
-            set(path, property, bad.value);
+            give(path, property, odd);
         }
-        EXPECT_EQ(buildPool(path), 0) << bad.name;
+        EXPECT_EQ(buildPool(path), 0) << odd.label;
         ASSERT_EQ(pools().size(), 1u);
-        EXPECT_EQ(pools()[0]->TotalManagedSpace, 0u) << bad.name;
-        EXPECT_EQ(pools()[0]->RemainingManagedSpace, 0u) << bad.name;
-        EXPECT_EQ(pools()[0]->Primordial, 0) << bad.name;
-        EXPECT_EQ(pools()[0]->OperationalStatus, 2) << bad.name;
+        EXPECT_EQ(pools()[0]->TotalManagedSpace, 0u) << odd.label;
+        EXPECT_EQ(pools()[0]->RemainingManagedSpace, 0u) << odd.label;
+        EXPECT_EQ(pools()[0]->Primordial, 0) << odd.label;
+        EXPECT_EQ(pools()[0]->OperationalStatus, 2) << odd.label;
         forgetAll();
     }
 }

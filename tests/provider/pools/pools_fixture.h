@@ -1,17 +1,15 @@
 // One cached controller "C0" whose pools and enclosures are to be gathered.
 #pragma once
 
-#include "inventory_fixture.h"
+#include "device_fixture.h"
 
 namespace plexortest {
 
-class EnclosureTest : public InventoryTest {
+class EnclosureTest : public DeviceTest {
 protected:
     void SetUp() override {
-        InventoryTest::SetUp();
-        vendor = vendor_.controller("C0");
-        ctrl = attach(newController("C0"));
-        ctrl->ControllerOp = clonedPath(vendor.system);
+        DeviceTest::SetUp();
+        ctrl->ControllerOp = clonedPath(card.system);
         startOver();
     }
     std::vector<StoragePool_t*> pools() const { return recordsOf<StoragePool_t>(ctrl->PoolList); }
@@ -29,9 +27,6 @@ protected:
         return BuildSingleChassisInfo(&mi, ctx(), ctrl, instanceAt(path), broker.makePath(path));
     }
     static std::string textOf(const char* text) { return text != nullptr ? text : "absent"; }
-
-    VendorController vendor;
-    RaidController_t* ctrl = nullptr;
 };
 
 /// Holds a mutex on a thread of its own until a line that contains `part` has been logged, then
@@ -42,11 +37,7 @@ public:
         : thread_([this, &mutex, part = std::move(part), check = std::move(check)] {
               pthread_mutex_lock(&mutex);
               held_ = true;
-              const auto limit = std::chrono::steady_clock::now() + std::chrono::seconds(5);
-              while (CapturedSyslog::countContaining(part) == 0 &&
-                     std::chrono::steady_clock::now() < limit) {
-                  std::this_thread::sleep_for(std::chrono::milliseconds(1));
-              }
+              eventually([&part] { return CapturedSyslog::countContaining(part) != 0; });
               // Time enough for somebody who does not wait for the mutex.
               std::this_thread::sleep_for(std::chrono::milliseconds(5));
               check();

@@ -15,8 +15,8 @@ class PoolsUpdate : public EnclosureTest {
 protected:
     void SetUp() override {
         EnclosureTest::SetUp();
-        poolPath = vendor_.pool(vendor, "P1");
-        chassisPath = vendor_.chassis(vendor, "C0_E");
+        poolPath = vendor.pool(card, "P1");
+        chassisPath = vendor.chassis(card, "C0_E");
         ASSERT_EQ(buildPool(poolPath), 0);
         ASSERT_EQ(buildChassis(chassisPath), 0);
         VirtualClock::set(kStart + 60);

@@ -22,7 +22,7 @@ protected:
         repository.setProperty(path_, "OperationalStatus", CimValue::uint16Array({11, 2}));
     }
     AddressNames names() const {
-        AddressNames known = {{ctrl_->BatteryList, "batteries"}};
+        AddressNames known = {{ctrl->BatteryList, "batteries"}};
         if (record() != nullptr) known.emplace_back(record(), "battery");
         return known;
     }
@@ -72,10 +72,10 @@ TEST_F(BatteryBuild, LogsEveryStepAndHoldsTheLockForTheInsertionOnly) {
 TEST_F(BatteryBuild, OddStatusCountsAsZero) {
     for (const OddValue& odd : oddNumbers()) {
         SCOPED_TRACE(odd.label);
-        give(repository, path_, "BatteryStatus", odd);
+        give(path_, "BatteryStatus", odd);
         ASSERT_EQ(buildIt(), 0);
         EXPECT_EQ(record()->BatteryStatus, 0);
-        ASSERT_EQ(DeleteBattery(ctrl_, record()), 0);
+        ASSERT_EQ(DeleteBattery(ctrl, record()), 0);
     }
 }
 
@@ -86,7 +86,7 @@ TEST_F(BatteryBuild, WithoutMemoryForTheListEntryIsReleased) {
         EXPECT_EQ(buildIt(), -2);
         EXPECT_EQ(fault.failures(), 1u);
     }
-    Lines lines = logWithLock(names());
+    Texts lines = logWithLock(names());
     lines.erase(lines.begin(), lines.begin() + 2);
     EXPECT_THAT(
         lines,
@@ -99,23 +99,20 @@ TEST_F(BatteryBuild, WithoutMemoryForTheListEntryIsReleased) {
 TEST_F(BatteryBuild, SurvivesEveryFailingAllocation) {
     const std::size_t allocations = forEachFailingAllocation([&](std::size_t n) {
         SCOPED_TRACE(n);
-        ctrl_->BatteryUpdateTime = 0;
+        ctrl->BatteryUpdateTime = 0;
         const int rc = buildIt();
         if (rc != 0) return expectNothingCached();
-        EXPECT_EQ(DeleteBattery(ctrl_, record()), 0);
+        EXPECT_EQ(DeleteBattery(ctrl, record()), 0);
     });
     EXPECT_EQ(allocations, 3u) << "record, identifier, list entry";
 }
 
 class BatteryUpdate : public BatteryTest {
 protected:
-    static constexpr time_t kLater = kStart + 30;
-
     void SetUp() override {
         BatteryTest::SetUp();
         ASSERT_EQ(buildIt(), 0);
-        VirtualClock::set(kLater);
-        forget();
+        goOnLater();
     }
     int updateBattery(CMPIInstance* fresh) {
         return update(CheckAndUpdateBatteryInfo, record(), fresh);
@@ -129,7 +126,7 @@ protected:
         EXPECT_EQ(record()->OperationalStatus, operational);
         EXPECT_EQ(record()->BatteryStatus, battery);
         EXPECT_EQ(record()->LastUpdateTime, kStart);
-        EXPECT_EQ(ctrl_->BatteryUpdateTime, kLater);
+        EXPECT_EQ(ctrl->BatteryUpdateTime, kLater);
     }
 
     const std::string kEnter = "DEBUG CheckAndUpdateBatteryInfo: ENTER. battery - X1\n";
@@ -224,7 +221,7 @@ TEST_F(BatteryUpdate, FailingWithoutMessageSaysNull) {
 
 TEST_F(BatteryUpdate, OfABatteryAnsweredNullOnlyStamps) {
     setStatus(6, 4);
-    answerNull(Entry::GetInstance, "");
+    faults().add(answerNull(Entry::GetInstance));
     ASSERT_EQ(updateBattery(nullptr), 0);
     EXPECT_THAT(logLines(), ElementsAre(kEnter, kGet, kExit));
     expectStatus(11, 7);
@@ -237,23 +234,18 @@ TEST_F(BatteryUpdate, OfARemovedBatteryOnlyStamps) {
 }
 
 TEST_F(BatteryUpdate, StampsAfterReading) {
-    whenCalled(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); });
+    faults().add(watch(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); }));
     ASSERT_EQ(updateBattery(), 0);
-    EXPECT_EQ(ctrl_->BatteryUpdateTime, kLater + 2);
+    EXPECT_EQ(ctrl->BatteryUpdateTime, kLater + 2);
 }
 
 TEST_F(BatteryUpdate, WaitsForTheLockBeforeItChangesAnything) {
     setStatus(6, 4);
-    whileLockIsTaken(
-        [&](const CMPIContext* context) {
-            EXPECT_EQ(CheckAndUpdateBatteryInfo(&mi, context, ctrl_, record(), nullptr), 0);
-        },
-        [&] { return books().queries().size() == 1; },
-        [&] {
-            EXPECT_EQ(record()->OperationalStatus, 11);
-            EXPECT_EQ(record()->BatteryStatus, 7);
-            EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
-        });
+    updateWhileLockIsTaken(CheckAndUpdateBatteryInfo, record(), nullptr, 1, [&] {
+        EXPECT_EQ(record()->OperationalStatus, 11);
+        EXPECT_EQ(record()->BatteryStatus, 7);
+        EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
+    });
     expectStatus(6, 4);
 }
 

@@ -17,8 +17,8 @@ TYPED_TEST_SUITE(DeviceBuild, DeviceKinds, KindNames);
 TYPED_TEST(DeviceBuild, WithoutDeviceIdIsTurnedAway) {
     for (const OddValue& odd : oddTexts()) {
         SCOPED_TRACE(odd.label);
-        give(this->repository, this->path_, "DeviceID", odd);
-        this->forget();
+        this->give(this->path_, "DeviceID", odd);
+        this->startOver();
         EXPECT_EQ(this->buildIt(), -1);
         EXPECT_THAT(logLines(),
                     ElementsAre(TypeParam::enter, TypeParam::nullDeviceId + this->pathText() + "\n",
@@ -30,7 +30,7 @@ TYPED_TEST(DeviceBuild, WithoutDeviceIdIsTurnedAway) {
 
 TYPED_TEST(DeviceBuild, WithoutDeviceIdAndCloneSaysNull) {
     this->repository.eraseProperty(this->path_, "DeviceID");
-    this->failClone(0);
+    this->faults().add(this->answerNull(testbed::Entry::Clone, 0));
     EXPECT_EQ(this->buildIt(), -1);
     EXPECT_EQ(logLines()[1], TypeParam::nullDeviceId + std::string("NULL\n"));
     this->expectNothingCached();
@@ -79,8 +79,8 @@ TYPED_TEST(DeviceBuild, TakesThePathThatIsHandedIn) {
     testbed::ObjectPath handedIn = this->path_;
     handedIn.key("Extra", CimValue::string("key"));
     const testbed::Instance instance = this->repository.get(this->path_).value();
-    this->vendor.tie("CIM_SystemDevice", this->card_.system, handedIn);
-    TypeParam::build(&this->mi, this->ctx(), this->ctrl_, this->broker.makeInstance(instance),
+    this->vendor.tie("CIM_SystemDevice", this->card.system, handedIn);
+    TypeParam::build(&this->mi, this->ctx(), this->ctrl, this->broker.makeInstance(instance),
                      this->broker.makePath(this->path_));
     ASSERT_NE(this->record(), nullptr);
     EXPECT_EQ(testbed::Broker::toPath(this->record()->*TypeParam::op), this->path_);
@@ -89,7 +89,7 @@ TYPED_TEST(DeviceBuild, TakesThePathThatIsHandedIn) {
 
 TYPED_TEST(DeviceBuild, WithoutCloneOfThePathHasNone) {
     if (std::string(TypeParam::name) == "Volume") return;  // needs the path for its pool
-    this->failClone(0);
+    this->faults().add(this->answerNull(testbed::Entry::Clone, 0));
     EXPECT_EQ(this->buildIt(), 0);
     ASSERT_NE(this->record(), nullptr);
     EXPECT_EQ(this->record()->*TypeParam::op, nullptr);
@@ -99,7 +99,7 @@ TYPED_TEST(DeviceBuild, WithoutCloneOfThePathHasNone) {
 TYPED_TEST(DeviceBuild, AppendsAtTheTail) {
     ASSERT_EQ(this->buildIt(), 0);
     void* first = this->record();
-    ASSERT_EQ(this->build(TypeParam::build, TypeParam::make(this->vendor, this->card_, "X2")), 0);
+    ASSERT_EQ(this->build(TypeParam::build, TypeParam::make(this->vendor, this->card, "X2")), 0);
     ASSERT_EQ(this->list()->Size, 2u);
     EXPECT_EQ(this->list()->Head->Data, first);
     auto* second = static_cast<typename TypeParam::Record*>(this->list()->Tail->Data);
@@ -108,7 +108,7 @@ TYPED_TEST(DeviceBuild, AppendsAtTheTail) {
 
 TYPED_TEST(DeviceBuild, AfterTheOnlyRecordWasDeletedAppendsAnew) {
     ASSERT_EQ(this->buildIt(), 0);
-    ASSERT_EQ(TypeParam::remove(this->ctrl_, this->record()), 0);
+    ASSERT_EQ(TypeParam::remove(this->ctrl, this->record()), 0);
     ASSERT_EQ(this->buildIt(), 0);
     ASSERT_EQ(this->list()->Size, 1u);
     EXPECT_STREQ(this->record()->DeviceID, "X1");
@@ -125,10 +125,10 @@ TYPED_TEST(DeviceBuild, StampsItsOwnTimesOnly) {
 
 TYPED_TEST(DeviceBuild, StampsTheRecordWhenItHasReadEverything) {
     int reads = 0;
-    this->whenCalled(testbed::Entry::InstanceGetProperty, [&reads] {
+    this->faults().add(this->watch(testbed::Entry::InstanceGetProperty, [&reads] {
         reads++;
         VirtualClock::advance(1);
-    });
+    }));
     ASSERT_EQ(this->buildIt(), 0);
     EXPECT_GE(reads, 3);
     EXPECT_EQ(this->record()->LastUpdateTime, this->kStart + reads);
@@ -144,10 +144,10 @@ TYPED_TEST(DeviceBuild, OwnsWhatItKeeps) {
 TYPED_TEST(DeviceBuild, ReadsOddStatusAsZero) {
     for (const OddValue& odd : oddArrays()) {
         SCOPED_TRACE(odd.label);
-        give(this->repository, this->path_, "OperationalStatus", odd);
+        this->give(this->path_, "OperationalStatus", odd);
         ASSERT_EQ(this->buildIt(), 0);
         EXPECT_EQ(this->record()->OperationalStatus, 0);
-        ASSERT_EQ(TypeParam::remove(this->ctrl_, this->record()), 0);
+        ASSERT_EQ(TypeParam::remove(this->ctrl, this->record()), 0);
     }
 }
 

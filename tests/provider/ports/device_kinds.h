@@ -101,13 +101,6 @@ struct BatteryKind {
 
 using DeviceKinds = testing::Types<DiskKind, VolumeKind, PortKind, BatteryKind>;
 
-struct KindNames {
-    template <class Kind>
-    static std::string GetName(int) {
-        return Kind::name;
-    }
-};
-
 /// A vendor's device "X1" of the kind, with what it needs around it to be accepted.
 template <class Kind>
 class KindTest : public DeviceTest {
@@ -116,13 +109,13 @@ protected:
 
     void SetUp() override {
         DeviceTest::SetUp();
-        path_ = Kind::make(vendor, card_, "X1");
+        path_ = Kind::make(vendor, card, "X1");
     }
 
     int buildIt() { return build(Kind::build, path_); }
-    List_t* list() const { return ctrl_->*Kind::list; }
+    List_t* list() const { return ctrl->*Kind::list; }
     Record* record() const { return firstOf<Record>(list()); }
-    time_t updateTime() const { return ctrl_->*Kind::updateTime; }
+    time_t updateTime() const { return ctrl->*Kind::updateTime; }
     static std::string exitLine(int rc) { return Kind::exit + std::to_string(rc) + ").\n"; }
     std::string pathText() const { return path_.text(); }
 
@@ -141,7 +134,7 @@ protected:
               &RaidController_t::PoolUpdateTime, &RaidController_t::VolumeUpdateTime,
               &RaidController_t::DiskUpdateTime, &RaidController_t::PortUpdateTime,
               &RaidController_t::BatteryUpdateTime})
-            if (time != Kind::updateTime) times.push_back(ctrl_->*time);
+            if (time != Kind::updateTime) times.push_back(ctrl->*time);
         return times;
     }
 

@@ -52,7 +52,7 @@ TYPED_TEST(DeviceUpdate, StampsUnderTheLock) {
         [&](const CMPIContext* context) {
             CMPIInstance* fresh = this->instanceAt(this->path_);
             begun = true;
-            EXPECT_EQ(TypeParam::update(&this->mi, context, this->ctrl_, this->record(), fresh), 0);
+            EXPECT_EQ(TypeParam::update(&this->mi, context, this->ctrl, this->record(), fresh), 0);
         },
         [&] { return begun.load(); }, [&] { EXPECT_EQ(this->updateTime(), built); });
     EXPECT_EQ(this->updateTime(), built + 5);
@@ -65,7 +65,7 @@ TYPED_TEST(DeviceUpdate, WithoutNeedItOnlySaysThatItWasHere) {
     this->record()->UpdateEnabled = 3;
     this->repository.setProperty(this->path_, "OperationalStatus", CimValue::uint16Array({6}));
     VirtualClock::advance(25);
-    this->forget();
+    this->startOver();
     const UpdatesDeclined declined;
     EXPECT_EQ(this->update(TypeParam::update, this->record(), nullptr), 0);
     EXPECT_EQ(UpdatesDeclined::questions(), (std::vector<UpdatesDeclined::Question>{{built, 3}}));
@@ -78,7 +78,7 @@ TYPED_TEST(DeviceUpdate, WithoutNeedItOnlySaysThatItWasHere) {
 
 TYPED_TEST(DeviceUpdate, NeedsNoInterface) {
     ASSERT_EQ(this->buildIt(), 0);
-    EXPECT_EQ(TypeParam::update(nullptr, this->ctx(), this->ctrl_, this->record(),
+    EXPECT_EQ(TypeParam::update(nullptr, this->ctx(), this->ctrl, this->record(),
                                 this->instanceAt(this->path_)),
               0);
 }
@@ -97,7 +97,7 @@ TYPED_TEST(DeviceUpdateFetch, StampsInAHoldOfTheLockOfItsOwn) {
     VirtualClock::advance(25);
     std::vector<std::pair<int, time_t>> atEnds;  // status and stamp at the end of each hold
     {
-        const HoldWatch watch(this->ctrl_->CtrlMutex, [&] {
+        const HoldWatch watch(this->ctrl->CtrlMutex, [&] {
             atEnds.push_back({this->record()->OperationalStatus, this->updateTime()});
         });
         EXPECT_EQ(this->update(TypeParam::update, this->record(), fresh), 0);

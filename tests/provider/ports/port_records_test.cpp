@@ -24,7 +24,7 @@ protected:
     }
     int updatePort(CMPIInstance* fresh) { return update(CheckAndUpdatePortInfo, record(), fresh); }
     AddressNames names() const {
-        AddressNames known = {{ctrl_->PortList, "ports"}};
+        AddressNames known = {{ctrl->PortList, "ports"}};
         if (record() != nullptr) known.emplace_back(record(), "port");
         return known;
     }
@@ -84,19 +84,19 @@ TEST_F(PortBuild, WithoutNameHasNone) {
 TEST_F(PortBuild, OddValuesCountAsNoneOrZero) {
     for (const OddValue& odd : oddTexts()) {
         SCOPED_TRACE(odd.label);
-        give(repository, path_, "ElementName", odd);
+        give(path_, "ElementName", odd);
         ASSERT_EQ(buildIt(), 0);
         EXPECT_EQ(record()->PortName, nullptr);
-        ASSERT_EQ(DeletePort(ctrl_, record()), 0);
+        ASSERT_EQ(DeletePort(ctrl, record()), 0);
     }
     for (const OddValue& odd : oddNumbers()) {
         SCOPED_TRACE(odd.label);
-        give(repository, path_, "PortType", odd);
-        give(repository, path_, "UsageRestriction", odd);
+        give(path_, "PortType", odd);
+        give(path_, "UsageRestriction", odd);
         ASSERT_EQ(buildIt(), 0);
         EXPECT_EQ(record()->PortType, 0);
         EXPECT_EQ(record()->UsageRestriction, 0);
-        ASSERT_EQ(DeletePort(ctrl_, record()), 0);
+        ASSERT_EQ(DeletePort(ctrl, record()), 0);
     }
 }
 
@@ -116,7 +116,7 @@ TEST_F(PortBuild, WithoutMemoryForTheListEntryIsReleased) {
         EXPECT_EQ(buildIt(), -2);
         EXPECT_EQ(fault.failures(), 1u);
     }
-    Lines lines = logWithLock(names());
+    Texts lines = logWithLock(names());
     lines.erase(lines.begin(), lines.begin() + 2);
     EXPECT_THAT(lines, ElementsAre("held DEBUG Adding data <?> to the list <ports> at the tail\n",
                                    "free ERR BuildPortInfo: failed to add port to list, rc -2.\n",
@@ -128,10 +128,10 @@ TEST_F(PortBuild, WithoutMemoryForTheListEntryIsReleased) {
 TEST_F(PortBuild, SurvivesEveryFailingAllocation) {
     const std::size_t allocations = forEachFailingAllocation([&](std::size_t n) {
         SCOPED_TRACE(n);
-        ctrl_->PortUpdateTime = 0;
+        ctrl->PortUpdateTime = 0;
         const int rc = buildIt();
         if (rc != 0) return expectNothingCached();
-        EXPECT_EQ(DeletePort(ctrl_, record()), 0);
+        EXPECT_EQ(DeletePort(ctrl, record()), 0);
     });
     EXPECT_EQ(allocations, 4u) << "record, identifier, name, list entry";
 }
@@ -141,17 +141,17 @@ using PortUpdate = PortTest;
 TEST_F(PortUpdate, LogsAndStampsUnderTheLock) {
     ASSERT_EQ(buildIt(), 0);
     VirtualClock::advance(30);
-    forget();
+    startOver();
     ASSERT_EQ(updatePort(instanceAt(path_)), 0);
     EXPECT_THAT(logLines(), ElementsAre("DEBUG CheckAndUpdatePortInfo: ENTER. port - SAS port 1\n",
                                         "DEBUG CheckAndUpdatePortInfo, exit.\n"));
-    EXPECT_EQ(ctrl_->PortUpdateTime, kStart + 30);
+    EXPECT_EQ(ctrl->PortUpdateTime, kStart + 30);
 }
 
 TEST_F(PortUpdate, OfANamelessPortPassesTheNull) {
     repository.eraseProperty(path_, "ElementName");
     ASSERT_EQ(buildIt(), 0);
-    forget();
+    startOver();
     ASSERT_EQ(updatePort(nullptr), 0);
     EXPECT_THAT(logLines(), ElementsAre("DEBUG CheckAndUpdatePortInfo: ENTER. port - (null)\n",
                                         "DEBUG CheckAndUpdatePortInfo, exit.\n"));
@@ -166,7 +166,7 @@ TEST_F(PortUpdate, ReadsNothing) {
     books().recordObjectCalls(true);
     CMPIInstance* const given[] = {instanceAt(path_), nullptr};
     for (CMPIInstance* fresh : given) {
-        forget();
+        startOver();
         ASSERT_EQ(updatePort(fresh), 0);
         EXPECT_THAT(books().calls(), IsEmpty());
     }

@@ -58,7 +58,7 @@ protected:
         faults().add(rule);
         auto hanging = std::async(std::launch::async, [this] {
             const testbed::Broker::CallScope scope(broker);
-            ProcessDeviceConfigChange(&mi, scope.context(), ctrl_, 103);
+            ProcessDeviceConfigChange(&mi, scope.context(), ctrl, 103);
         });
         EXPECT_TRUE(gate_.awaitArrivals(1));
         return hanging;
@@ -76,7 +76,7 @@ TEST_F(ClassLockTest, AHungClassIsPassedOverAndTheOthersAreServed) {
     process(103);
     process(102);
     EXPECT_EQ(linesWith("Action 103"), 1u) << "the hung one's own";
-    EXPECT_EQ(ctrl_->BatteryUpdateTime, 0) << "it stays due";
+    EXPECT_EQ(ctrl->BatteryUpdateTime, 0) << "it stays due";
     EXPECT_EQ(ports(), (Ids{"P0", "P1"}));
     EXPECT_EQ(timesLogged(LOG_ERR, kPassedOver), 1u);
 }
@@ -99,7 +99,7 @@ TEST_F(ClassLockTest, ItIsToldOnceWhenItBeginsAndOnceWhenItEnds) {
     addBattery("B1");
     setAllUpdateTimes(0);
     process(103);
-    EXPECT_EQ(ctrl_->BatteryList->Size, 2u);
+    EXPECT_EQ(ctrl->BatteryList->Size, 2u);
 }
 
 TEST_F(ClassLockTest, UntilThenTheSecondWaits) {
@@ -108,7 +108,7 @@ TEST_F(ClassLockTest, UntilThenTheSecondWaits) {
     ahead = 28;
     auto waiting = std::async(std::launch::async, [this] {
         const testbed::Broker::CallScope scope(broker);
-        ProcessDeviceConfigChange(&mi, scope.context(), ctrl_, 103);
+        ProcessDeviceConfigChange(&mi, scope.context(), ctrl, 103);
     });
     EXPECT_EQ(waiting.wait_for(std::chrono::milliseconds(100)), std::future_status::timeout);
     gate_.open();
@@ -124,7 +124,7 @@ TEST_F(ClassLockTest, AWaitEndsAtAStop) {
     const GateOpener opener(gate_);
     auto waiting = std::async(std::launch::async, [this] {
         const testbed::Broker::CallScope scope(broker);
-        ProcessDeviceConfigChange(&mi, scope.context(), ctrl_, 103);
+        ProcessDeviceConfigChange(&mi, scope.context(), ctrl, 103);
     });
     EXPECT_EQ(waiting.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     RequestStop();
@@ -143,7 +143,7 @@ TEST_F(ClassLockTest, AnHourOfAHungClassKeepsNobodyElseFromFollowingTheHardware)
         process(103);
         process(102);
         process(101);
-        EXPECT_EQ(ctrl_->PortList->Size, static_cast<unsigned int>(minute) + 1);
+        EXPECT_EQ(ctrl->PortList->Size, static_cast<unsigned int>(minute) + 1);
         EXPECT_EQ(associatorQueries().size(), queries + 4) << "ports, pools, drives, volumes";
     }
     EXPECT_EQ(timesLogged(LOG_ERR, kPassedOver), 1u);

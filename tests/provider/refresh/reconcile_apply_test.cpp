@@ -14,13 +14,13 @@ protected:
         while (index-- > 0) entry = entry->Next;
         return static_cast<Record*>(entry->Data);
     }
-    SASSATAPort_t* port(int index) { return record<SASSATAPort_t>(ctrl_->PortList, index); }
+    SASSATAPort_t* port(int index) { return record<SASSATAPort_t>(ctrl->PortList, index); }
 
     /// Caches a port record that the vendor may or may not have.
     SASSATAPort_t* cachePort(const Path& path, const std::string& id) {
         SASSATAPort_t* made = newPort(id.c_str());
         made->PortOp = clonedPath(path);
-        return attach(ctrl_, made);
+        return attach(ctrl, made);
     }
 
     /// The lines about single devices, with their pointers.
@@ -42,7 +42,7 @@ TEST_F(ReconcileApply, GoneNewAndStayingDrives) {
     const Path staying = addDrive("D1", pool);
     process(100);
     ASSERT_EQ(drives(), (Ids{"D0", "D1"}));
-    auto* const kept = record<DiskDrive_t>(ctrl_->DiskList, 1);
+    auto* const kept = record<DiskDrive_t>(ctrl->DiskList, 1);
 
     repository.remove(gone);
     repository.setProperty(staying, "OperationalStatus", CimValue::uint16Array({6}));
@@ -50,7 +50,7 @@ TEST_F(ReconcileApply, GoneNewAndStayingDrives) {
     processDue(100);
 
     EXPECT_EQ(drives(), (Ids{"D1", "D2"}));
-    EXPECT_EQ(record<DiskDrive_t>(ctrl_->DiskList, 0), kept);
+    EXPECT_EQ(record<DiskDrive_t>(ctrl->DiskList, 0), kept);
     EXPECT_EQ(kept->OperationalStatus, 6);
 }
 
@@ -60,7 +60,7 @@ TEST_F(ReconcileApply, TheUpdaterGetsTheFreshInstance) {
     repository.setProperty(battery, "BatteryStatus", CimValue::uint16(4));
     processDue(103);
 
-    EXPECT_EQ(record<Battery_t>(ctrl_->BatteryList, 0)->BatteryStatus, 4);
+    EXPECT_EQ(record<Battery_t>(ctrl->BatteryList, 0)->BatteryStatus, 4);
     EXPECT_EQ(books().count(testbed::Entry::GetInstance), 0u);
 }
 
@@ -162,8 +162,8 @@ TEST_F(ReconcileApply, EmptyResultDeletesEveryRecord) {
 TEST_F(ReconcileApply, NothingChangedUpdatesEveryRecordInPlace) {
     addOneOfEach();
     for (const int action : {101, 102, 103, 105}) process(action);
-    void* const records[] = {ctrl_->PoolList->Head->Data, ctrl_->DiskList->Head->Data,
-                             ctrl_->VolumeList->Head->Data};
+    void* const records[] = {ctrl->PoolList->Head->Data, ctrl->DiskList->Head->Data,
+                             ctrl->VolumeList->Head->Data};
     const std::size_t clones = books().liveClones();
 
     processDue(101);
@@ -200,7 +200,7 @@ TEST_F(ReconcileApply, ARejectedDeviceDoesNotStopTheOthers) {
     addPort("P1");
     EXPECT_EQ(processDue(102), 0);
     EXPECT_EQ(ports(), Ids{"P1"});
-    EXPECT_EQ(ctrl_->PortUpdateTime, kStart);
+    EXPECT_EQ(ctrl->PortUpdateTime, kStart);
 }
 
 TEST_F(ReconcileApply, ADeviceThatCannotBeDeletedIsOfferedAgain) {
@@ -212,14 +212,14 @@ TEST_F(ReconcileApply, ADeviceThatCannotBeDeletedIsOfferedAgain) {
     testbed::FaultRule unlink;
     unlink.entry = testbed::Entry::PathGetKey;
     unlink.times = 1;
-    unlink.hook = [&] { RemoveEntryFromListByKey(ctrl_->PortList, port0); };
+    unlink.hook = [&] { RemoveEntryFromListByKey(ctrl->PortList, port0); };
     faults().add(unlink);
 
     EXPECT_EQ(processDue(102), 0);
 
     EXPECT_EQ(std::string(port0->DeviceID), "P0") << "the record is not released";
-    EXPECT_EQ(ctrl_->PortUpdateTime, kStart);
-    AddEntryAtListTail(ctrl_->PortList, port0);
+    EXPECT_EQ(ctrl->PortUpdateTime, kStart);
+    AddEntryAtListTail(ctrl->PortList, port0);
     processDue(102);
     EXPECT_EQ(deviceLines(),
               Ids{formatted("Deleting devices[0]: %p\n", static_cast<void*>(port0))});
@@ -249,8 +249,8 @@ TEST_F(ReconcileApply, PoolsAndChassisKeepTheValuesOfTheirBuild) {
     repository.setProperty(enclosure, "OperationalStatus", CimValue::uint16Array({6}));
     processDue(104);
     processDue(105);
-    EXPECT_EQ(record<StoragePool_t>(ctrl_->PoolList, 0)->RemainingManagedSpace, 400u);
-    EXPECT_EQ(record<Chassis_t>(ctrl_->ChassisList, 0)->OperationalStatus, 2);
+    EXPECT_EQ(record<StoragePool_t>(ctrl->PoolList, 0)->RemainingManagedSpace, 400u);
+    EXPECT_EQ(record<Chassis_t>(ctrl->ChassisList, 0)->OperationalStatus, 2);
 }
 
 }  // namespace

@@ -30,9 +30,9 @@ TEST_P(ReconcileChain, StampsWhatItWentThroughAndNothingElse) {
     for (auto field : kClassTimes) {
         const bool isStamped =
             std::count(GetParam().stamped.begin(), GetParam().stamped.end(), field) != 0;
-        EXPECT_EQ(ctrl_->*field, isStamped ? kStart : 0);
+        EXPECT_EQ(ctrl->*field, isStamped ? kStart : 0);
     }
-    EXPECT_EQ(ctrl_->ControllerUpdateTime, 0);
+    EXPECT_EQ(ctrl->ControllerUpdateTime, 0);
 }
 
 TEST_P(ReconcileChain, TracesEntryAndExit) {
@@ -86,7 +86,7 @@ TEST_F(ReconcileOrder, AVolumesPoolAndDrivesAreThereBeforeIt) {
     EXPECT_EQ(batteries(), Ids{});
     EXPECT_EQ(chassis(), Ids{});
     // The drive found its pool, as pools came first.
-    auto* pool = static_cast<StoragePool_t*>(ctrl_->PoolList->Head->Data);
+    auto* pool = static_cast<StoragePool_t*>(ctrl->PoolList->Head->Data);
     EXPECT_EQ(pool->Drives->Size, 1u);
 }
 
@@ -109,9 +109,9 @@ TEST_F(ReconcileOrder, EachActionBuildsItsOwnKind) {
 TEST_F(ReconcileOrder, ControllersAreRefreshedApart) {
     addOneOfEach();
     RaidController_t* const other = attach(newController("C1"));
-    const VendorController array = vendor_.controller("C1");
+    const VendorController array = vendor.controller("C1");
     other->ControllerOp = clonedPath(array.system);
-    vendor_.port(array, "P9");
+    vendor.port(array, "P9");
 
     process(102);
     EXPECT_EQ(other->PortList->Size, 0u);

@@ -30,7 +30,7 @@ TEST_F(ReconcileDue, NothingInTheFirstThreeSeconds) {
         EXPECT_TRUE(loggedOnce(LOG_DEBUG, "ProcessDeviceConfigChange, EXIT\n"));
     }
     EXPECT_TRUE(books().queries().empty());
-    for (auto field : kClassTimes) EXPECT_EQ(ctrl_->*field, 77);
+    for (auto field : kClassTimes) EXPECT_EQ(ctrl->*field, 77);
     EXPECT_EQ(pools(), Ids{});
 }
 
@@ -48,39 +48,39 @@ TEST_F(ReconcileDue, AStartInTheFutureIsWithinTheThreeSeconds) {
 }
 
 TEST_F(ReconcileDue, NotDueBelowTheInterval) {
-    ctrl_->PortUpdateTime = kStart - 19;
+    ctrl->PortUpdateTime = kStart - 19;
     EXPECT_EQ(process(102), 0);
     EXPECT_TRUE(books().queries().empty());
-    EXPECT_EQ(ctrl_->PortUpdateTime, kStart - 19);
+    EXPECT_EQ(ctrl->PortUpdateTime, kStart - 19);
     EXPECT_TRUE(
-        loggedOnce(LOG_DEBUG, classLine(102, kStart - 19, kStart, ctrl_->PortCfgMutex, ", skip")));
+        loggedOnce(LOG_DEBUG, classLine(102, kStart - 19, kStart, ctrl->PortCfgMutex, ", skip")));
     EXPECT_EQ(CapturedSyslog::lines().size(), 3u);
 }
 
 TEST_F(ReconcileDue, DueFromTheIntervalOn) {
-    ctrl_->PortUpdateTime = kStart - 20;
+    ctrl->PortUpdateTime = kStart - 20;
     EXPECT_EQ(process(102), 0);
     EXPECT_EQ(walks().size(), 1u);
-    EXPECT_EQ(ctrl_->PortUpdateTime, kStart);
-    EXPECT_TRUE(loggedOnce(LOG_DEBUG, classLine(102, kStart - 20, kStart, ctrl_->PortCfgMutex)));
+    EXPECT_EQ(ctrl->PortUpdateTime, kStart);
+    EXPECT_TRUE(loggedOnce(LOG_DEBUG, classLine(102, kStart - 20, kStart, ctrl->PortCfgMutex)));
 }
 
 TEST_F(ReconcileDue, AnotherIntervalMovesTheLimit) {
     StateUpdateInterval = 45;
-    ctrl_->PortUpdateTime = kStart - 44;
+    ctrl->PortUpdateTime = kStart - 44;
     process(102);
     EXPECT_TRUE(books().queries().empty());
-    ctrl_->PortUpdateTime = kStart - 45;
+    ctrl->PortUpdateTime = kStart - 45;
     process(102);
     EXPECT_EQ(walks().size(), 1u);
 }
 
 TEST_F(ReconcileDue, UpdateTimeInTheFutureIsNotDue) {
-    ctrl_->PortUpdateTime = kStart + 5;
+    ctrl->PortUpdateTime = kStart + 5;
     EXPECT_EQ(process(102), 0);
     EXPECT_TRUE(books().queries().empty());
     EXPECT_TRUE(
-        loggedOnce(LOG_DEBUG, classLine(102, kStart + 5, kStart, ctrl_->PortCfgMutex, ", skip")));
+        loggedOnce(LOG_DEBUG, classLine(102, kStart + 5, kStart, ctrl->PortCfgMutex, ", skip")));
 }
 
 TEST_F(ReconcileDue, ASecondRefreshRightAfterTheFirstIsSkipped) {
@@ -92,33 +92,33 @@ TEST_F(ReconcileDue, ASecondRefreshRightAfterTheFirstIsSkipped) {
 TEST_F(ReconcileDue, EachClassOfTheChainIsTestedForItself) {
     addOneOfEach();
     setAllUpdateTimes(kStart - 100);
-    ctrl_->PoolUpdateTime = kStart - 5;
+    ctrl->PoolUpdateTime = kStart - 5;
 
     EXPECT_EQ(process(101), 0);
 
     EXPECT_EQ(walks(),
               (Ids{"CIM_SystemDevice>CIM_DiskDrive", "CIM_SystemDevice>CIM_StorageVolume"}));
-    EXPECT_EQ(ctrl_->PoolUpdateTime, kStart - 5);
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kStart);
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kStart);
+    EXPECT_EQ(ctrl->PoolUpdateTime, kStart - 5);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kStart);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kStart);
 }
 
 TEST_F(ReconcileDue, TheRequestedClassItselfMayBeSkipped) {
     setAllUpdateTimes(kStart - 100);
-    ctrl_->VolumeUpdateTime = kStart - 5;
+    ctrl->VolumeUpdateTime = kStart - 5;
     EXPECT_EQ(process(101), 0);
     EXPECT_EQ(walks(),
               (Ids{"CIM_HostedStoragePool>CIM_StoragePool", "CIM_SystemDevice>CIM_DiskDrive"}));
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kStart - 5);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kStart - 5);
 }
 
 TEST_F(ReconcileDue, EveryClassNamesItsOwnMutex) {
     setAllUpdateTimes(kStart - 30);
     for (const int action : {101, 102, 103, 105}) process(action);
 
-    const pthread_mutex_t* const mutexes[] = {&ctrl_->DiskCfgMutex, &ctrl_->VolumeCfgMutex,
-                                              &ctrl_->PortCfgMutex, &ctrl_->BatteryCfgMutex,
-                                              &ctrl_->PoolCfgMutex, &ctrl_->ChassisCfgMutex};
+    const pthread_mutex_t* const mutexes[] = {&ctrl->DiskCfgMutex, &ctrl->VolumeCfgMutex,
+                                              &ctrl->PortCfgMutex, &ctrl->BatteryCfgMutex,
+                                              &ctrl->PoolCfgMutex, &ctrl->ChassisCfgMutex};
     for (int i = 0; i < 6; i++) {
         EXPECT_TRUE(loggedOnce(LOG_DEBUG, classLine(100 + i, kStart - 30, kStart, *mutexes[i])))
             << i;
@@ -127,7 +127,7 @@ TEST_F(ReconcileDue, EveryClassNamesItsOwnMutex) {
 
 TEST_F(ReconcileDue, TheLineComesBeforeTheQuery) {
     ASSERT_EQ(process(102), 0);
-    const int line = lineNumber(classLine(102, 0, kStart, ctrl_->PortCfgMutex));
+    const int line = lineNumber(classLine(102, 0, kStart, ctrl->PortCfgMutex));
     const int query = lineNumber(formatted(
         "ProcessDeviceConfigChange, CIM Query - Associators: %s (assocClass: CIM_SystemDevice, "
         "resultClass: CIM_SASSATAPort)",
@@ -144,20 +144,20 @@ TEST_F(ReconcileDue, TheStampIsTheTimeWhenTheRefreshEnded) {
 
     ASSERT_EQ(process(102), 0);
 
-    EXPECT_EQ(ctrl_->PortUpdateTime, kStart + 7);
+    EXPECT_EQ(ctrl->PortUpdateTime, kStart + 7);
 }
 
 TEST_F(ReconcileDue, TheTimeIsReadAnewForEachClass) {
     // What the slow walk over the pools takes makes the drives due.
     setAllUpdateTimes(kStart - 100);
-    ctrl_->DiskUpdateTime = kStart - 15;
+    ctrl->DiskUpdateTime = kStart - 15;
     testbed::FaultRule slow = walkOver("CIM_StoragePool");
     slow.hook = [] { VirtualClock::advance(10); };
     faults().add(slow);
 
     ASSERT_EQ(process(100), 0);
 
-    EXPECT_EQ(ctrl_->DiskUpdateTime, kStart + 10);
+    EXPECT_EQ(ctrl->DiskUpdateTime, kStart + 10);
 }
 
 }  // namespace

@@ -1,4 +1,7 @@
 // Refreshes that fail: logged, the cache as it was, and no second try before the next interval.
+#include <optional>
+#include <string>
+
 #include "reconcile_fixture.h"
 
 namespace plexortest {
@@ -21,42 +24,33 @@ protected:
     /// The cached port is still there, the new one is not, and the class is stamped.
     void expectOldCacheAndStamp() {
         EXPECT_EQ(ports(), Ids{"P0"});
-        EXPECT_EQ(ctrl_->PortUpdateTime, kStart + 100);
+        EXPECT_EQ(ctrl->PortUpdateTime, kStart + 100);
         EXPECT_TRUE(loggedOnce(LOG_DEBUG, "ProcessDeviceConfigChange, EXIT\n"));
         EXPECT_EQ(CapturedSyslog::countContaining("removecount"), 0u);
         process(102);
         EXPECT_EQ(walks().size(), 1u) << "asked again before the next interval";
     }
+    /// A walk that is refused like this leaves one error line, which ends so.
+    void expectLogged(CMPIrc rc, const std::optional<std::string>& message, const char* end) {
+        FaultRule refused = walkOver("CIM_SASSATAPort");
+        refused.rc = rc;
+        refused.message = message;
+        faults().add(refused);
+        EXPECT_EQ(process(102), 0);
+        EXPECT_TRUE(loggedOnce(LOG_ERR, formatted("Associators %s (assocClass: CIM_SystemDevice, "
+                                                  "resultClass: CIM_SASSATAPort) failed, %s",
+                                                  kSystemText, end)));
+        EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR).size(), 1u);
+        expectOldCacheAndStamp();
+    }
 };
 
 TEST_F(ReconcileFailure, ARefusedWalkIsLoggedWithItsMessage) {
-    FaultRule refused = walkOver("CIM_SASSATAPort");
-    refused.rc = CMPI_RC_ERR_FAILED;
-    refused.message = "array is rebooting";
-    faults().add(refused);
-
-    EXPECT_EQ(process(102), 0);
-
-    EXPECT_TRUE(loggedOnce(
-        LOG_ERR, formatted("Associators %s (assocClass: CIM_SystemDevice, resultClass: "
-                           "CIM_SASSATAPort) failed, status: rc 1, msg array is rebooting",
-                           kSystemText)));
-    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR).size(), 1u);
-    expectOldCacheAndStamp();
+    expectLogged(CMPI_RC_ERR_FAILED, "array is rebooting", "status: rc 1, msg array is rebooting");
 }
 
 TEST_F(ReconcileFailure, ARefusedWalkWithoutMessage) {
-    FaultRule refused = walkOver("CIM_SASSATAPort");
-    refused.rc = CMPI_RC_ERR_NOT_SUPPORTED;
-    faults().add(refused);
-
-    EXPECT_EQ(process(102), 0);
-
-    EXPECT_TRUE(
-        loggedOnce(LOG_ERR, formatted("Associators %s (assocClass: CIM_SystemDevice, resultClass: "
-                                      "CIM_SASSATAPort) failed, status: rc 7, msg NULL",
-                                      kSystemText)));
-    expectOldCacheAndStamp();
+    expectLogged(CMPI_RC_ERR_NOT_SUPPORTED, {}, "status: rc 7, msg NULL");
 }
 
 TEST_F(ReconcileFailure, ResultsOfARefusedWalkAreNotUsed) {
@@ -97,7 +91,7 @@ TEST_F(ReconcileFailure, NoMemoryToMatch) {
             EXPECT_EQ(fault.failures(), 1u);
         }
         EXPECT_EQ(ports(), Ids{"P0"});
-        EXPECT_EQ(ctrl_->PortUpdateTime, VirtualClock::now());
+        EXPECT_EQ(ctrl->PortUpdateTime, VirtualClock::now());
         VirtualClock::advance(20);
     }
     EXPECT_EQ(process(102), 0);
@@ -131,12 +125,12 @@ TEST_F(ReconcileFailure, AFailedDependencyDoesNotStopTheChain) {
     EXPECT_EQ(pools(), Ids{});
     EXPECT_EQ(drives(), Ids{"D0"});
     EXPECT_EQ(volumes(), Ids{"V0"});
-    EXPECT_EQ(ctrl_->PoolUpdateTime, kStart + 100);
+    EXPECT_EQ(ctrl->PoolUpdateTime, kStart + 100);
 }
 
 TEST_F(ReconcileFailure, AControllerWithoutPathIsShownAsNullAndStamped) {
-    ctrl_->ControllerOp->ft->release(ctrl_->ControllerOp);
-    ctrl_->ControllerOp = nullptr;
+    ctrl->ControllerOp->ft->release(ctrl->ControllerOp);
+    ctrl->ControllerOp = nullptr;
 
     EXPECT_EQ(process(102), 0);
 
@@ -144,7 +138,7 @@ TEST_F(ReconcileFailure, AControllerWithoutPathIsShownAsNullAndStamped) {
                            "ProcessDeviceConfigChange, CIM Query - Associators: NULL "
                            "(assocClass: CIM_SystemDevice, resultClass: CIM_SASSATAPort)"));
     EXPECT_EQ(ports(), Ids{"P0"});
-    EXPECT_EQ(ctrl_->PortUpdateTime, kStart + 100);
+    EXPECT_EQ(ctrl->PortUpdateTime, kStart + 100);
 }
 
 TEST_F(ReconcileFailure, AnyAllocationMayFailWithoutLossOrLeak) {
@@ -154,12 +148,12 @@ TEST_F(ReconcileFailure, AnyAllocationMayFailWithoutLossOrLeak) {
     addChassis("C0_E0");
     bool reached = true;
     for (std::size_t n = 1; reached; n++) {
-        RaidController_t* const ctrl = newController("C0");
-        ctrl->ControllerOp = clonedPath(system_);
+        RaidController_t* const another = newController("C0");
+        another->ControllerOp = clonedPath(system_);
         {
             const auto fault = FailAllocation::nth(n);
             for (const int action : {100, 102, 103, 105}) {
-                EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, action), 0);
+                EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), another, action), 0);
             }
             reached = fault.failures() == 1;
             EXPECT_TRUE(reached || n > 20) << "hardly any allocation was reached";
@@ -167,17 +161,18 @@ TEST_F(ReconcileFailure, AnyAllocationMayFailWithoutLossOrLeak) {
         for (auto field : {&RaidController_t::DiskUpdateTime, &RaidController_t::PortUpdateTime,
                            &RaidController_t::BatteryUpdateTime, &RaidController_t::PoolUpdateTime,
                            &RaidController_t::ChassisUpdateTime}) {
-            EXPECT_EQ(ctrl->*field, kStart + 100) << "allocation " << n;
+            EXPECT_EQ(another->*field, kStart + 100) << "allocation " << n;
         }
         // The next pass makes up for what failed.
-        for (auto field : kClassTimes) ctrl->*field = 0;
+        for (auto field : kClassTimes) another->*field = 0;
         for (const int action : {100, 102, 103, 105}) {
-            ProcessDeviceConfigChange(&mi, ctx(), ctrl, action);
+            ProcessDeviceConfigChange(&mi, ctx(), another, action);
         }
-        EXPECT_EQ(ids(ctrl->DiskList, &DiskDrive_t::DeviceID), Ids{"D0"}) << "allocation " << n;
-        EXPECT_EQ(ctrl->PortList->Size, 2u);
-        EXPECT_EQ(ctrl->PoolList->Size + ctrl->BatteryList->Size + ctrl->ChassisList->Size, 3u);
-        FreeController(ctrl);
+        EXPECT_EQ(ids(another->DiskList, &DiskDrive_t::DeviceID), Ids{"D0"}) << "allocation " << n;
+        EXPECT_EQ(another->PortList->Size, 2u);
+        EXPECT_EQ(another->PoolList->Size + another->BatteryList->Size + another->ChassisList->Size,
+                  3u);
+        FreeController(another);
     }
 }
 

@@ -14,16 +14,16 @@ protected:
 
     void SetUp() override {
         RefreshTest::SetUp();
-        array_ = vendor_.controller("C0");
-        system_ = array_.system;
-        ctrl_ = attach(newController("C0"));
-        ctrl_->ControllerOp = clonedPath(system_);
+        card = vendor.controller("C0");
+        system_ = card.system;
+        ctrl = attach(newController("C0"));
+        ctrl->ControllerOp = clonedPath(system_);
         InitCompleteTime = kStart - 1000;
         StateUpdateInterval = 20;
         clearLog();
     }
 
-    int process(int action) { return ProcessDeviceConfigChange(&mi, ctx(), ctrl_, action); }
+    int process(int action) { return ProcessDeviceConfigChange(&mi, ctx(), ctrl, action); }
     /// The same with every class due and a log and books that show nothing else.
     int processDue(int action) {
         setAllUpdateTimes(0);
@@ -38,19 +38,19 @@ protected:
         &RaidController_t::PoolUpdateTime, &RaidController_t::ChassisUpdateTime};
 
     void setAllUpdateTimes(time_t time) {
-        for (auto field : kClassTimes) ctrl_->*field = time;
+        for (auto field : kClassTimes) ctrl->*field = time;
     }
 
-    Path addPool(const std::string& id) { return vendor_.pool(array_, id); }
+    Path addPool(const std::string& id) { return vendor.pool(card, id); }
     Path addDrive(const std::string& id, const Path& pool) {
-        return vendor_.drive(array_, id, pool).drive;
+        return vendor.drive(card, id, pool).drive;
     }
     Path addVolume(const std::string& id, const Path& pool) {
-        return vendor_.volume(array_, id, pool).volume;
+        return vendor.volume(card, id, pool).volume;
     }
-    Path addPort(const std::string& id) { return vendor_.port(array_, id); }
-    Path addBattery(const std::string& id) { return vendor_.battery(array_, id); }
-    Path addChassis(const std::string& tag) { return vendor_.chassis(array_, tag); }
+    Path addPort(const std::string& id) { return vendor.port(card, id); }
+    Path addBattery(const std::string& id) { return vendor.battery(card, id); }
+    Path addChassis(const std::string& tag) { return vendor.chassis(card, tag); }
     /// One device of every class.
     void addOneOfEach() {
         const Path pool = addPool("pool0");
@@ -63,7 +63,7 @@ protected:
     /// Leaves the vendor nothing but the controller.
     void clearVendor() {
         repository.clearInstances();
-        vendor_.controller("C0");
+        vendor.controller("C0");
     }
 
     /// Identifiers of the records in a list, in order.
@@ -75,20 +75,18 @@ protected:
         }
         return found;
     }
-    std::vector<std::string> drives() const { return ids(ctrl_->DiskList, &DiskDrive_t::DeviceID); }
+    std::vector<std::string> drives() const { return ids(ctrl->DiskList, &DiskDrive_t::DeviceID); }
     std::vector<std::string> volumes() const {
-        return ids(ctrl_->VolumeList, &StorageVolume_t::DeviceID);
+        return ids(ctrl->VolumeList, &StorageVolume_t::DeviceID);
     }
-    std::vector<std::string> ports() const {
-        return ids(ctrl_->PortList, &SASSATAPort_t::DeviceID);
-    }
+    std::vector<std::string> ports() const { return ids(ctrl->PortList, &SASSATAPort_t::DeviceID); }
     std::vector<std::string> batteries() const {
-        return ids(ctrl_->BatteryList, &Battery_t::DeviceID);
+        return ids(ctrl->BatteryList, &Battery_t::DeviceID);
     }
     std::vector<std::string> pools() const {
-        return ids(ctrl_->PoolList, &StoragePool_t::InstanceID);
+        return ids(ctrl->PoolList, &StoragePool_t::InstanceID);
     }
-    std::vector<std::string> chassis() const { return ids(ctrl_->ChassisList, &Chassis_t::Tag); }
+    std::vector<std::string> chassis() const { return ids(ctrl->ChassisList, &Chassis_t::Tag); }
 
     /// Lists a rule for the walk over one class.
     testbed::FaultRule walkOver(const std::string& resultClass) {
@@ -119,10 +117,9 @@ protected:
         "root/sample:Sample_ComputerSystem.CreationClassName=\"Sample_ComputerSystem\","
         "Name=\"system-C0\"";
 
-    VendorObjects vendor_{repository};
-    VendorController array_;
+    VendorController card;
     Path system_;
-    RaidController_t* ctrl_ = nullptr;
+    RaidController_t* ctrl = nullptr;
 };
 
 }  // namespace plexortest

@@ -16,10 +16,10 @@ protected:
     /// Chassis (H), CtrlMutex (C), the workers' mutex (T).
     std::string held() {
         const std::pair<char, pthread_mutex_t*> mutexes[] = {
-            {'D', &ctrl_->DiskCfgMutex}, {'V', &ctrl_->VolumeCfgMutex},
-            {'P', &ctrl_->PortCfgMutex}, {'B', &ctrl_->BatteryCfgMutex},
-            {'O', &ctrl_->PoolCfgMutex}, {'H', &ctrl_->ChassisCfgMutex},
-            {'C', &ctrl_->CtrlMutex},    {'T', &PlexorThreadMutex}};
+            {'D', &ctrl->DiskCfgMutex}, {'V', &ctrl->VolumeCfgMutex},
+            {'P', &ctrl->PortCfgMutex}, {'B', &ctrl->BatteryCfgMutex},
+            {'O', &ctrl->PoolCfgMutex}, {'H', &ctrl->ChassisCfgMutex},
+            {'C', &ctrl->CtrlMutex},    {'T', &PlexorThreadMutex}};
         std::string letters;
         for (const auto& [letter, mutex] : mutexes) {
             if (pthread_mutex_trylock(mutex) == EBUSY) {
@@ -52,7 +52,7 @@ TEST_F(ReconcileLocks, OneClassMutexAtATimeAndNoOther) {
 }
 
 TEST_F(ReconcileLocks, TheClassMutexIsHeldForMatchingAndBuilding) {
-    vendor_.drive(array_, "D0", addPool("pool0"), addChassis("C0_E0"));
+    vendor.drive(card, "D0", addPool("pool0"), addChassis("C0_E0"));
     process(104);
     Ids duringKeys, duringQueries, duringNames;
     watch(Entry::EnumerationToArray, duringKeys);
@@ -101,19 +101,19 @@ TEST_F(ReconcileLocks, AClassThatCannotBeLockedIsPassedOver) {
     pthread_mutexattr_t attributes;
     pthread_mutexattr_init(&attributes);
     pthread_mutexattr_settype(&attributes, PTHREAD_MUTEX_ERRORCHECK);
-    pthread_mutex_destroy(&ctrl_->DiskCfgMutex);
-    pthread_mutex_init(&ctrl_->DiskCfgMutex, &attributes);
+    pthread_mutex_destroy(&ctrl->DiskCfgMutex);
+    pthread_mutex_init(&ctrl->DiskCfgMutex, &attributes);
     pthread_mutexattr_destroy(&attributes);
-    ASSERT_EQ(pthread_mutex_lock(&ctrl_->DiskCfgMutex), 0);
+    ASSERT_EQ(pthread_mutex_lock(&ctrl->DiskCfgMutex), 0);
 
     EXPECT_EQ(process(101), 0);
 
     EXPECT_EQ(walks(),
               (Ids{"CIM_HostedStoragePool>CIM_StoragePool", "CIM_SystemDevice>CIM_StorageVolume"}));
-    EXPECT_EQ(ctrl_->DiskUpdateTime, 0);
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kStart);
+    EXPECT_EQ(ctrl->DiskUpdateTime, 0);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kStart);
     EXPECT_EQ(CapturedSyslog::countContaining("Action 100"), 0u);
-    EXPECT_EQ(pthread_mutex_unlock(&ctrl_->DiskCfgMutex), 0) << "released by somebody else";
+    EXPECT_EQ(pthread_mutex_unlock(&ctrl->DiskCfgMutex), 0) << "released by somebody else";
 }
 
 /// The same with two workers and refreshes that arrive as requests.
@@ -125,67 +125,64 @@ protected:
         addPort("P0");
         addBattery("B0");
     }
-    int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl_, action); }
+    int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl, action); }
     /// Holds walks over that class at the gate.
-    void holdWalk(const std::string& resultClass, Gate& gate) {
-        FaultRule rule = walkOver(resultClass);
+    /// Asks for a refresh of the ports that comes as far as its walk, and waits there.
+    void holdRefreshOfPorts(Gate& gate) {
+        FaultRule rule = walkOver("CIM_SASSATAPort");
         rule.hook = [&gate] { gate.pass(); };
         faults().add(rule);
+        ASSERT_EQ(request(102), 0);
+        ASSERT_TRUE(gate.awaitArrivals(1));
     }
     std::size_t countOfLists() {
-        pthread_mutex_lock(&ctrl_->CtrlMutex);
-        const std::size_t count = ctrl_->PortList->Size + ctrl_->BatteryList->Size;
-        pthread_mutex_unlock(&ctrl_->CtrlMutex);
+        pthread_mutex_lock(&ctrl->CtrlMutex);
+        const std::size_t count = ctrl->PortList->Size + ctrl->BatteryList->Size;
+        pthread_mutex_unlock(&ctrl->CtrlMutex);
         return count;
     }
 };
 
-TEST_F(ReconcileTwoWorkers, TheSameClassIsRefreshedOnce) {
+/// Two workers, which may pass the gate at the end of the scope at the latest.
+struct WorkersAtAGate {
+    explicit WorkersAtAGate(const CMPIContext* creator) : first(creator, 0), second(creator, 1) {}
     Gate gate;
-    holdWalk("CIM_SASSATAPort", gate);
-    Worker first(ctx(), 0);
-    Worker second(ctx(), 1);
-    const GateOpener opener(gate);
+    Worker first, second;
+    GateOpener opener{gate};
+};
 
-    ASSERT_EQ(request(102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+TEST_F(ReconcileTwoWorkers, TheSameClassIsRefreshedOnce) {
+    WorkersAtAGate workers(ctx());
+    holdRefreshOfPorts(workers.gate);
     ASSERT_EQ(request(102), 0);
     // The other worker has taken the second request and waits for the class.
-    ASSERT_TRUE(comesTrue(
+    ASSERT_TRUE(eventually(
         [] { return timesLogged(LOG_DEBUG, "ProcessDeviceConfigChange, ENTER(102)...\n") == 2; }));
-    gate.open();
+    workers.gate.open();
     ASSERT_TRUE(workersComeToRest());
 
     EXPECT_EQ(walks().size(), 1u);
     EXPECT_EQ(CapturedSyslog::countContaining(", skip"), 1u);
-    first.stop();
-    second.stop();
+    workers.first.stop();
+    workers.second.stop();
     EXPECT_EQ(ports(), Ids{"P0"});
 }
 
 TEST_F(ReconcileTwoWorkers, DifferentClassesDoNotWaitForEachOther) {
-    Gate gate;
-    holdWalk("CIM_SASSATAPort", gate);
-    Worker first(ctx(), 0);
-    Worker second(ctx(), 1);
-    const GateOpener opener(gate);
-
-    ASSERT_EQ(request(102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    WorkersAtAGate workers(ctx());
+    holdRefreshOfPorts(workers.gate);
     ASSERT_EQ(request(103), 0);
-    EXPECT_TRUE(comesTrue([this] { return countOfLists() == 1; })) << "the battery";
-    gate.open();
-    EXPECT_TRUE(comesTrue([this] { return countOfLists() == 2; })) << "and the port";
+    EXPECT_TRUE(eventually([this] { return countOfLists() == 1; })) << "the battery";
+    workers.gate.open();
+    EXPECT_TRUE(eventually([this] { return countOfLists() == 2; })) << "and the port";
     ASSERT_TRUE(workersComeToRest());
 }
 
 TEST_F(ReconcileTwoWorkers, ReadersAreNotHeldUpByASlowWalk) {
     Gate gate;
-    holdWalk("CIM_SASSATAPort", gate);
     Worker worker(ctx(), 0);
     const GateOpener opener(gate);
-    ASSERT_EQ(request(102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    holdRefreshOfPorts(gate);
     EXPECT_EQ(held(), "P");
     gate.open();
     ASSERT_TRUE(workersComeToRest());

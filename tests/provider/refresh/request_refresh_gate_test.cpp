@@ -17,17 +17,23 @@ class RequestRefreshGate : public RefreshTest {
 protected:
     void SetUp() override {
         RefreshTest::SetUp();
-        ctrl_ = attach(newController("C0"));
+        ctrl = attach(newController("C0"));
         setAllUpdateTimes(kStart - 1000);
         ThreadActivityDone = 1;
         clearLog();
     }
     void setAllUpdateTimes(time_t time) {
-        for (auto field : kUpdateTimes) ctrl_->*field = time;
+        for (auto field : kUpdateTimes) ctrl->*field = time;
     }
-    int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl_, action); }
+    int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl, action); }
+    /// How many items are in the queue when the ports have been asked for at that time too.
+    unsigned int queuedAfterRequestAt(time_t time) {
+        VirtualClock::set(time);
+        request(102);
+        return queuedItems();
+    }
 
-    RaidController_t* ctrl_ = nullptr;
+    RaidController_t* ctrl = nullptr;
 };
 
 TEST_F(RequestRefreshGate, EntryIsTracedFirst) {
@@ -62,7 +68,7 @@ TEST_F(RequestRefreshGate, LooksUnderTheWorkersMutexWhetherTheInventoryIsDone) {
     ThreadActivityDone = 0;
     pthread_mutex_lock(&PlexorThreadMutex);
     auto answer = std::async(std::launch::async, [this] { return request(102); });
-    EXPECT_TRUE(comesTrue([] {
+    EXPECT_TRUE(eventually([] {
         return loggedOnce(LOG_DEBUG, "HandleDeviceConfigChange: ENTER. ctrl C0, action 102\n");
     }));
     EXPECT_EQ(answer.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
@@ -85,7 +91,7 @@ TEST_F(RequestRefreshGate, WrongActionsAreIgnored) {
 }
 
 TEST_F(RequestRefreshGate, SkipLineShowsBothTimes) {
-    ctrl_->VolumeUpdateTime = kStart - 19;
+    ctrl->VolumeUpdateTime = kStart - 19;
     EXPECT_EQ(request(101), 0);
     EXPECT_EQ(queuedItems(), 0u);
     EXPECT_EQ(CapturedSyslog::lines().size(), 2u);
@@ -95,31 +101,21 @@ TEST_F(RequestRefreshGate, SkipLineShowsBothTimes) {
 }
 
 TEST_F(RequestRefreshGate, DueFromTheIntervalOn) {
-    ctrl_->PortUpdateTime = kStart;
-    VirtualClock::set(kStart + 19);
-    request(102);
-    EXPECT_EQ(queuedItems(), 0u);
-    VirtualClock::set(kStart + 20);
-    request(102);
-    EXPECT_EQ(queuedItems(), 1u);
-    VirtualClock::set(kStart + 21);
-    request(102);
-    EXPECT_EQ(queuedItems(), 2u);
+    ctrl->PortUpdateTime = kStart;
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 19), 0u);
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 20), 1u);
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 21), 2u);
 }
 
 TEST_F(RequestRefreshGate, AnotherIntervalMovesTheLimit) {
     StateUpdateInterval = 45;
-    ctrl_->PortUpdateTime = kStart;
-    VirtualClock::set(kStart + 44);
-    request(102);
-    EXPECT_EQ(queuedItems(), 0u);
-    VirtualClock::set(kStart + 45);
-    request(102);
-    EXPECT_EQ(queuedItems(), 1u);
+    ctrl->PortUpdateTime = kStart;
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 44), 0u);
+    EXPECT_EQ(queuedAfterRequestAt(kStart + 45), 1u);
 }
 
 TEST_F(RequestRefreshGate, UpdateTimeInTheFutureIsNotDue) {
-    ctrl_->BatteryUpdateTime = kStart + 3600;
+    ctrl->BatteryUpdateTime = kStart + 3600;
     EXPECT_EQ(request(103), 0);
     EXPECT_EQ(queuedItems(), 0u);
     EXPECT_TRUE(loggedOnce(LOG_DEBUG,
@@ -128,25 +124,25 @@ TEST_F(RequestRefreshGate, UpdateTimeInTheFutureIsNotDue) {
 }
 
 TEST_F(RequestRefreshGate, NeverRefreshedIsDue) {
-    ctrl_->DiskUpdateTime = 0;
+    ctrl->DiskUpdateTime = 0;
     EXPECT_EQ(request(100), 0);
     EXPECT_EQ(queuedItems(), 1u);
 }
 
 TEST_F(RequestRefreshGate, TheRequestItselfMovesNoUpdateTime) {
     for (int action = 100; action <= 105; action++) request(action);
-    for (auto field : kUpdateTimes) EXPECT_EQ(ctrl_->*field, kStart - 1000);
+    for (auto field : kUpdateTimes) EXPECT_EQ(ctrl->*field, kStart - 1000);
 }
 
 TEST_F(RequestRefreshGate, TakesNoLockOfTheController) {
     pthread_mutex_t* const mutexes[] = {
-        &ctrl_->CtrlMutex,       &ctrl_->DiskCfgMutex, &ctrl_->VolumeCfgMutex, &ctrl_->PortCfgMutex,
-        &ctrl_->BatteryCfgMutex, &ctrl_->PoolCfgMutex, &ctrl_->ChassisCfgMutex};
+        &ctrl->CtrlMutex,       &ctrl->DiskCfgMutex, &ctrl->VolumeCfgMutex, &ctrl->PortCfgMutex,
+        &ctrl->BatteryCfgMutex, &ctrl->PoolCfgMutex, &ctrl->ChassisCfgMutex};
     for (pthread_mutex_t* mutex : mutexes) pthread_mutex_lock(mutex);
     auto done = std::async(std::launch::async, [this] {
         for (int action = 100; action <= 105; action++) request(action);
     });
-    const auto status = done.wait_for(std::chrono::seconds(5));
+    const auto status = done.wait_for(kGenerousLimit);
     for (pthread_mutex_t* mutex : mutexes) pthread_mutex_unlock(mutex);
     EXPECT_EQ(status, std::future_status::ready);
     EXPECT_EQ(queuedItems(), 6u);
@@ -172,14 +168,14 @@ class RequestRefreshTimes : public RequestRefreshGate,
                             public ::testing::WithParamInterface<ActionTime> {};
 
 TEST_P(RequestRefreshTimes, ItsOwnTimeTurnsItDown) {
-    ctrl_->*GetParam().updateTime = kStart - 19;
+    ctrl->*GetParam().updateTime = kStart - 19;
     EXPECT_EQ(request(GetParam().action), 0);
     EXPECT_EQ(queuedItems(), 0u);
 }
 
 TEST_P(RequestRefreshTimes, NoOtherTimeTurnsItDown) {
     setAllUpdateTimes(kStart);
-    ctrl_->*GetParam().updateTime = kStart - 20;
+    ctrl->*GetParam().updateTime = kStart - 20;
     EXPECT_EQ(request(GetParam().action), 0);
     EXPECT_EQ(queuedItems(), 1u);
 }

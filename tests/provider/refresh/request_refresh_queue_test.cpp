@@ -10,11 +10,11 @@ class RequestRefreshQueue : public RefreshTest {
 protected:
     void SetUp() override {
         RefreshTest::SetUp();
-        ctrl_ = attach(newController("C0"));
+        ctrl = attach(newController("C0"));
         ThreadActivityDone = 1;
         clearLog();
     }
-    int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl_, action); }
+    int request(int action) { return HandleDeviceConfigChange(&mi, ctx(), ctrl, action); }
     Thread_Args_t* onlyItem() {
         EXPECT_EQ(queuedItems(), 1u);
         return static_cast<Thread_Args_t*>(GetItem(&__FIFO));
@@ -26,7 +26,7 @@ protected:
         clearLog();
     }
 
-    RaidController_t* ctrl_ = nullptr;
+    RaidController_t* ctrl = nullptr;
 };
 
 TEST_F(RequestRefreshQueue, ItemCarriesWhatTheWorkerNeeds) {
@@ -36,7 +36,7 @@ TEST_F(RequestRefreshQueue, ItemCarriesWhatTheWorkerNeeds) {
     EXPECT_EQ(item->Func, &DoDeviceConfigChange);
     EXPECT_EQ(item->Arg0, reinterpret_cast<uintptr_t>(&mi));
     EXPECT_EQ(item->Arg1, 0u);
-    EXPECT_EQ(item->Arg2, reinterpret_cast<uintptr_t>(ctrl_));
+    EXPECT_EQ(item->Arg2, reinterpret_cast<uintptr_t>(ctrl));
     EXPECT_EQ(item->Arg3, 101u);
     EXPECT_EQ(item->Arg4, 0u);
     EXPECT_EQ(item->Arg5, 0u);
@@ -59,7 +59,7 @@ TEST_F(RequestRefreshQueue, OneWorkerIsWokenWithoutTheMutex) {
 }
 
 TEST_F(RequestRefreshQueue, NobodyIsWokenForASkippedRequest) {
-    ctrl_->PortUpdateTime = kStart;
+    ctrl->PortUpdateTime = kStart;
     const WakeUpCounter wakeUps;
     ASSERT_EQ(request(102), 0);
     ThreadActivityDone = 0;
@@ -91,7 +91,7 @@ TEST_F(RequestRefreshQueue, FullQueueDropsTheRequest) {
     EXPECT_EQ(queuedItems(), 20u);
     EXPECT_EQ(WakeUpCounter::signals() + WakeUpCounter::broadcasts(), 0);
     EXPECT_EQ(CapturedSyslog::lines().back().text, "HandleDeviceConfigChange, exit...\n");
-    EXPECT_EQ(ctrl_->PortUpdateTime, 0);
+    EXPECT_EQ(ctrl->PortUpdateTime, 0);
 }
 
 TEST_F(RequestRefreshQueue, NoMemoryForTheItemQueuesNothing) {
@@ -114,10 +114,9 @@ TEST_F(RequestRefreshQueue, NoMemoryInTheQueueIsAnswered) {
 }
 
 TEST_F(RequestRefreshQueue, WorkFunctionRefreshesWhatTheItemNames) {
-    VendorObjects vendor(repository);
     const VendorController array = vendor.controller("C0");
     vendor.battery(array, "B0");
-    ctrl_->ControllerOp = clonedPath(array.system);
+    ctrl->ControllerOp = clonedPath(array.system);
     ASSERT_EQ(request(103), 0);
     Thread_Args_t* const item = onlyItem();
     clearLog();
@@ -126,18 +125,17 @@ TEST_F(RequestRefreshQueue, WorkFunctionRefreshesWhatTheItemNames) {
 
     EXPECT_TRUE(loggedOnce(LOG_DEBUG, "ProcessDeviceConfigChange, ENTER(103)...\n"));
     EXPECT_EQ(associatorQueries(), std::vector<std::string>{"CIM_SystemDevice>CIM_Battery"});
-    EXPECT_EQ(ctrl_->BatteryList->Size, 1u);
+    EXPECT_EQ(ctrl->BatteryList->Size, 1u);
 }
 
 TEST_F(RequestRefreshQueue, AWorkerRefreshesWithItsOwnContext) {
-    VendorObjects vendor(repository);
     const VendorController array = vendor.controller("C0");
     vendor.battery(array, "B0");
-    ctrl_->ControllerOp = clonedPath(array.system);
+    ctrl->ControllerOp = clonedPath(array.system);
     Worker worker(ctx());
 
     ASSERT_EQ(request(103), 0);
-    ASSERT_TRUE(comesTrue([&] { return books().count(testbed::Entry::ContextFlush) == 1; }));
+    ASSERT_TRUE(eventually([&] { return books().count(testbed::Entry::ContextFlush) == 1; }));
     ASSERT_TRUE(workersComeToRest());
     worker.stop();
 
@@ -145,7 +143,7 @@ TEST_F(RequestRefreshQueue, AWorkerRefreshesWithItsOwnContext) {
     const auto queries = books().queries();
     ASSERT_FALSE(queries.empty());
     for (const auto& query : queries) EXPECT_NE(query.thread, std::this_thread::get_id());
-    EXPECT_EQ(ctrl_->BatteryList->Size, 1u);
+    EXPECT_EQ(ctrl->BatteryList->Size, 1u);
 }
 
 }  // namespace

@@ -132,9 +132,9 @@ TEST_F(StopChecks, ThePoolWalkEndsAtTheRunningPool) {
     for (const char* id : {"L0", "L1", "L2"}) addPool(id);
     {
         const StopAtLine stop("BuildSinglePoolInfo: pool ");
-        EXPECT_EQ(BuildPoolInfo(&mi, ctx(), ctrl_), 0);
+        EXPECT_EQ(BuildPoolInfo(&mi, ctx(), ctrl), 0);
     }
-    EXPECT_EQ(ctrl_->PoolList->Size, 1u);
+    EXPECT_EQ(ctrl->PoolList->Size, 1u);
 }
 
 TEST_F(StopChecks, TheChainEndsAtTheRunningClass) {
@@ -145,16 +145,16 @@ TEST_F(StopChecks, TheChainEndsAtTheRunningClass) {
     EXPECT_EQ(linesWith(": Action 104, "), 1u);
     EXPECT_EQ(linesWith(": Action 100, "), 0u);
     EXPECT_EQ(linesWith(": Action 101, "), 0u);
-    EXPECT_EQ(ctrl_->PoolUpdateTime, kStart);
-    EXPECT_EQ(ctrl_->DiskUpdateTime, 0) << "not even as if it had been tried";
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, 0);
+    EXPECT_EQ(ctrl->PoolUpdateTime, kStart);
+    EXPECT_EQ(ctrl->DiskUpdateTime, 0) << "not even as if it had been tried";
+    EXPECT_EQ(ctrl->VolumeUpdateTime, 0);
 }
 
 TEST_F(StopChecks, TheDeviceWalkQueuesNothingMore) {
     for (const char* id : {"P0", "P1", "P2"}) addPort(id);
     {
         const StopAtLine stop("Added to FIFO: ", 2);
-        EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
+        EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl), 0);
     }
     EXPECT_EQ(queuedItems(), 2u);
     EXPECT_EQ(linesWith("BuildLogicalDeviceInfo: (2)"), 2u);
@@ -170,7 +170,7 @@ TEST_F(StopChecks, TheWaitForTheQueueToDrainEnds) {
         EXPECT_TRUE(sleeps != 3 || quiesceWorkers());
         if (sleeps == 50) ReleaseDeviceItem(static_cast<Thread_Args_t*>(GetItem(&__FIFO)));
     });
-    EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
+    EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl), 0);
     EXPECT_EQ(sleeps, 3);
     EXPECT_EQ(queuedItems(), 1u);
 }
@@ -183,7 +183,7 @@ TEST_F(StopChecks, TheWaitForRoomInTheQueueEndsAndTheDeviceIsDropped) {
         EXPECT_TRUE(sleeps != 3 || quiesceWorkers());
         if (sleeps >= 50) ReleaseDeviceItem(static_cast<Thread_Args_t*>(GetItem(&__FIFO)));
     });
-    EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl_), 0);
+    EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl), 0);
     EXPECT_EQ(sleeps, 3);
     EXPECT_EQ(linesWith("FIFO full, waiting..."), 3u);
     EXPECT_EQ(queuedItems(), 20u);
@@ -192,7 +192,7 @@ TEST_F(StopChecks, TheWaitForRoomInTheQueueEndsAndTheDeviceIsDropped) {
 
 TEST_F(StopChecks, TheInventoryEndsWithTheRunningController) {
     RaidController_t* const second = attach(newController("C1"));
-    second->ControllerOp = clonedPath(vendor_.controller("C1").system);
+    second->ControllerOp = clonedPath(vendor.controller("C1").system);
     faults().add(stopDuring("CIM_Chassis"));
     buildInventory();
     EXPECT_TRUE(StopRequested());

@@ -1,42 +1,17 @@
 // How a logical volume's name is composed.
-#include <string>
-
-#include "PlexorProviderIfc.h"
-#include "owned_text.h"
-#include "provider_fixture.h"
-#include "render_recorder.h"
+#include "render_volume_fixture.h"
 
 namespace plexortest {
 namespace {
 
-class RenderVolumeName : public ProviderTest {
+class RenderVolumeName : public RenderVolumeTest {
 protected:
-    void SetUp() override {
-        ProviderTest::SetUp();
-        ctrl = attach(newController("C0"));
-        volume = attach(ctrl, newVolume("1"));
-        setText(volume->RaidLevel, nullptr);
-        setText(volume->ElementName, nullptr);
-    }
-    /// The volume's pool with those drives, which have records.
-    StoragePool_t* givePool(std::initializer_list<const char*> drives) {
-        StoragePool_t* pool = attach(ctrl, newPool("pool1"));
-        setText(volume->FromPool, "pool1");
-        for (const char* id : drives) {
-            attach(ctrl, newDisk(id));
-            addMember(pool, id);
-        }
-        return pool;
-    }
     /// The name, which is the caption too.
     std::string name() {
-        const std::vector<PropertyCall> rows = rowsOf(FillVolumeInstance, ctrl, volume);
-        EXPECT_EQ(valueOf(rows, "ElementName"), valueOf(rows, "Caption"));
-        return valueOf(rows, "ElementName");
+        const std::vector<PropertyCall> set = rows();
+        EXPECT_EQ(valueOf(set, "ElementName"), valueOf(set, "Caption"));
+        return valueOf(set, "ElementName");
     }
-
-    RaidController_t* ctrl = nullptr;
-    StorageVolume_t* volume = nullptr;
 };
 
 TEST_F(RenderVolumeName, RaidLevelAndElementNameComeFirstWhenKnown) {

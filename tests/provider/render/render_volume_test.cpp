@@ -1,22 +1,13 @@
 // The properties of a logical volume; its name is tested in render_volume_name_test.cpp.
-#include <string>
-
-#include "PlexorProviderIfc.h"
-#include "owned_text.h"
-#include "provider_fixture.h"
-#include "render_recorder.h"
+#include "render_volume_fixture.h"
 
 namespace plexortest {
 namespace {
 
-class RenderVolume : public ProviderTest {
+class RenderVolume : public RenderVolumeTest {
 protected:
     void SetUp() override {
-        ProviderTest::SetUp();
-        ctrl = attach(newController("C0"));
-        volume = attach(ctrl, newVolume("1"));
-        setText(volume->RaidLevel, nullptr);
-        setText(volume->ElementName, nullptr);
+        RenderVolumeTest::SetUp();
         setText(volume->Name, "600508B1001C");
         volume->OperationalStatus = 2;
         volume->NameFormat = 9;
@@ -31,66 +22,40 @@ protected:
         volume->PackageRedundancy = 77;
         volume->ExtentStripeLength = 78;
     }
-    std::vector<PropertyCall> rows() { return rowsOf(FillVolumeInstance, ctrl, volume); }
-    std::string value(const char* name) { return valueOf(rows(), name); }
-
-    RaidController_t* ctrl = nullptr;
-    StorageVolume_t* volume = nullptr;
+    /// What is set for the volume as it is after SetUp when that is its name.
+    static std::vector<PropertyCall> rowsWithName(const std::string& name) {
+        return {
+            charsRow("ElementName", name),
+            charsRow("Caption", name),
+            uint16ArrayRow("OperationalStatus", 2),
+            uint16Row("HealthState", 5),
+            uint16Row("NameFormat", 9),
+            charsRow("Name", "600508B1001C"),
+            uint16Row("NameNameSpace", 2),
+            uint64Row("BlockSize", 512),
+            uint64Row("NumberOfBlocks", 4000000000),
+            uint64Row("ConsumableBlocks", 3999999999),
+            booleanRow("IsBasedOnUnderlyingRedundancy", true),
+            booleanRow("NoSinglePointOfFailure", true),
+            uint16Row("DataRedundancy", 2),
+            uint8Row("DeltaReservation", 100),
+            booleanRow("Primordial", false),
+            uint16ArrayRow("ExtentStatus", 14),
+        };
+    }
 };
 
 TEST_F(RenderVolume, SetsEveryPropertyInOrder) {
-    StoragePool_t* pool = attach(ctrl, newPool("pool1"));
-    for (const char* id : {"d1", "d2"}) {
-        attach(ctrl, newDisk(id));
-        addMember(pool, id);
-    }
-    setText(volume->FromPool, "pool1");
+    givePool({"d1", "d2"});
     setText(volume->RaidLevel, "RAID1");
     setText(volume->ElementName, "data");
-    const std::string name =
-        "RAID1 data Logical Volume 1 on controller C0, Drives(d1,d2) - OPTIMAL";
-    const std::vector<PropertyCall> expected = {
-        charsRow("ElementName", name),
-        charsRow("Caption", name),
-        uint16ArrayRow("OperationalStatus", 2),
-        uint16Row("HealthState", 5),
-        uint16Row("NameFormat", 9),
-        charsRow("Name", "600508B1001C"),
-        uint16Row("NameNameSpace", 2),
-        uint64Row("BlockSize", 512),
-        uint64Row("NumberOfBlocks", 4000000000),
-        uint64Row("ConsumableBlocks", 3999999999),
-        booleanRow("IsBasedOnUnderlyingRedundancy", true),
-        booleanRow("NoSinglePointOfFailure", true),
-        uint16Row("DataRedundancy", 2),
-        uint8Row("DeltaReservation", 100),
-        booleanRow("Primordial", false),
-        uint16ArrayRow("ExtentStatus", 14),
-    };
-    EXPECT_EQ(expected, rows());
+    EXPECT_EQ(rowsWithName("RAID1 data Logical Volume 1 on controller C0, Drives(d1,d2) - OPTIMAL"),
+              rows());
 }
 
 TEST_F(RenderVolume, WithoutPoolAllPropertiesAreSetAndOneErrorIsLogged) {
-    const std::vector<PropertyCall> expected = {
-        charsRow("ElementName", "Logical Volume 1 on controller C0 - OPTIMAL"),
-        charsRow("Caption", "Logical Volume 1 on controller C0 - OPTIMAL"),
-        uint16ArrayRow("OperationalStatus", 2),
-        uint16Row("HealthState", 5),
-        uint16Row("NameFormat", 9),
-        charsRow("Name", "600508B1001C"),
-        uint16Row("NameNameSpace", 2),
-        uint64Row("BlockSize", 512),
-        uint64Row("NumberOfBlocks", 4000000000),
-        uint64Row("ConsumableBlocks", 3999999999),
-        booleanRow("IsBasedOnUnderlyingRedundancy", true),
-        booleanRow("NoSinglePointOfFailure", true),
-        uint16Row("DataRedundancy", 2),
-        uint8Row("DeltaReservation", 100),
-        booleanRow("Primordial", false),
-        uint16ArrayRow("ExtentStatus", 14),
-    };
     CapturedSyslog::clear();
-    EXPECT_EQ(expected, rows());
+    EXPECT_EQ(rowsWithName("Logical Volume 1 on controller C0 - OPTIMAL"), rows());
     const std::vector<std::string> errors = {
         "FillVolumeInstance: Cannot get physical drive info for logical volume 1\n"};
     EXPECT_EQ(errors, CapturedSyslog::linesAt(LOG_ERR));

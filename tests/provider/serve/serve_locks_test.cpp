@@ -158,7 +158,7 @@ template <class Ask>
 bool endsWhileHeld(pthread_mutex_t& mutex, Ask ask) {
     pthread_mutex_lock(&mutex);
     auto answer = std::async(std::launch::async, ask);
-    const bool ended = answer.wait_for(std::chrono::seconds(5)) == std::future_status::ready;
+    const bool ended = answer.wait_for(kGenerousLimit) == std::future_status::ready;
     pthread_mutex_unlock(&mutex);
     EXPECT_EQ(CMPI_RC_OK, answer.get().rc);
     return ended;

@@ -6,7 +6,6 @@
 
 #include <algorithm>
 #include <atomic>
-#include <chrono>
 #include <string>
 #include <thread>
 #include <vector>
@@ -26,18 +25,6 @@ public:
     WorkersHeld(const WorkersHeld&) = delete;
     WorkersHeld& operator=(const WorkersHeld&) = delete;
 };
-
-/// Really waits until the condition holds; false when it does not within a minute, which a machine
-/// under load may need.
-template <class Condition>
-bool soon(Condition condition) {
-    const auto limit = std::chrono::steady_clock::now() + std::chrono::minutes(1);
-    while (!condition()) {
-        if (std::chrono::steady_clock::now() > limit) return false;
-        std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    }
-    return true;
-}
 
 /// Where both workers meet: proof that each has come as far as taking work.
 class WorkersMeet {
@@ -61,7 +48,7 @@ public:
     }
     /// Waits until the queue is empty and no worker is active.
     static bool untilIdle() {
-        return soon([] {
+        return eventually([] {
             const WorkersHeld held;
             return IsFifoEmpty(&__FIFO) && ActiveThreads == 0;
         });
@@ -79,7 +66,7 @@ private:
     static void arrive(CMPIContext*, void* item) {
         free(item);
         ++arrived();
-        soon([] { return arrived() >= expected(); });
+        eventually([] { return arrived() >= expected(); });
     }
 };
 
@@ -140,7 +127,7 @@ protected:
 
     /// Waits until the initial inventory has been taken.
     static bool inventoryTaken() {
-        return soon([] {
+        return eventually([] {
             const WorkersHeld held;
             return ThreadActivityDone == 1;
         });

@@ -1,14 +1,43 @@
-// Captured log lines in a form that a test can spell out: priority in front, addresses by name.
+// Log lines in forms that a test can spell out: as they are, or as texts with the priority in front
+// and addresses by name.
 #pragma once
 
 #include <cstdlib>
 #include <string>
+#include <thread>
 #include <utility>
 #include <vector>
 
 #include "captured_syslog.h"
 
 namespace plexortest {
+
+inline LogLine debugLine(std::string text) {
+    return {LOG_DEBUG, std::move(text)};
+}
+inline LogLine infoLine(std::string text) {
+    return {LOG_INFO, std::move(text)};
+}
+inline LogLine warningLine(std::string text) {
+    return {LOG_WARNING, std::move(text)};
+}
+inline LogLine errorLine(std::string text) {
+    return {LOG_ERR, std::move(text)};
+}
+
+/// The calling thread's lines without those of the lists and of released records.
+inline std::vector<LogLine> inventoryLog() {
+    constexpr const char* kListLines[] = {"Adding data ",  "Data ", "Removing data ",
+                                          "Freeing list ", "List ", "PutItem: Fifo("};
+    std::vector<LogLine> found;
+    for (const LogLine& line : CapturedSyslog::lines()) {
+        bool skipped =
+            line.thread != std::this_thread::get_id() || line.text.ends_with(" deleted\n");
+        for (const char* start : kListLines) skipped = skipped || line.text.starts_with(start);
+        if (!skipped) found.push_back(line);
+    }
+    return found;
+}
 
 /// Names for the addresses that a test knows.
 using AddressNames = std::vector<std::pair<const void*, std::string>>;

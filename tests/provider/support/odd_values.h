@@ -14,6 +14,11 @@ struct OddValue {
     std::optional<testbed::CimValue> value;  ///< none: the property is missing
 };
 
+/// What is of no use in place of a text, a number or an array.
+inline testbed::CimValue oddReference() {
+    return testbed::CimValue::reference({"root/sample", "CIM_ManagedElement", {}});
+}
+
 /// In place of a number or truth value.
 inline std::vector<OddValue> oddNumbers() {
     using testbed::CimValue;
@@ -24,7 +29,9 @@ inline std::vector<OddValue> oddNumbers() {
             {"null text", CimValue::null(CMPI_string)},
             {"array", CimValue::uint16Array({17})},
             {"null array", CimValue::null(CMPI_uint16A)},
-            {"real", CimValue::real64(17)}};
+            {"array of texts", CimValue::stringArray({"17"})},
+            {"real", CimValue::real64(17)},
+            {"reference", oddReference()}};
 }
 
 /// In place of a text.
@@ -32,11 +39,15 @@ inline std::vector<OddValue> oddTexts() {
     using testbed::CimValue;
     return {{"missing", {}},
             {"null", CimValue::null(CMPI_string)},
+            {"null without type", CimValue::null(CMPI_null)},
             {"null number", CimValue::null(CMPI_uint16)},
             {"number", CimValue::uint32(17)},
             {"large number", CimValue::uint64(0xDEAD'BEEF'DEAD'BEEF)},
             {"truth value", CimValue::boolean(true)},
-            {"array of texts", CimValue::stringArray({"text"})}};
+            {"real", CimValue::real64(1.5)},
+            {"array of texts", CimValue::stringArray({"text"})},
+            {"array of numbers", CimValue::uint16Array({17})},
+            {"reference", oddReference()}};
 }
 
 /// In place of an array of numbers.
@@ -49,17 +60,8 @@ inline std::vector<OddValue> oddArrays() {
             {"array of texts", CimValue::stringArray({"17"})},
             {"number", CimValue::uint16(17)},
             {"large number", CimValue::uint64(0xDEAD'BEEF'DEAD'BEEF)},
-            {"text", CimValue::string("17")}};
-}
-
-/// Gives an object that value of a property.
-inline void give(testbed::Repository& repository, const testbed::ObjectPath& path,
-                 const std::string& property, const OddValue& odd) {
-    if (odd.value) {
-        repository.setProperty(path, property, *odd.value);
-    } else {
-        repository.eraseProperty(path, property);
-    }
+            {"text", CimValue::string("17")},
+            {"reference", oddReference()}};
 }
 
 }  // namespace plexortest

@@ -8,9 +8,7 @@
 #include <vector>
 
 #include "PlexorProviderCfg.h"
-#include "provider_fixture.h"
-#include "query_arguments.h"
-#include "vendor_objects.h"
+#include "vendor_fixture.h"
 
 namespace plexortest {
 
@@ -21,7 +19,7 @@ inline constexpr bool kContextHasFlush = true;
 inline constexpr bool kContextHasFlush = false;
 #endif
 
-class RefreshTest : public ProviderTest {
+class RefreshTest : public VendorTest {
 protected:
     static void clearLog() { CapturedSyslog::clear(); }
 

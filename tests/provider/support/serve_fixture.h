@@ -1,6 +1,7 @@
 // An inventory that requests are answered from, and the requests.
 #pragma once
 
+#include <functional>
 #include <string>
 #include <vector>
 
@@ -81,6 +82,29 @@ protected:
              {"SystemName", testbed::CimValue::string("host1.example")},
              {"CreationClassName", testbed::CimValue::string(className)},
              {"DeviceID", testbed::CimValue::string(deviceIdKey)}}};
+    }
+
+    /// Caches devices of each class under two controllers and has `ask` enumerate them, which gets
+    /// the class and the paths in their order. Every answer is whole, and asks for refreshes.
+    static void enumerateDevices(
+        const std::function<testbed::Response(
+            const DeviceClass& device, const std::vector<testbed::ObjectPath>& expected)>& ask) {
+        RaidController_t* first = attach(newController("C1"));
+        RaidController_t* second = attach(newController("C0"));
+        for (const DeviceClass& device : kDeviceClasses) {
+            for (const char* id : {"d2", "d1", "d10"}) device.cache(first, id);
+            device.cache(second, "d1");
+            CapturedSyslog::clear();
+            const testbed::Response response =
+                ask(device, {devicePath(device, "C1", "d2"), devicePath(device, "C1", "d1"),
+                             devicePath(device, "C1", "d10"), devicePath(device, "C0", "d1")});
+            EXPECT_EQ(CMPI_RC_OK, response.rc);
+            EXPECT_FALSE(response.message);
+            EXPECT_EQ(1, response.doneCalls);
+            const std::vector<std::string> refreshes = {refreshRequest("C1", device.action),
+                                                        refreshRequest("C0", device.action)};
+            EXPECT_EQ(refreshes, refreshRequests());
+        }
     }
 
     /// Path texts, which show namespace, class, and the keys in their order.

@@ -5,31 +5,15 @@
 #include <stdlib.h>
 
 #include <atomic>
-#include <chrono>
 #include <condition_variable>
 #include <deque>
 #include <functional>
 #include <mutex>
-#include <thread>
 
 #include "PlexorProviderCfg.h"
+#include "eventually.h"
 
 namespace plexortest {
-
-/// What a test waits for something that is to come: long, since the machine may be a slow one,
-/// under load, with a sanitizer.
-inline constexpr std::chrono::minutes kGenerousLimit{1};
-
-/// Polls until the condition holds; false when it does not within the limit.
-template <class Condition>
-bool comesTrue(Condition condition) {
-    const auto limit = std::chrono::steady_clock::now() + kGenerousLimit;
-    while (!condition()) {
-        if (std::chrono::steady_clock::now() > limit) return false;
-        std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    }
-    return true;
-}
 
 /// The quiet stop with the limit of a cleanup that does not terminate.
 inline bool quiesceWorkers() {
@@ -159,7 +143,7 @@ public:
         pthread_mutex_lock(&PlexorThreadMutex);
         TerminateThread = 1;
         pthread_mutex_unlock(&PlexorThreadMutex);
-        comesTrue([this] {
+        eventually([this] {
             pthread_cond_broadcast(&PlexorThreadCond);
             return ended();
         });
@@ -207,7 +191,7 @@ inline unsigned int queuedItems() {
 
 /// True once the queue is empty and every worker waits.
 inline bool workersComeToRest() {
-    return comesTrue([] { return queuedItems() == 0 && activeThreads() == 0; });
+    return eventually([] { return queuedItems() == 0 && activeThreads() == 0; });
 }
 
 }  // namespace plexortest

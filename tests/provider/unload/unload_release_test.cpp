@@ -191,7 +191,7 @@ TEST_F(UnloadReleaseTest, WaitsForTheWorkThatIsRunning) {
         if (line.text.starts_with("Controller Model C0")) freed = true;
     });
     std::thread manager([&] { client.cleanup(true); });
-    EXPECT_TRUE(plexortest::soon(
+    EXPECT_TRUE(plexortest::eventually(
         [] { return CapturedSyslog::count("PlexorProviderCleanup: ENTER...\n") == 1; }));
     std::this_thread::sleep_for(std::chrono::milliseconds(20));
     EXPECT_FALSE(freed);

@@ -67,12 +67,12 @@ TEST_F(LivesTest, TheSecondServesAndRefreshesCompletely) {
     EXPECT_EQ(plexortest::threadActivityDone(), 1u) << "kept for whoever looks at it";
 
     callFactory();
-    EXPECT_TRUE(plexortest::soon([this] { return drives().instances.size() == 1; }));
-    EXPECT_TRUE(plexortest::soon([] { return times("DoBuildDeviceInfoAsync done.") == 2; }));
+    EXPECT_TRUE(plexortest::eventually([this] { return drives().instances.size() == 1; }));
+    EXPECT_TRUE(plexortest::eventually([] { return times("DoBuildDeviceInfoAsync done.") == 2; }));
     vendor.battery(vendor.controller("C0"), "b2");
     VirtualClock::advance(100);
     testbed::InstanceClient client(broker, &mi);
-    EXPECT_TRUE(plexortest::soon(
+    EXPECT_TRUE(plexortest::eventually(
         [&] { return client.enumerateInstances("Tovexa_PlexorBattery").instances.size() == 2; }));
     EXPECT_EQ(TerminateThread, 1u);
 }
@@ -109,7 +109,7 @@ TEST_F(LivesTest, TheSecondIsCompleteBesideAStuckWorkerOfTheFirst) {
     EXPECT_GT(given, 0u);
 
     callFactory();
-    ASSERT_TRUE(plexortest::soon([] { return times("DoBuildDeviceInfoAsync done.") == 2; }))
+    ASSERT_TRUE(plexortest::eventually([] { return times("DoBuildDeviceInfoAsync done.") == 2; }))
         << "the stuck worker is not waited for";
     EXPECT_EQ(drives().instances.size(), 1u);
     EXPECT_GT(books().liveClones(), given);
@@ -117,7 +117,7 @@ TEST_F(LivesTest, TheSecondIsCompleteBesideAStuckWorkerOfTheFirst) {
     // It comes back when the second life has long begun: it leaves, touching nothing.
     const std::size_t exits = CapturedSyslog::countContaining(" exiting...\n");
     gate_.open();
-    EXPECT_TRUE(plexortest::soon(
+    EXPECT_TRUE(plexortest::eventually(
         [&] { return CapturedSyslog::countContaining(" exiting...\n") == exits + 1; }));
     EXPECT_EQ(drives().instances.size(), 1u);
 }

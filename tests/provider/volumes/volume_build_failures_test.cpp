@@ -24,7 +24,8 @@ protected:
 };
 
 TEST_F(VolumeBuildFailures, SettingQueryFailingIsLoggedAndLivedWith) {
-    failQuery(Entry::Associators, "CIM_ElementSettingData", CMPI_RC_ERR_FAILED, "vendor is busy");
+    faults().add(along("CIM_ElementSettingData",
+                       refusal(Entry::Associators, CMPI_RC_ERR_FAILED, "vendor is busy")));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->RaidLevel, nullptr);
     EXPECT_STREQ(volume()->FromPool, "P1");
@@ -35,23 +36,21 @@ TEST_F(VolumeBuildFailures, SettingQueryFailingIsLoggedAndLivedWith) {
 }
 
 TEST_F(VolumeBuildFailures, SettingQueryAnsweringNullIsSilent) {
-    answerNull(Entry::Associators, "CIM_ElementSettingData");
+    faults().add(along("CIM_ElementSettingData", answerNull(Entry::Associators)));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->RaidLevel, nullptr);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
 }
 
 TEST_F(VolumeBuildFailures, SettingQueryFailingDespiteAResultIsNotUsed) {
-    testbed::FaultRule rule = queryRule(Entry::Associators, "CIM_ElementSettingData");
-    rule.rc = CMPI_RC_ERR_FAILED;
-    rule.keepResult = true;
-    faults().add(rule);
+    faults().add(along("CIM_ElementSettingData", refusalWithResult(Entry::Associators)));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->RaidLevel, nullptr);
 }
 
 TEST_F(VolumeBuildFailures, PoolQueryFailingTurnsTheVolumeAway) {
-    failQuery(Entry::AssociatorNames, "CIM_AllocatedFromStoragePool", CMPI_RC_ERR_NOT_FOUND, {});
+    faults().add(along("CIM_AllocatedFromStoragePool",
+                       refusal(Entry::AssociatorNames, CMPI_RC_ERR_NOT_FOUND, {})));
     expectTurnedAway();
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR),
                 ElementsAre("AssociatorNames " + kVolume +
@@ -63,9 +62,8 @@ TEST_F(VolumeBuildFailures, PoolQueryFailingTurnsTheVolumeAway) {
 
 // The pool was not asked for: nothing can be said of the volume, and nothing stays behind.
 TEST_F(VolumeBuildFailures, AStopBeforeThePoolQueryLeavesNothing) {
-    testbed::FaultRule rule = queryRule(Entry::Associators, "CIM_ElementSettingData");
-    rule.hook = [] { quiesceWorkers(); };
-    faults().add(rule);
+    faults().add(
+        along("CIM_ElementSettingData", watch(Entry::Associators, [] { quiesceWorkers(); })));
     EXPECT_EQ(buildVolume(), -1);
     expectNothingCached();
     EXPECT_EQ(books().count(Entry::AssociatorNames), 0u);
@@ -74,23 +72,20 @@ TEST_F(VolumeBuildFailures, AStopBeforeThePoolQueryLeavesNothing) {
 }
 
 TEST_F(VolumeBuildFailures, PoolQueryAnsweringNullTurnsTheVolumeAway) {
-    answerNull(Entry::AssociatorNames, "CIM_AllocatedFromStoragePool");
+    faults().add(along("CIM_AllocatedFromStoragePool", answerNull(Entry::AssociatorNames)));
     expectTurnedAway();
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), ElementsAre(kNoPool));
 }
 
 TEST_F(VolumeBuildFailures, PoolQueryFailingDespiteAResultTurnsTheVolumeAway) {
-    testbed::FaultRule rule = queryRule(Entry::AssociatorNames, "CIM_AllocatedFromStoragePool");
-    rule.rc = CMPI_RC_ERR_FAILED;
-    rule.keepResult = true;
-    faults().add(rule);
+    faults().add(along("CIM_AllocatedFromStoragePool", refusalWithResult(Entry::AssociatorNames)));
     expectTurnedAway();
 }
 
 TEST_F(VolumeBuildFailures, NoPoolTurnsTheVolumeAway) {
     repository.remove(poolPath_);
     expectTurnedAway();
-    Lines lines = logLines();
+    Texts lines = logLines();
     lines.erase(lines.begin(), lines.end() - 3);
     EXPECT_THAT(lines,
                 ElementsAre("DEBUG BuildVolumeInfo, CIM Query - AssociatorNames: " + kVolume +
@@ -126,7 +121,7 @@ TEST_F(VolumeBuildFailures, PoolWithoutAnIdentifierIsFoundAndStillTurnsTheVolume
 }
 
 TEST_F(VolumeBuildFailures, CloneMissingMeansNoPool) {
-    failClone(0);
+    faults().add(answerNull(Entry::Clone, 0));
     EXPECT_EQ(
         [&] {
             DeliberateLeaks leaks;
@@ -148,9 +143,9 @@ TEST_F(VolumeBuildFailures, ElementsOfAnotherTypeAreNeverFollowed) {
 }
 
 TEST_F(VolumeBuildFailures, AnElementOfAnotherTypeGivesWayToTheNext) {
-    const VendorVolume other = vendor.volume(card_, "V2", poolPath_, "RAID0");
+    const VendorVolume other = vendor.volume(card, "V2", poolPath_, "RAID0");
     vendor.tie("CIM_ElementSettingData", objects_.volume, other.setting);
-    vendor.tie("CIM_AllocatedFromStoragePool", vendor.pool(card_, "P2"), objects_.volume);
+    vendor.tie("CIM_AllocatedFromStoragePool", vendor.pool(card, "P2"), objects_.volume);
     const std::pair<const char*, const char*> expected[] = {{"RAID0", "P1"}, {"RAID6", "P2"}};
     for (int wrong = 0; wrong < 2; wrong++) {
         testbed::FaultRule rule;
@@ -163,7 +158,7 @@ TEST_F(VolumeBuildFailures, AnElementOfAnotherTypeGivesWayToTheNext) {
         ASSERT_EQ(buildVolume(), 0);
         EXPECT_STREQ(volume()->RaidLevel, expected[wrong].first);
         EXPECT_STREQ(volume()->FromPool, expected[wrong].second);
-        ASSERT_EQ(DeleteVolume(ctrl_, volume()), 0);
+        ASSERT_EQ(DeleteVolume(ctrl, volume()), 0);
     }
 }
 
@@ -201,8 +196,8 @@ const VolumeAllocation kVolumeAllocations[] = {
 
 class VolumeBuildMemory : public VolumeTest, public testing::WithParamInterface<VolumeAllocation> {
 protected:
-    Lines complaints() {
-        Lines found;
+    Texts complaints() {
+        Texts found;
         for (std::string line : logLines()) {
             if (line.starts_with("DEBUG")) continue;
             for (const char* suffix : {" for volume ", " with volume "})
@@ -235,7 +230,7 @@ TEST_P(VolumeBuildMemory, HasThisOutcome) {
     EXPECT_EQ(volume()->RaidLevel == nullptr, label == "RaidLevel");
     EXPECT_STREQ(volume()->FromPool, "P1");
     EXPECT_EQ(volume()->OperationalStatus, 3);
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kStart);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kStart);
 }
 
 INSTANTIATE_TEST_SUITE_P(Volume, VolumeBuildMemory, testing::ValuesIn(kVolumeAllocations),
@@ -263,7 +258,7 @@ TEST_F(VolumeBuildFailures, ListFailureIsLoggedWithoutTheLock) {
         const auto fault = FailAllocation::nth(7);
         EXPECT_EQ(buildTurnedAway(), -2);
     }
-    Lines lines = logWithLock(names());
+    Texts lines = logWithLock(names());
     lines.erase(lines.begin(), lines.end() - 3);
     EXPECT_THAT(lines,
                 ElementsAre("held DEBUG Adding data <?> to the list <volumes> at the tail\n",
@@ -305,11 +300,11 @@ class VolumeBuildValues : public VolumeTest, public testing::WithParamInterface<
 TEST_P(VolumeBuildValues, CountAsZeroWhenOdd) {
     for (const OddValue& odd : GetParam().isArray ? oddArrays() : oddNumbers()) {
         SCOPED_TRACE(odd.label);
-        give(repository, objects_.volume, GetParam().property, odd);
+        give(objects_.volume, GetParam().property, odd);
         ASSERT_EQ(buildVolume(), 0);
         EXPECT_EQ(GetParam().value(volume()), 0u);
         EXPECT_STREQ(volume()->FromPool, "P1");
-        ASSERT_EQ(DeleteVolume(ctrl_, volume()), 0);
+        ASSERT_EQ(DeleteVolume(ctrl, volume()), 0);
     }
 }
 
@@ -319,14 +314,14 @@ INSTANTIATE_TEST_SUITE_P(Volume, VolumeBuildValues, testing::ValuesIn(kVolumeNum
 TEST_F(VolumeBuildFailures, OddTextsAreNull) {
     for (const OddValue& odd : oddTexts()) {
         SCOPED_TRACE(odd.label);
-        give(repository, objects_.volume, "ElementName", odd);
-        give(repository, objects_.volume, "Name", odd);
-        give(repository, objects_.setting, "ElementName", odd);
+        give(objects_.volume, "ElementName", odd);
+        give(objects_.volume, "Name", odd);
+        give(objects_.setting, "ElementName", odd);
         ASSERT_EQ(buildVolume(), 0);
         EXPECT_EQ(volume()->ElementName, nullptr);
         EXPECT_EQ(volume()->Name, nullptr);
         EXPECT_EQ(volume()->RaidLevel, nullptr);
-        ASSERT_EQ(DeleteVolume(ctrl_, volume()), 0);
+        ASSERT_EQ(DeleteVolume(ctrl, volume()), 0);
     }
 }
 

@@ -14,7 +14,7 @@ class VolumeBuild : public VolumeTest {};
 
 TEST_F(VolumeBuild, HoldsWhatTheVendorSays) {
     ASSERT_EQ(buildVolume(), 0);
-    ASSERT_EQ(ctrl_->VolumeList->Size, 1u);
+    ASSERT_EQ(ctrl->VolumeList->Size, 1u);
     EXPECT_EQ(testbed::Broker::toPath(volume()->VolumeOp), objects_.volume);
     EXPECT_STREQ(volume()->DeviceID, "V1");
     EXPECT_STREQ(volume()->ElementName, "Volume V1");
@@ -81,7 +81,7 @@ TEST_F(VolumeBuild, AsksTwoQueriesInOrder) {
 
 TEST_F(VolumeBuild, LogsEveryStepInOrder) {
     ASSERT_EQ(buildVolume(), 0);
-    const Lines expected = {
+    const Texts expected = {
         "DEBUG BuildVolumeInfo, ENTER...\n",
         "DEBUG BuildVolumeInfo, CIM Query - Associators: " + kVolume +
             " (assocClass: CIM_ElementSettingData, resultClass: CIM_StorageSetting)",
@@ -113,11 +113,11 @@ TEST_F(VolumeBuild, LogsEveryStepInOrder) {
 }
 
 TEST_F(VolumeBuild, StampsTheRecordBeforeThePoolIsAskedFor) {
-    whenCalled(Entry::Associators, [] { VirtualClock::advance(3); });
-    whenCalled(Entry::AssociatorNames, [] { VirtualClock::advance(40); });
+    faults().add(watch(Entry::Associators, [] { VirtualClock::advance(3); }));
+    faults().add(watch(Entry::AssociatorNames, [] { VirtualClock::advance(40); }));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->LastUpdateTime, kStart + 3);
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kStart + 43);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kStart + 43);
 }
 
 TEST_F(VolumeBuild, WithoutSettingHasNoRaidLevelAndSaysNothing) {
@@ -129,16 +129,16 @@ TEST_F(VolumeBuild, WithoutSettingHasNoRaidLevelAndSaysNothing) {
 }
 
 TEST_F(VolumeBuild, TakesTheFirstOfSeveralSettings) {
-    const VendorVolume other = vendor.volume(card_, "V2", {}, "RAID1");
+    const VendorVolume other = vendor.volume(card, "V2", {}, "RAID1");
     vendor.tie("CIM_ElementSettingData", objects_.volume, other.setting);
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_STREQ(volume()->RaidLevel, "RAID6");
 }
 
 TEST_F(VolumeBuild, TakesTheFirstOfSeveralPools) {
-    const Path second = vendor.pool(card_, "P2");
+    const Path second = vendor.pool(card, "P2");
     vendor.tie("CIM_AllocatedFromStoragePool", second, objects_.volume);
-    attach(ctrl_, newPool("P2"));
+    attach(ctrl, newPool("P2"));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_STREQ(volume()->FromPool, "P1");
     EXPECT_EQ(CapturedSyslog::countContaining("found a pool instance"), 1u);
@@ -146,7 +146,7 @@ TEST_F(VolumeBuild, TakesTheFirstOfSeveralPools) {
 
 TEST_F(VolumeBuild, TakesThePoolFromThePathWithoutLookingItUp) {
     repository.setProperty(poolPath_, "InstanceID", CimValue::string("property"));
-    StoragePool_t* pool = attach(ctrl_, newPool("P1"));
+    StoragePool_t* pool = attach(ctrl, newPool("P1"));
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_STREQ(volume()->FromPool, "P1");
     EXPECT_THAT(members(pool), IsEmpty());
@@ -159,17 +159,17 @@ TEST_F(VolumeBuild, HoldsTheLockForTheInsertionOnly) {
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_GT(watchedCalls_, 14);
     EXPECT_EQ(heldCalls_, 0);
-    Lines held;
+    Texts held;
     for (const std::string& line : logWithLock(names()))
         if (line.starts_with("held")) held.push_back(line);
     EXPECT_THAT(held,
                 ElementsAre("held DEBUG Adding data <volume> to the list <volumes> at the tail\n",
                             "held DEBUG Data <volume> added to the list <volumes>, size 1\n"));
-    EXPECT_TRUE(lockIsFree());
+    EXPECT_TRUE(isFree(ctrl->CtrlMutex));
 }
 
 TEST_F(VolumeBuild, NeedsNoInterface) {
-    EXPECT_EQ(BuildVolumeInfo(nullptr, ctx(), ctrl_, instanceAt(objects_.volume),
+    EXPECT_EQ(BuildVolumeInfo(nullptr, ctx(), ctrl, instanceAt(objects_.volume),
                               broker.makePath(objects_.volume)),
               0);
     EXPECT_NE(volume(), nullptr);

@@ -17,8 +17,8 @@ protected:
     void SetUp() override {
         using testbed::CimValue;
         DeviceTest::SetUp();
-        poolPath_ = vendor.pool(card_, "P1");
-        objects_ = vendor.volume(card_, "V1", poolPath_, "RAID6");
+        poolPath_ = vendor.pool(card, "P1");
+        objects_ = vendor.volume(card, "V1", poolPath_, "RAID6");
         const Path& path = objects_.volume;
         repository.setProperty(path, "NumberOfBlocks", CimValue::uint64(0x3'0000'0001));
         repository.setProperty(path, "ConsumableBlocks", CimValue::uint64(0x8000'0000'0000'0002));
@@ -43,18 +43,18 @@ protected:
         return update(CheckAndUpdateVolumeInfo, volume(), fresh);
     }
     int updateVolume() { return updateVolume(instanceAt(objects_.volume)); }
-    StorageVolume_t* volume() const { return firstOf<StorageVolume_t>(ctrl_->VolumeList); }
+    StorageVolume_t* volume() const { return firstOf<StorageVolume_t>(ctrl->VolumeList); }
 
     AddressNames names() const {
-        AddressNames known = {{ctrl_->VolumeList, "volumes"}};
+        AddressNames known = {{ctrl->VolumeList, "volumes"}};
         if (volume() != nullptr) known.emplace_back(volume(), "volume");
         return known;
     }
 
     void expectNothingCached() {
-        EXPECT_EQ(ctrl_->VolumeList->Size, 0u);
-        EXPECT_EQ(ctrl_->VolumeList->Head, nullptr);
-        EXPECT_EQ(ctrl_->VolumeUpdateTime, 0);
+        EXPECT_EQ(ctrl->VolumeList->Size, 0u);
+        EXPECT_EQ(ctrl->VolumeList->Head, nullptr);
+        EXPECT_EQ(ctrl->VolumeUpdateTime, 0);
     }
 
     VendorVolume objects_;

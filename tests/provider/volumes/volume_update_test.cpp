@@ -11,21 +11,18 @@ using testing::IsEmpty;
 
 class VolumeUpdate : public VolumeTest {
 protected:
-    static constexpr time_t kLater = kStart + 30;
-
     void SetUp() override {
         VolumeTest::SetUp();
         ASSERT_EQ(buildVolume(), 0);
-        VirtualClock::set(kLater);
-        forget();
+        goOnLater();
     }
 
     void set(const char* property, const CimValue& value) {
         repository.setProperty(objects_.volume, property, value);
     }
     /// The lines between entry and exit.
-    Lines changes() {
-        Lines lines = logLines(names());
+    Texts changes() {
+        Texts lines = logLines(names());
         EXPECT_GE(lines.size(), 2u);
         EXPECT_EQ(lines.back(), "DEBUG CheckAndUpdateVolumeInfo, exit\n");
         return {lines.begin() + 1, lines.end() - 1};
@@ -37,7 +34,7 @@ protected:
         EXPECT_EQ(volume()->ConsumableBlocks, 0x8000'0000'0000'0002u);
         EXPECT_STREQ(volume()->ElementName, "Volume V1");
         EXPECT_EQ(volume()->LastUpdateTime, kStart);
-        EXPECT_EQ(ctrl_->VolumeUpdateTime, kLater);
+        EXPECT_EQ(ctrl->VolumeUpdateTime, kLater);
     }
 
     const std::string kEnter = "DEBUG CheckAndUpdateVolumeInfo: ENTER. volume - Volume V1\n";
@@ -78,7 +75,7 @@ TEST_F(VolumeUpdate, OfAVolumeThatCannotBeFetchedOnlyStamps) {
 
 TEST_F(VolumeUpdate, OfAVolumeAnsweredNullOnlyStamps) {
     set("OperationalStatus", CimValue::uint16Array({6}));
-    answerNull(Entry::GetInstance, "");
+    faults().add(answerNull(Entry::GetInstance));
     ASSERT_EQ(updateVolume(nullptr), 0);
     EXPECT_THAT(logLines(), ElementsAre(kEnter, kGet, kExit));
     expectUnchanged();
@@ -151,7 +148,7 @@ TEST_P(VolumeUpdateChange, IsLoggedAndStoredOnce) {
     ASSERT_EQ(updateVolume(), 0);
     EXPECT_THAT(changes(), ElementsAre(GetParam().line));
     EXPECT_EQ(seen().properties, expected.properties);
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kLater);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kLater);
 
     CapturedSyslog::clear();
     ASSERT_EQ(updateVolume(), 0);
@@ -224,7 +221,7 @@ TEST_F(VolumeUpdate, LosesANameThatCannotBeCopied) {
                 ElementsAre("DEBUG CheckAndUpdateVolumeInfo: volume V1 element name changed. Old "
                             "name Volume V1, new name long name\n",
                             "WARNING strdup() failed to duplicate string long name\n"));
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kLater);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kLater);
 }
 
 TEST_F(VolumeUpdate, OwnsItsNewName) {
@@ -262,24 +259,19 @@ TEST_F(VolumeUpdate, NeverRefreshesWhatTheBuildRead) {
 
 TEST_F(VolumeUpdate, WaitsForTheLockWithTheInstanceInHand) {
     set("OperationalStatus", CimValue::uint16Array({6}));
-    whileLockIsTaken(
-        [&](const CMPIContext* context) {
-            EXPECT_EQ(CheckAndUpdateVolumeInfo(&mi, context, ctrl_, volume(), nullptr), 0);
-        },
-        [&] { return books().queries().size() == 1; },
-        [&] {
-            EXPECT_EQ(volume()->OperationalStatus, 3);
-            EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
-            EXPECT_EQ(ctrl_->VolumeUpdateTime, kStart);
-        });
+    updateWhileLockIsTaken(CheckAndUpdateVolumeInfo, volume(), nullptr, 1, [&] {
+        EXPECT_EQ(volume()->OperationalStatus, 3);
+        EXPECT_EQ(CapturedSyslog::countContaining("status changed"), 0u);
+        EXPECT_EQ(ctrl->VolumeUpdateTime, kStart);
+    });
     EXPECT_EQ(volume()->OperationalStatus, 6);
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kLater);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kLater);
 }
 
 TEST_F(VolumeUpdate, StampsAtTheEnd) {
-    whenCalled(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); });
+    faults().add(watch(Entry::InstanceGetProperty, [] { VirtualClock::advance(1); }));
     ASSERT_EQ(updateVolume(), 0);
-    EXPECT_EQ(ctrl_->VolumeUpdateTime, kLater + 5);
+    EXPECT_EQ(ctrl->VolumeUpdateTime, kLater + 5);
 }
 
 }  // namespace

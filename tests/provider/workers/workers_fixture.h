@@ -36,7 +36,7 @@ protected:
     void startWorkers(std::size_t count = 2) {
         running_ = started_ = true;
         InitPlexorThreads(ctx());
-        ASSERT_TRUE(comesTrue([&] {
+        ASSERT_TRUE(eventually([&] {
             return books().count(testbed::Entry::AttachThread) >= count && idleLines() >= count;
         }));
     }
@@ -52,7 +52,7 @@ protected:
     /// A worker that stays behind would go on in the next test.
     static void expectNobodyLeft() {
         EXPECT_EQ(workersLeft(), 0u);
-        comesTrue([] { return workersLeft() == 0; });
+        eventually([] { return workersLeft() == 0; });
     }
     /// Number of workers that could not be joined, after another try.
     static std::size_t workersLeft() {
@@ -81,9 +81,37 @@ protected:
         return ::testing::TempDir() + "plexor-hostconfig-" + std::to_string(getpid());
     }
 
+    /// Makes that many workers run an item that ends when the gate opens.
+    void occupyWorkers(int count, Gate& gate) {
+        for (int i = 0; i < count; i++) {
+            ASSERT_EQ(tasks_.queue([&gate](CMPIContext*, void*) { gate.pass(); }), 0);
+        }
+        ASSERT_TRUE(gate.awaitArrivals(count));
+    }
+
     bool running_ = false;  // to be stopped
     bool started_ = false;
     Tasks tasks_;
+};
+
+/// The workers' tests with one cached controller.
+class WorkersCardTest : public WorkersTest {
+protected:
+    void SetUp() override {
+        WorkersTest::SetUp();
+        card = vendor.controller("C0");
+        ctrl = attach(newController("C0"));
+        ctrl->ControllerOp = clonedPath(card.system);
+    }
+    /// Asks for a refresh of the ports that comes as far as its query, and waits there.
+    void holdRefreshOfPorts(Gate& gate) {
+        faults().add(watch(Entry::Associators, [&gate] { gate.pass(); }));
+        ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
+        ASSERT_TRUE(gate.awaitArrivals(1));
+    }
+
+    VendorController card;
+    RaidController_t* ctrl = nullptr;
 };
 
 }  // namespace plexortest

@@ -133,7 +133,7 @@ TEST_F(WorkersLoop, AnItemWithoutFunctionIsFlushedAndNotFreed) {
 
 TEST_F(WorkersLoop, WithoutAnItemItSaysSoAndWaits) {
     Worker worker(ctx(), 7);
-    ASSERT_TRUE(comesTrue([] { return idleLines() == 1; }));
+    ASSERT_TRUE(eventually([] { return idleLines() == 1; }));
     EXPECT_EQ(activeThreads(), 0u);
     EXPECT_EQ(books().count(Entry::ContextFlush), 0u);
     EXPECT_FALSE(worker.ended());
@@ -142,20 +142,20 @@ TEST_F(WorkersLoop, WithoutAnItemItSaysSoAndWaits) {
 
 TEST_F(WorkersLoop, AWakeUpForNothingIsALookIntoTheQueue) {
     Worker worker(ctx(), 7);
-    ASSERT_TRUE(comesTrue([] { return idleLines() == 1; }));
+    ASSERT_TRUE(eventually([] { return idleLines() == 1; }));
     ASSERT_TRUE(workersComeToRest());
     pthread_cond_broadcast(&PlexorThreadCond);
-    EXPECT_TRUE(comesTrue([] { return idleLines() == 2; }));
+    EXPECT_TRUE(eventually([] { return idleLines() == 2; }));
     EXPECT_FALSE(worker.ended());
     worker.stop();
 }
 
 TEST_F(WorkersLoop, ASignalFindsItsItem) {
     Worker worker(ctx(), 7);
-    ASSERT_TRUE(comesTrue([] { return idleLines() == 1; }));
+    ASSERT_TRUE(eventually([] { return idleLines() == 1; }));
     ASSERT_TRUE(workersComeToRest());
     tasks_.queue([](CMPIContext*, void*) {});
-    EXPECT_TRUE(comesTrue([this] { return tasks_.ended() == 1; }));
+    EXPECT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
     worker.stop();
 }
 
@@ -167,14 +167,14 @@ TEST_F(WorkersLoop, ATerminatedWorkerDrainsTheQueueAndWaits) {
 
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(tasks_.ended(), 20);
-    ASSERT_TRUE(comesTrue([] { return idleLines() == 1; }));
+    ASSERT_TRUE(eventually([] { return idleLines() == 1; }));
     // Nobody has woken it: it waits, however often it looks into the queue.
-    ASSERT_TRUE(comesTrue([] { return HurriedWaits::workWaits().size() >= 5; }));
+    ASSERT_TRUE(eventually([] { return HurriedWaits::workWaits().size() >= 5; }));
     EXPECT_FALSE(worker.ended());
     EXPECT_EQ(books().count(Entry::DetachThread), 0u);
 
     // More than once: a wake-up between two of its hurried waits finds nobody.
-    EXPECT_TRUE(comesTrue([&] {
+    EXPECT_TRUE(eventually([&] {
         pthread_cond_broadcast(&PlexorThreadCond);
         return worker.ended();
     }));
@@ -182,13 +182,13 @@ TEST_F(WorkersLoop, ATerminatedWorkerDrainsTheQueueAndWaits) {
 
 TEST_F(WorkersLoop, AWorkerThatIsWokenToTerminateLeavesWorkBehind) {
     Worker worker(ctx(), 7);
-    ASSERT_TRUE(comesTrue([] { return idleLines() == 1; }));
+    ASSERT_TRUE(eventually([] { return idleLines() == 1; }));
     pthread_mutex_lock(&PlexorThreadMutex);
     TerminateThread = 1;
     tasks_.put([](CMPIContext*, void*) {});
     pthread_cond_broadcast(&PlexorThreadCond);
     pthread_mutex_unlock(&PlexorThreadMutex);
-    ASSERT_TRUE(comesTrue([&] { return worker.ended(); }));
+    ASSERT_TRUE(eventually([&] { return worker.ended(); }));
     EXPECT_EQ(tasks_.ended(), 0);
     EXPECT_EQ(queuedItems(), 1u);
 }
@@ -200,7 +200,7 @@ TEST_F(WorkersLoop, LeavingItDetachesThenSaysSoThenEnds) {
         said = timesLogged(LOG_DEBUG, "Thread 7 exiting...\n") != 0;
     }));
     Worker worker(ctx(), 7);
-    ASSERT_TRUE(comesTrue([] { return idleLines() == 1; }));
+    ASSERT_TRUE(eventually([] { return idleLines() == 1; }));
     worker.stop();
 
     EXPECT_TRUE(worker.ended());

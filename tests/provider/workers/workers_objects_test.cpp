@@ -8,30 +8,27 @@ namespace {
 
 using testbed::Entry;
 
-class WorkersObjects : public WorkersTest {
+class WorkersObjects : public WorkersCardTest {
 protected:
     void SetUp() override {
-        WorkersTest::SetUp();
-        array_ = vendor_.controller("C0");
-        ctrl_ = attach(newController("C0"));
-        ctrl_->ControllerOp = clonedPath(array_.system);
-        pool_ = vendor_.pool(array_, "pool0");
+        WorkersCardTest::SetUp();
+        pool_ = vendor.pool(card, "pool0");
     }
     /// `count` devices of each of the four kinds.
     void addDevices(int count) {
         for (int i = 0; i < count; i++) {
             const std::string number = std::to_string(i);
-            vendor_.drive(array_, "D" + number, pool_);
-            vendor_.volume(array_, "V" + number, pool_);
-            vendor_.port(array_, "P" + number);
-            vendor_.battery(array_, "B" + number);
+            vendor.drive(card, "D" + number, pool_);
+            vendor.volume(card, "V" + number, pool_);
+            vendor.port(card, "P" + number);
+            vendor.battery(card, "B" + number);
         }
     }
     void buildInventory() {
         ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
         // A slow sanitizer needs its time here.
         for (int i = 0; i < 20 && threadActivityDone() == 0; i++) {
-            comesTrue([] { return threadActivityDone() == 1; });
+            eventually([] { return threadActivityDone() == 1; });
         }
         ASSERT_TRUE(workersComeToRest());
     }
@@ -43,14 +40,11 @@ protected:
         return live;
     }
     std::size_t records() {
-        return ctrl_->DiskList->Size + ctrl_->VolumeList->Size + ctrl_->PortList->Size +
-               ctrl_->BatteryList->Size;
+        return ctrl->DiskList->Size + ctrl->VolumeList->Size + ctrl->PortList->Size +
+               ctrl->BatteryList->Size;
     }
 
-    VendorObjects vendor_{repository};
-    VendorController array_;
     testbed::ObjectPath pool_;
-    RaidController_t* ctrl_ = nullptr;
 };
 
 TEST_F(WorkersObjects, AThousandDevicesLeaveTheirClonesOnly) {
@@ -74,7 +68,7 @@ TEST_F(WorkersObjects, EachWorkerAsksOnTheContextThatItAttachedWith) {
     buildInventory();
     VirtualClock::advance(20);
     for (const int action : {101, 102, 103, 105}) {
-        ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, action), 0);
+        ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, action), 0);
     }
     ASSERT_TRUE(workersComeToRest());
     std::map<std::thread::id, const void*> attached;
@@ -99,7 +93,7 @@ TEST_F(WorkersObjects, RefreshesDoNotPileUp) {
     for (int round = 0; round < 20; round++) {
         VirtualClock::advance(20);
         for (int action = 100; action <= 105; action++) {
-            ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, action), 0);
+            ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, action), 0);
         }
         ASSERT_TRUE(workersComeToRest());
         ASSERT_EQ(books().live(), live) << "round " << round;

@@ -11,22 +11,19 @@ using testbed::CimValue;
 using testbed::Entry;
 using testbed::FaultRule;
 
-class WorkersQuiesce : public WorkersTest {
+class WorkersQuiesce : public WorkersCardTest {
 protected:
     void SetUp() override {
-        WorkersTest::SetUp();
-        array_ = vendor_.controller("C0");
-        ctrl_ = attach(newController("C0"));
-        ctrl_->ControllerOp = clonedPath(array_.system);
+        WorkersCardTest::SetUp();
         startWorkers();
     }
-    /// Makes a worker run an item that ends when the gate opens.
-    void occupyWorker(Gate& gate) {
-        ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
+    /// A quiet stop that has begun before the gate opens; whether it ends well.
+    static bool quietOnceOpened(Gate& gate) {
+        auto quiet = std::async(std::launch::async, quiesceWorkers);
+        EXPECT_TRUE(eventually(StopRequested));
+        gate.open();
+        return quiet.get();
     }
-    VendorObjects vendor_{repository};
-    VendorController array_;
-    RaidController_t* ctrl_ = nullptr;
 };
 
 TEST_F(WorkersQuiesce, IdleWorkersNeedNoWaiting) {
@@ -41,16 +38,14 @@ TEST_F(WorkersQuiesce, IdleWorkersNeedNoWaiting) {
 TEST_F(WorkersQuiesce, ItWaitsForEveryRunningItem) {
     Gate first, second;
     const GateOpener firstOpener(first), secondOpener(second);
-    occupyWorker(first);
-    ASSERT_TRUE(first.awaitArrivals(1));
-    occupyWorker(second);
-    ASSERT_TRUE(second.awaitArrivals(1));
+    occupyWorkers(1, first);
+    occupyWorkers(1, second);
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
+    ASSERT_TRUE(eventually(StopRequested));
     EXPECT_EQ(quiet.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     first.open();
-    ASSERT_TRUE(comesTrue([this] { return tasks_.ended() == 1; }));
+    ASSERT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
     EXPECT_EQ(quiet.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     second.open();
     EXPECT_TRUE(quiet.get());
@@ -61,15 +56,12 @@ TEST_F(WorkersQuiesce, AnItemRunsUntilItsThreadIsFlushed) {
     if (!kContextHasFlush) GTEST_SKIP() << "no context entry to hold up";
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule slowFlush;
-    slowFlush.entry = Entry::ContextFlush;
-    slowFlush.hook = [&] { gate.pass(); };
-    faults().add(slowFlush);
+    faults().add(watch(Entry::ContextFlush, [&] { gate.pass(); }));
     tasks_.queue([](CMPIContext*, void*) {});
     ASSERT_TRUE(gate.awaitArrivals(1));
 
     auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
+    ASSERT_TRUE(eventually(StopRequested));
     EXPECT_EQ(quiet.wait_for(std::chrono::milliseconds(20)), std::future_status::timeout);
     gate.open();
     EXPECT_TRUE(quiet.get());
@@ -81,16 +73,16 @@ TEST_F(WorkersQuiesce, NoItemBeginsInThisLifeNorByItsWorkersInTheNext) {
     tasks_.queue([](CMPIContext*, void*) {});
     pthread_cond_broadcast(&PlexorThreadCond);
     const std::size_t looks = HurriedWaits::workWaits().size();
-    ASSERT_TRUE(comesTrue([&] { return HurriedWaits::workWaits().size() >= looks + 10; }));
+    ASSERT_TRUE(eventually([&] { return HurriedWaits::workWaits().size() >= looks + 10; }));
     const std::size_t idle = idleLines();
-    ASSERT_TRUE(comesTrue([&] { return HurriedWaits::workWaits().size() >= looks + 30; }));
+    ASSERT_TRUE(eventually([&] { return HurriedWaits::workWaits().size() >= looks + 30; }));
     EXPECT_EQ(idleLines(), idle) << "not even a worker that looks into the queue by itself";
     EXPECT_EQ(tasks_.ended(), 0);
     EXPECT_EQ(queuedItems(), 1u);
 
     BeginWork();
     EXPECT_FALSE(StopRequested());
-    EXPECT_TRUE(comesTrue([this] { return exitLines() == 2; })) << "their life is over";
+    EXPECT_TRUE(eventually([this] { return exitLines() == 2; })) << "their life is over";
     EXPECT_EQ(queuedItems(), 1u);
     running_ = false;
     CleanupPlexorThreads();
@@ -99,15 +91,10 @@ TEST_F(WorkersQuiesce, NoItemBeginsInThisLifeNorByItsWorkersInTheNext) {
 TEST_F(WorkersQuiesce, WhatIsQueuedBehindARunningItemDoesNotBegin) {
     Gate gate;
     const GateOpener opener(gate);
-    occupyWorker(gate);
-    occupyWorker(gate);
-    ASSERT_TRUE(gate.awaitArrivals(2));
+    occupyWorkers(2, gate);
     for (int i = 0; i < 5; i++) tasks_.queue([](CMPIContext*, void*) {});
 
-    auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
-    gate.open();
-    ASSERT_TRUE(quiet.get());
+    ASSERT_TRUE(quietOnceOpened(gate));
     EXPECT_EQ(tasks_.ended(), 2);
     EXPECT_EQ(queuedItems(), 5u);
     running_ = false;
@@ -117,8 +104,7 @@ TEST_F(WorkersQuiesce, WhatIsQueuedBehindARunningItemDoesNotBegin) {
 TEST_F(WorkersQuiesce, AStuckItemIsWaitedForThirtySecondsInAll) {
     Gate gate;
     const GateOpener opener(gate);
-    occupyWorker(gate);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    occupyWorkers(1, gate);
     const HurriedWaits hurry;
 
     EXPECT_FALSE(quiesceWorkers());
@@ -128,76 +114,64 @@ TEST_F(WorkersQuiesce, AStuckItemIsWaitedForThirtySecondsInAll) {
     EXPECT_LE(waits[0], std::chrono::seconds(30));
     EXPECT_GE(waits[0], std::chrono::seconds(29));
     gate.open();
-    EXPECT_TRUE(comesTrue([this] { return tasks_.ended() == 1; }));
+    EXPECT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
     EXPECT_TRUE(quiesceWorkers()) << "asked again when it has ended";
 }
 
 TEST_F(WorkersQuiesce, ARefreshUnderWayAsksNothingMoreAndTouchesNoRecord) {
-    vendor_.port(array_, "P0");
-    vendor_.battery(array_, "B0");
-    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    ASSERT_EQ(ctrl_->PortList->Size, 1u);
+    vendor.port(card, "P0");
+    vendor.battery(card, "B0");
+    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
+    ASSERT_EQ(ctrl->PortList->Size, 1u);
     repository.clearInstances();
-    vendor_.controller("C0");
+    vendor.controller("C0");
     books().clearCalls();
     ASSERT_TRUE(quiesceWorkers());
 
-    ctrl_->PortUpdateTime = 0;
-    EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 101), 0);
+    ctrl->PortUpdateTime = 0;
+    EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
+    EXPECT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, 101), 0);
 
     EXPECT_TRUE(books().queries().empty());
-    EXPECT_EQ(ctrl_->PortList->Size, 1u);
+    EXPECT_EQ(ctrl->PortList->Size, 1u);
 }
 
 TEST_F(WorkersQuiesce, AWalkThatAnswersDuringTheStopChangesNothing) {
-    const testbed::ObjectPath gone = vendor_.port(array_, "P0");
-    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    ASSERT_EQ(ctrl_->PortList->Size, 1u);
+    const testbed::ObjectPath gone = vendor.port(card, "P0");
+    ASSERT_EQ(ProcessDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
+    ASSERT_EQ(ctrl->PortList->Size, 1u);
     repository.remove(gone);
-    for (const char* id : {"P1", "P2"}) vendor_.port(array_, id);
+    for (const char* id : {"P1", "P2"}) vendor.port(card, id);
     VirtualClock::advance(100);
     books().clearCalls();
     setThreadActivityDone(1);
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule slow;
-    slow.entry = Entry::Associators;
-    slow.hook = [&] { gate.pass(); };
-    faults().add(slow);
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    holdRefreshOfPorts(gate);
 
-    auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
-    gate.open();
-    ASSERT_TRUE(quiet.get());
+    ASSERT_TRUE(quietOnceOpened(gate));
 
     EXPECT_EQ(associatorQueries(), std::vector<std::string>{"CIM_SystemDevice>CIM_SASSATAPort"});
     EXPECT_TRUE(
         loggedOnce(LOG_DEBUG, "CrossoutDuplicatedEntries EXITED, rc -100, remove 0, add 0\n"));
-    ASSERT_EQ(ctrl_->PortList->Size, 1u);
-    EXPECT_STREQ(static_cast<SASSATAPort_t*>(ctrl_->PortList->Head->Data)->DeviceID, "P0");
+    ASSERT_EQ(ctrl->PortList->Size, 1u);
+    EXPECT_STREQ(static_cast<SASSATAPort_t*>(ctrl->PortList->Head->Data)->DeviceID, "P0");
 }
 
 TEST_F(WorkersQuiesce, AnInventoryUnderWayIsGivenUp) {
     // More ports than fit into the queue, and a worker that does not get on with the first.
-    for (int i = 0; i < 60; i++) vendor_.port(array_, "P" + std::to_string(i));
+    for (int i = 0; i < 60; i++) vendor.port(card, "P" + std::to_string(i));
     Gate gate;
     const GateOpener opener(gate);
-    occupyWorker(gate);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    occupyWorkers(1, gate);
     ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
-    ASSERT_TRUE(comesTrue([] {
+    ASSERT_TRUE(eventually([] {
         return timesLogged(LOG_ERR, "BuildLogicalDeviceInfo: FIFO full, waiting...\n") > 2;
     }));
 
-    auto quiet = std::async(std::launch::async, quiesceWorkers);
-    ASSERT_TRUE(comesTrue(StopRequested));
-    gate.open();
-    ASSERT_TRUE(quiet.get());
+    ASSERT_TRUE(quietOnceOpened(gate));
     EXPECT_EQ(activeThreads(), 0u);
-    EXPECT_EQ(ctrl_->PortList->Size, 0u);
+    EXPECT_EQ(ctrl->PortList->Size, 0u);
     EXPECT_EQ(queuedItems(), 20u);
 
     running_ = false;

@@ -5,23 +5,13 @@
 namespace plexortest {
 namespace {
 
-class WorkersSignal : public WorkersTest {
-protected:
-    void SetUp() override {
-        WorkersTest::SetUp();
-        ctrl_ = attach(newController("C0"));
-        ctrl_->ControllerOp = clonedPath(vendor_.controller("C0").system);
-    }
-
-    VendorObjects vendor_{repository};
-    RaidController_t* ctrl_ = nullptr;
-};
+using WorkersSignal = WorkersCardTest;
 
 TEST_F(WorkersSignal, AnItemThatNobodyWasWokenForIsFound) {
     const HurriedWaits hurry(HurriedWaits::Conditions);
     startWorkers();
     ASSERT_EQ(tasks_.put([](CMPIContext*, void*) {}), 0);
-    EXPECT_TRUE(comesTrue([this] { return tasks_.ended() == 1; }));
+    EXPECT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
 }
 
 TEST_F(WorkersSignal, ARequestWithALostSignalIsServed) {
@@ -29,9 +19,9 @@ TEST_F(WorkersSignal, ARequestWithALostSignalIsServed) {
     startWorkers();
     setThreadActivityDone(1);
     const LostWakeUps lost(LostWakeUps::Signals);
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
+    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
     EXPECT_EQ(LostWakeUps::count(), 1);
-    EXPECT_TRUE(comesTrue([this] { return associatorQueries().size() == 1; }));
+    EXPECT_TRUE(eventually([this] { return associatorQueries().size() == 1; }));
 }
 
 TEST_F(WorkersSignal, AnInventoryWithALostSignalIsBuilt) {
@@ -40,7 +30,7 @@ TEST_F(WorkersSignal, AnInventoryWithALostSignalIsBuilt) {
     const LostWakeUps lost(LostWakeUps::Signals);
     ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
     EXPECT_EQ(LostWakeUps::count(), 1);
-    EXPECT_TRUE(comesTrue([] { return threadActivityDone() == 1; }));
+    EXPECT_TRUE(eventually([] { return threadActivityDone() == 1; }));
 }
 
 TEST_F(WorkersSignal, AStopWhoseBroadcastCameBetweenTwoLooksIsSeen) {
@@ -51,23 +41,23 @@ TEST_F(WorkersSignal, AStopWhoseBroadcastCameBetweenTwoLooksIsSeen) {
     // Idle workers, waiting before the stop was asked for; from now on in a hurry.
     pthread_cond_signal(&PlexorThreadCond);
     pthread_cond_signal(&PlexorThreadCond);
-    ASSERT_TRUE(comesTrue([] { return HurriedWaits::workWaits().size() >= 4; }));
+    ASSERT_TRUE(eventually([] { return HurriedWaits::workWaits().size() >= 4; }));
     CleanupPlexorThreads();
     EXPECT_EQ(LostWakeUps::count(), 1);
-    EXPECT_TRUE(comesTrue([] { return exitLines() == 2; }));
+    EXPECT_TRUE(eventually([] { return exitLines() == 2; }));
 }
 
 TEST_F(WorkersSignal, AWorkerThatIsIdleForTheFirstTimeAfterTheStopLeavesToo) {
     const HurriedWaits hurry(HurriedWaits::Conditions);
     TerminateThread = 1;
     Worker worker(ctx());
-    EXPECT_TRUE(comesTrue([&] { return worker.ended(); }));
+    EXPECT_TRUE(eventually([&] { return worker.ended(); }));
 }
 
 TEST_F(WorkersSignal, TheNextLookIsWithinASecond) {
     const HurriedWaits hurry(HurriedWaits::Conditions);
     startWorkers();
-    ASSERT_TRUE(comesTrue([] { return HurriedWaits::workWaits().size() >= 10; }));
+    ASSERT_TRUE(eventually([] { return HurriedWaits::workWaits().size() >= 10; }));
     for (const auto wait : HurriedWaits::workWaits()) {
         EXPECT_LE(wait, std::chrono::milliseconds(1000));
         EXPECT_GE(wait, std::chrono::milliseconds(500)) << "a worker that spins";
@@ -79,7 +69,7 @@ TEST_F(WorkersSignal, LooksWithoutResultAreNotLogged) {
     startWorkers();
     const std::size_t lines = CapturedSyslog::lines().size();
     const std::size_t looks = HurriedWaits::workWaits().size();
-    ASSERT_TRUE(comesTrue([&] { return HurriedWaits::workWaits().size() >= looks + 10; }));
+    ASSERT_TRUE(eventually([&] { return HurriedWaits::workWaits().size() >= looks + 10; }));
     EXPECT_EQ(CapturedSyslog::lines().size(), lines);
 }
 

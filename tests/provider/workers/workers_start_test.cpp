@@ -49,10 +49,7 @@ TEST_F(WorkersStart, BothWork) {
     Gate gate;
     {
         const GateOpener opener(gate);
-        for (int i = 0; i < 2; i++) {
-            ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-        }
-        EXPECT_TRUE(gate.awaitArrivals(2));
+        occupyWorkers(2, gate);
     }
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(tasks_.ended(), 2);
@@ -105,7 +102,6 @@ TEST_F(WorkersStart, StoppingNoWorkerIsHarmless) {
 
 TEST_F(WorkersStart, AtMostOneRefreshOfAClassPerInterval) {
     setPollingOption("45");
-    VendorObjects vendor(repository);
     RaidController_t* const ctrl = attach(newController("C0"));
     ctrl->ControllerOp = clonedPath(vendor.controller("C0").system);
     startWorkers();

@@ -76,16 +76,15 @@ TEST_F(WorkersStop, ABusyWorkerFinishesItsItemAndWaitsAgain) {
     startWorkers();
     Gate gate;
     const GateOpener opener(gate);
-    ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    occupyWorkers(1, gate);
     const std::size_t idle = idleLines();
 
     stopWithoutWaiting();
-    EXPECT_TRUE(comesTrue([] { return exitLines() == 1; })) << "the idle one";
+    EXPECT_TRUE(eventually([] { return exitLines() == 1; })) << "the idle one";
     EXPECT_EQ(tasks_.ended(), 0);
 
     gate.open();
-    ASSERT_TRUE(comesTrue([&] { return idleLines() == idle + 1; }));
+    ASSERT_TRUE(eventually([&] { return idleLines() == idle + 1; }));
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(tasks_.ended(), 1);
     EXPECT_EQ(exitLines(), 1u);
@@ -100,10 +99,7 @@ TEST_F(WorkersStop, WaitingForAStuckWorkerIsBounded) {
     startWorkers();
     Gate gate;
     const GateOpener opener(gate);
-    for (int i = 0; i < 2; i++) {
-        ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-    }
-    ASSERT_TRUE(gate.awaitArrivals(2));
+    occupyWorkers(2, gate);
     {
         const HurriedWaits hurry(HurriedWaits::Joins);
         CleanupPlexorThreads();
@@ -118,10 +114,7 @@ TEST_F(WorkersStop, WhatIsLeftInTheQueueIsReleased) {
     startWorkers();
     Gate gate;
     const GateOpener opener(gate);
-    for (int i = 0; i < 2; i++) {
-        ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-    }
-    ASSERT_TRUE(gate.awaitArrivals(2));
+    occupyWorkers(2, gate);
     putDeviceItem();
     tasks_.put([](CMPIContext*, void*) {});
     putDeviceItem();

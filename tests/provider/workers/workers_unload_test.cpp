@@ -11,14 +11,12 @@ namespace {
 using testbed::Entry;
 using testbed::FaultRule;
 
-class WorkersUnload : public WorkersTest {
+class WorkersUnload : public WorkersCardTest {
 protected:
     void SetUp() override {
-        WorkersTest::SetUp();
-        array_ = vendor_.controller("C0");
-        for (int i = 0; i < 3; i++) vendor_.port(array_, "P" + std::to_string(i));
-        ctrl_ = attach(newController("C0"));
-        ctrl_->ControllerOp = clonedPath(array_.system);
+        WorkersCardTest::SetUp();
+        card = vendor.controller("C0");
+        for (int i = 0; i < 3; i++) vendor.port(card, "P" + std::to_string(i));
         startWorkers();
         setThreadActivityDone(1);
     }
@@ -29,21 +27,17 @@ protected:
     /// Starts an unload on a thread of its own and waits until it has asked the workers to stop.
     std::future<CMPIrc> beginUnload() {
         auto unloading = std::async(std::launch::async, [this] { return unload(); });
-        EXPECT_TRUE(comesTrue(StopRequested));
+        EXPECT_TRUE(eventually(StopRequested));
         return unloading;
     }
     static bool releaseHasBegun() {
         return CapturedSyslog::countContaining("Freeing list") != 0 ||
                CapturedSyslog::countContaining("Controller Model C0 (C0) deleted") != 0;
     }
-
-    VendorObjects vendor_{repository};
-    VendorController array_;
-    RaidController_t* ctrl_ = nullptr;
 };
 
 TEST_F(WorkersUnload, AnIdleProviderIsReleasedAndItsWorkersLeave) {
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
+    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(unload(), CMPI_RC_OK);
     EXPECT_TRUE(releaseHasBegun());
@@ -76,12 +70,7 @@ TEST_F(WorkersUnload, TheReleaseWaitsForARunningItem) {
 TEST_F(WorkersUnload, TheReleaseWaitsForARefreshInAVendorCall) {
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule slow;
-    slow.entry = Entry::Associators;
-    slow.hook = [&] { gate.pass(); };
-    faults().add(slow);
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    holdRefreshOfPorts(gate);
 
     auto unloading = beginUnload();
     EXPECT_FALSE(releaseHasBegun());
@@ -94,17 +83,14 @@ TEST_F(WorkersUnload, TheReleaseWaitsForARefreshInAVendorCall) {
 TEST_F(WorkersUnload, QueuedWorkIsDiscardedWithItsClones) {
     Gate gate;
     const GateOpener opener(gate);
-    for (int i = 0; i < 2; i++) {
-        ASSERT_EQ(tasks_.queue([&](CMPIContext*, void*) { gate.pass(); }), 0);
-    }
-    ASSERT_TRUE(gate.awaitArrivals(2));
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
+    occupyWorkers(2, gate);
+    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
     for (int i = 0; i < 4; i++) tasks_.queue([](CMPIContext*, void*) {});
     const testbed::ObjectPath path{"root/sample", "Sample_SASSATAPort", {}};
     CMPIInstance* const instance = broker.makeInstance({path, {}});
     auto* item = static_cast<Thread_Args_t*>(calloc(1, sizeof(Thread_Args_t)));
     item->Func = ProcessBuildLogicalDeviceInfo;
-    item->Arg0 = reinterpret_cast<uintptr_t>(ctrl_);
+    item->Arg0 = reinterpret_cast<uintptr_t>(ctrl);
     item->Arg3 = reinterpret_cast<uintptr_t>(clonedPath(path));
     item->Arg4 = reinterpret_cast<uintptr_t>(instance->ft->clone(instance, nullptr));
     item->Arg5 = 2;
@@ -131,18 +117,13 @@ TEST_F(WorkersUnload, TheOrderOfTheReleases) {
 }
 
 TEST_F(WorkersUnload, AStuckWorkersRecordsAreGivenUpNotReleased) {
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
+    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl, 102), 0);
     ASSERT_TRUE(workersComeToRest());
-    ASSERT_EQ(ctrl_->PortList->Size, 3u);
+    ASSERT_EQ(ctrl->PortList->Size, 3u);
     VirtualClock::advance(20);
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule stuck;
-    stuck.entry = Entry::Associators;
-    stuck.hook = [&] { gate.pass(); };
-    faults().add(stuck);
-    ASSERT_EQ(HandleDeviceConfigChange(&mi, ctx(), ctrl_, 102), 0);
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    holdRefreshOfPorts(gate);
     List_Entry_t* const givenUp = RaidControllerList->Head;
     {
         const HurriedWaits hurry;
@@ -153,8 +134,8 @@ TEST_F(WorkersUnload, AStuckWorkersRecordsAreGivenUpNotReleased) {
     EXPECT_FALSE(releaseHasBegun());
     EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR).back(),
               "PlexorProviderCleanup: a worker is still busy, the inventory stays in memory\n");
-    EXPECT_EQ(std::string(ctrl_->DeviceID), "C0");
-    EXPECT_EQ(ctrl_->PortList->Size, 3u);
+    EXPECT_EQ(std::string(ctrl->DeviceID), "C0");
+    EXPECT_EQ(ctrl->PortList->Size, 3u);
 
     // What it was stuck in ends one day; its records are still there for it.
     gate.open();
@@ -162,7 +143,7 @@ TEST_F(WorkersUnload, AStuckWorkersRecordsAreGivenUpNotReleased) {
     pthread_attr_init(&PlexorThreadAttr);
     CleanupPlexorThreads();
     EXPECT_EQ(exitLines(), 2u);
-    FreeController(ctrl_);
+    FreeController(ctrl);
     free(givenUp);
 }
 

@@ -1,7 +1,4 @@
 // The provider's waits in real time, which the virtual clock does not move: watched, and hurried.
-//
-// The definitions of the POSIX functions stand in workers_real_waits_test.cpp, in front of the C
-// library's.
 #pragma once
 
 #include <pthread.h>

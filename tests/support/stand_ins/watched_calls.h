@@ -1,7 +1,7 @@
 // Calls that the provider's objects make into the C library, and one that they make into each
 // other, seen by a test.
 //
-// The functions stand in watched_calls_test.cpp; the linker puts them in front of the real ones.
+// The linker puts the functions in front of the real ones.
 // Each watch works on the thread that made it, as long as it lives; one of a kind at a time.
 #pragma once
 

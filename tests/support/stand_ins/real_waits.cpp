@@ -1,9 +1,7 @@
-// The functions behind real_waits.h, in front of the C library's, and the proof that they work.
 #include "real_waits.h"
 
 #include <dlfcn.h>
 #include <errno.h>
-#include <gtest/gtest.h>
 #include <time.h>
 
 #include <atomic>
@@ -189,39 +187,3 @@ int LostWakeUps::count() {
 }
 
 }  // namespace plexortest
-
-namespace {
-
-using plexortest::WakeUpCounter;
-using std::chrono::steady_clock;
-
-TEST(WorkersRealWaits, HurriedWaitEndsEarlyAndIsNoted) {
-    const HurriedWaits hurry;
-    const auto start = steady_clock::now();
-    const timespec deadline = timeIn(CLOCK_MONOTONIC, 20 * kNanoseconds);
-
-    pthread_mutex_lock(&PlexorThreadMutex);
-    const int rc =
-        pthread_cond_clockwait(&PlexorThreadCond, &PlexorThreadMutex, CLOCK_MONOTONIC, &deadline);
-    pthread_mutex_unlock(&PlexorThreadMutex);
-
-    EXPECT_EQ(rc, ETIMEDOUT);
-    EXPECT_GE(steady_clock::now() - start, std::chrono::milliseconds(19));
-    EXPECT_LT(steady_clock::now() - start, std::chrono::seconds(5));
-    ASSERT_EQ(HurriedWaits::workWaits().size(), 1u);
-    EXPECT_NEAR(static_cast<double>(HurriedWaits::workWaits()[0].count()), 20000, 500);
-}
-
-TEST(WorkersRealWaits, CountsWakeUpsAndWhetherTheMutexIsHeld) {
-    const WakeUpCounter wakeUps;
-    pthread_cond_signal(&PlexorThreadCond);
-    pthread_mutex_lock(&PlexorThreadMutex);
-    pthread_cond_broadcast(&PlexorThreadCond);
-    pthread_mutex_unlock(&PlexorThreadMutex);
-
-    EXPECT_EQ(WakeUpCounter::signals(), 1);
-    EXPECT_EQ(WakeUpCounter::broadcasts(), 1);
-    EXPECT_EQ(WakeUpCounter::underMutex(), 1);
-}
-
-}  // namespace

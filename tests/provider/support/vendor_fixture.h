@@ -1,5 +1,5 @@
-// What tests of the inventory's building share: a vendor, the log without the lists' chatter, and
-// the ways in which a vendor's answers can be bad.
+// What tests of discovery, walks, builders and updaters share: a vendor, what it was asked, and the
+// ways in which its answers can be bad.
 #pragma once
 
 #include <gmock/gmock.h>
@@ -9,6 +9,8 @@
 #include <utility>
 #include <vector>
 
+#include "log_text.h"
+#include "odd_values.h"
 #include "provider_fixture.h"
 #include "query_arguments.h"
 #include "vendor_objects.h"
@@ -18,44 +20,11 @@ namespace plexortest {
 /// What the profile that is looked for is registered as.
 inline constexpr char kProfileName[] = "Host Hardware RAID Controller";
 
-inline LogLine debugLine(std::string text) {
-    return {LOG_DEBUG, std::move(text)};
-}
-inline LogLine infoLine(std::string text) {
-    return {LOG_INFO, std::move(text)};
-}
-inline LogLine warningLine(std::string text) {
-    return {LOG_WARNING, std::move(text)};
-}
-inline LogLine errorLine(std::string text) {
-    return {LOG_ERR, std::move(text)};
-}
-
-/// The calling thread's lines without those of the lists and of released records.
-inline std::vector<LogLine> inventoryLog() {
-    constexpr const char* kListLines[] = {"Adding data ",  "Data ", "Removing data ",
-                                          "Freeing list ", "List ", "PutItem: Fifo("};
-    std::vector<LogLine> found;
-    for (const LogLine& line : CapturedSyslog::lines()) {
-        bool skipped =
-            line.thread != std::this_thread::get_id() || line.text.ends_with(" deleted\n");
-        for (const char* start : kListLines) skipped = skipped || line.text.starts_with(start);
-        if (!skipped) found.push_back(line);
-    }
-    return found;
-}
-
 /// One way in which a query fails, and the end of the line that says so; none when nothing is said.
 struct QueryFailure {
     const char* name;
     testbed::FaultRule answer;
     std::optional<std::string> logged;
-};
-
-/// A value that is not what a property should hold.
-struct BadValue {
-    const char* name;
-    testbed::CimValue value;
 };
 
 /// Whether nobody holds the mutex.
@@ -76,20 +45,20 @@ std::vector<Record*> recordsOf(const List_t* list) {
     return records;
 }
 
+/// The record at the head of a list; null without one.
+template <class Record>
+Record* firstOf(const List_t* list) {
+    return list->Head != nullptr ? static_cast<Record*>(list->Head->Data) : nullptr;
+}
+
 /// The provider over a vendor whose classes are known and who has no object yet.
-class InventoryTest : public ProviderTest {
+class VendorTest : public ProviderTest {
 protected:
     using Path = testbed::ObjectPath;
     using Entry = testbed::Entry;
     using Texts = std::vector<std::string>;
 
     static std::vector<QueryFailure> queryFailures();
-    /// What a text property may hold that is no text.
-    static std::vector<BadValue> notTexts();
-    /// What a number or truth value may hold that is none.
-    static std::vector<BadValue> notNumbers();
-    /// What an array of numbers may hold that has no first number.
-    static std::vector<BadValue> notNumberArrays();
 
     /// Forgets the log and the calls so far.
     void startOver() {
@@ -101,11 +70,16 @@ protected:
         faults().clear();
         faults().add(std::move(rule));
     }
-    /// A rule for queries along that association.
-    static testbed::FaultRule along(const std::string& assocClass, testbed::FaultRule answer) {
-        answer.entry = Entry::Associators;
-        answer.assocClass = assocClass;
-        return answer;
+    /// Narrows a rule for queries down to that association.
+    static testbed::FaultRule along(const std::string& assocClass, testbed::FaultRule rule) {
+        rule.assocClass = assocClass;
+        return rule;
+    }
+    /// A rule by which queries fail and give their result all the same.
+    static testbed::FaultRule refusalWithResult(Entry entry) {
+        testbed::FaultRule rule = refusal(entry);
+        rule.keepResult = true;
+        return rule;
     }
     /// A rule that runs a hook at calls of that entry and leaves them alone.
     static testbed::FaultRule watch(Entry entry, std::function<void()> hook) {
@@ -149,17 +123,21 @@ protected:
     void unset(const Path& path, const char* property) {
         EXPECT_TRUE(repository.eraseProperty(path, property)) << path.text() << " " << property;
     }
-    /// "<entry> <path> <association class> <result class>" for each query since startOver.
-    Texts askedQueries() {
-        Texts asked;
-        for (const testbed::CallRecord& call : books().queries()) {
-            asked.push_back(std::string(testbed::entryName(call.entry)) + " " + call.path + " " +
-                            call.assocClass.value_or("any") + " " +
-                            call.resultClass.value_or("any"));
-            EXPECT_TRUE(asksForAll(call)) << asked.back();
+    /// Gives an object that value of a property, or takes the property away.
+    void give(const Path& path, const std::string& property, const OddValue& odd) {
+        if (odd.value) {
+            repository.setProperty(path, property, *odd.value);
+        } else {
+            repository.eraseProperty(path, property);
         }
-        return asked;
     }
+    /// Every call to the broker since startOver: "associators <path> <assoc>/<result>".
+    Texts brokerCalls() {
+        return callTexts(books().calls(),
+                         [](testbed::Entry entry) { return !testbed::isObjectEntry(entry); });
+    }
+    /// Those of them that the vendor was asked.
+    Texts queries() { return callTexts(books().calls(), testbed::isQuery); }
     /// Names of the properties read from instances of the class, in order; needs recordObjectCalls.
     Texts propertiesRead(const std::string& className) {
         Texts names;
@@ -170,13 +148,27 @@ protected:
         return names;
     }
 
-    VendorObjects vendor_{repository};
+    VendorObjects vendor{repository};
+
+private:
+    template <class Filter>
+    static Texts callTexts(const std::vector<testbed::CallRecord>& calls, Filter isWanted) {
+        Texts texts;
+        for (const testbed::CallRecord& call : calls) {
+            if (!isWanted(call.entry)) continue;
+            std::string text = std::string(testbed::entryName(call.entry)) + " " + call.path;
+            if (call.entry != Entry::GetInstance) {
+                text += " " + call.assocClass.value_or("NULL") + "/" +
+                        call.resultClass.value_or("NULL");
+            }
+            texts.push_back(text + (asksForAll(call) ? "" : " with roles or properties"));
+        }
+        return texts;
+    }
 };
 
-inline std::vector<QueryFailure> InventoryTest::queryFailures() {
+inline std::vector<QueryFailure> VendorTest::queryFailures() {
     const Entry any = Entry::Associators;
-    QueryFailure withResult = {"status and a result", refusal(any), "status: rc 1, msg NULL"};
-    withResult.answer.keepResult = true;
     return {
         {"status alone", refusal(any, CMPI_RC_ERR_NOT_FOUND), "status: rc 6, msg NULL"},
         {"status and message", refusal(any, CMPI_RC_ERR_ACCESS_DENIED, "the vendor is busy"),
@@ -184,42 +176,9 @@ inline std::vector<QueryFailure> InventoryTest::queryFailures() {
         {"status and empty message", refusal(any, CMPI_RC_ERR_FAILED, ""), "status: rc 1, msg "},
         {"status and a message like a format", refusal(any, CMPI_RC_ERR_FAILED, "50%s %n %d%%"),
          "status: rc 1, msg 50%s %n %d%%"},
-        withResult,
+        {"status and a result", refusalWithResult(any), "status: rc 1, msg NULL"},
         {"NULL with status OK", answerNull(any), std::nullopt},
     };
-}
-
-inline std::vector<BadValue> InventoryTest::notTexts() {
-    using testbed::CimValue;
-    return {{"null", CimValue::null(CMPI_string)},
-            {"null of no type", CimValue::null(CMPI_null)},
-            {"number", CimValue::uint64(0x4141414141414141u)},
-            {"boolean", CimValue::boolean(true)},
-            {"real", CimValue::real64(1.5)},
-            {"texts", CimValue::stringArray({"C0"})},
-            {"numbers", CimValue::uint16Array({1})},
-            {"reference", CimValue::reference({"root/sample", "CIM_ManagedElement", {}})}};
-}
-
-inline std::vector<BadValue> InventoryTest::notNumbers() {
-    using testbed::CimValue;
-    return {{"null", CimValue::null(CMPI_uint16)},
-            {"text", CimValue::string("5")},
-            {"numbers", CimValue::uint16Array({5})},
-            {"texts", CimValue::stringArray({"5"})},
-            {"reference", CimValue::reference({"root/sample", "CIM_ManagedElement", {}})}};
-}
-
-inline std::vector<BadValue> InventoryTest::notNumberArrays() {
-    using testbed::CimValue;
-    return {{"null array", CimValue::null(static_cast<CMPIType>(CMPI_uint16 | CMPI_ARRAY))},
-            {"empty array", CimValue::uint16Array({})},
-            {"null element", CimValue::array(CMPI_uint16, {CimValue::null(CMPI_uint16)})},
-            {"number", CimValue::uint16(2)},
-            {"wide number", CimValue::uint64(0x4141414141414141u)},
-            {"text", CimValue::string("2")},
-            {"texts", CimValue::stringArray({"2"})},
-            {"reference", CimValue::reference({"root/sample", "CIM_ManagedElement", {}})}};
 }
 
 }  // namespace plexortest
