@@ -16,7 +16,7 @@ namespace hostconfig {
 namespace {
 
 constexpr char kBlanks[] = " \t\r";
-constexpr std::size_t kMostBytes = 64 * 1024;
+constexpr std::size_t kMostBytes = 64UL * 1024;
 
 std::string Trim(const std::string& text) {
     const auto first = text.find_first_not_of(kBlanks);

@@ -89,9 +89,11 @@ bool IsDue(const Refresh& refresh, const pthread_mutex_t& classMutex, time_t las
         "%s(%p): Action %d, last %lu, now %lu, interval %ld secs, ctrl %s, locker %p, skip";
     constexpr const char kGo[] =
         "%s(%p): Action %d, last %lu, now %lu, interval %ld secs, ctrl %s, locker %p";
-    syslog(LOG_DEBUG, due ? kGo : kSkip, kProcess, reinterpret_cast<void*>(pthread_self()),
-           refresh.kind.action.ConfigAction, static_cast<unsigned long>(last),
-           static_cast<unsigned long>(now), static_cast<long>(now - last), refresh.ctrl->DeviceID,
+    // NOLINTNEXTLINE(performance-no-int-to-ptr): the line shows the thread as an address
+    void* const self = reinterpret_cast<void*>(pthread_self());
+    syslog(LOG_DEBUG, due ? kGo : kSkip, kProcess, self, refresh.kind.action.ConfigAction,
+           static_cast<unsigned long>(last), static_cast<unsigned long>(now),
+           static_cast<long>(now - last), refresh.ctrl->DeviceID,
            static_cast<const void*>(&classMutex));
     return due;
 }
