@@ -6,6 +6,8 @@ function(plexor_export_map header map)
     file(STRINGS ${header} lines REGEX "^PLEXOR_API ")
     set(names "")
     foreach(line IN LISTS lines)
+        # Locks that a declaration names are no part of it.
+        string(REGEX REPLACE " PLEXOR_[A-Z_]+\\([^)]*\\)" "" line "${line}")
         if(NOT line MATCHES "[ *]([A-Za-z_]+)[[(;]")
             message(FATAL_ERROR "No name in the declaration: ${line}")
         endif()

@@ -5,8 +5,8 @@
 // Everything declared here with C linkage is exported under its plain name. Strings and object
 // paths in records are owned by the record; what the broker returned belongs to the broker.
 //
-// A comment "guarded by X" names the mutex that readers and writers of a field hold. The lock order
-// stands in PlexorProviderLock.h.
+// Which lock guards a controller's devices stands at RaidController_t, the lock order in
+// PlexorProviderLock.h.
 #pragma once
 
 #include <pthread.h>
@@ -18,6 +18,8 @@
 #include <cmpidt.h>
 #include <cmpift.h>
 #include <cmpimacs.h>
+
+#include "PlexorProviderThreadSafety.h"
 
 #define PLEXOR_API extern "C" __attribute__((visibility("default")))
 
@@ -87,7 +89,7 @@ struct List_t {
 struct Fifo_t {
     pthread_mutex_t Mutex;
     unsigned int Size;  ///< length limit, constant
-    List_t List;        ///< guarded by Mutex
+    List_t List PLEXOR_GUARDED_BY(Mutex);
 };
 
 typedef void (*WorkFunc_t)(CMPIContext* ctx, void* args);
@@ -106,21 +108,22 @@ struct Array_t {
 };
 
 // ---------------------------------------------------------------------------------------------
-// Records. Every device record has its object path as first field.
+// Records. Every device record has its object path as first field. Fields are constant once the
+// record is in its list, but for those that are said to be changing: see RaidController_t.
 
 struct StorageVolume_t {
     CMPIObjectPath* VolumeOp;
     char* DeviceID;
     char* RaidLevel;
-    char* ElementName;  ///< guarded by the controller's CtrlMutex
+    char* ElementName;  ///< changing
     char* Name;
     CMPIUint16 NameFormat;
     CMPIUint16 NameNameSpace;
     CMPIUint16 ExtentStripeLength;
-    CMPIUint16 ExtentStatus;       ///< guarded by CtrlMutex
-    CMPIUint16 OperationalStatus;  ///< guarded by CtrlMutex
-    CMPIUint64 NumberOfBlocks;     ///< guarded by CtrlMutex
-    CMPIUint64 ConsumableBlocks;   ///< guarded by CtrlMutex
+    CMPIUint16 ExtentStatus;       ///< changing
+    CMPIUint16 OperationalStatus;  ///< changing
+    CMPIUint64 NumberOfBlocks;     ///< changing
+    CMPIUint64 ConsumableBlocks;   ///< changing
     CMPIUint16 DataRedundancy;
     CMPIUint16 PackageRedundancy;
     CMPIBoolean IsBasedOnUnderlyingRedundancy;
@@ -139,8 +142,8 @@ struct DiskDrive_t {
     char* FwVersion;
     char* Model;  ///< never filled, never released
     CMPIUint16 EnabledState;
-    CMPIUint16 OperationalStatus;  ///< guarded by CtrlMutex
-    CMPIUint16 ExtentStatus;       ///< guarded by CtrlMutex
+    CMPIUint16 OperationalStatus;  ///< changing
+    CMPIUint16 ExtentStatus;       ///< changing
     CMPIUint64 NumberOfBlocks;
     CMPIUint64 ConsumableBlocks;
     CMPIBoolean Primordial;
@@ -148,7 +151,7 @@ struct DiskDrive_t {
     unsigned char UpdateEnabled;
     CMPIUint16 SlotNumber;
     char* Chassis;  ///< Tag of the enclosing chassis
-    char* Pool;     ///< InstanceID of the drive's pool; guarded by CtrlMutex
+    char* Pool;     ///< InstanceID of the drive's pool; changing
 };
 
 struct StoragePool_t {
@@ -162,7 +165,7 @@ struct StoragePool_t {
     time_t LastUpdateTime;
     unsigned char UpdateEnabled;
     List_t* Drives;  ///< points at _Drives
-    List_t _Drives;  ///< owned copies of member drives' DeviceIDs; guarded by CtrlMutex
+    List_t _Drives;  ///< owned copies of member drives' DeviceIDs; changing
 };
 
 struct Battery_t {
@@ -170,8 +173,8 @@ struct Battery_t {
     time_t LastUpdateTime;
     unsigned char UpdateEnabled;
     char* DeviceID;
-    CMPIUint16 BatteryStatus;      ///< guarded by CtrlMutex
-    CMPIUint16 OperationalStatus;  ///< guarded by CtrlMutex
+    CMPIUint16 BatteryStatus;      ///< changing
+    CMPIUint16 OperationalStatus;  ///< changing
 };
 
 struct SASSATAPort_t {
@@ -197,6 +200,11 @@ struct Chassis_t {
 /// One RAID controller. Strings, paths and scalars are constant once the record is in
 /// RaidControllerList. The update times are read and written as relaxed atomics (LoadShared,
 /// StoreShared); those who stamp them after a build or update hold CtrlMutex.
+///
+/// The lists of its devices and the records' changing fields have two locks, the *CfgMutex of the
+/// device class and CtrlMutex. Who changes them holds both, who reads them holds either: a refresh
+/// reads what only it could change with its class's mutex alone, a request holds CtrlMutex. The
+/// drives of a pool change with the drives' class: with DiskCfgMutex and CtrlMutex.
 struct RaidController_t {
     pthread_mutex_t CtrlMutex;  ///< guards membership and changing fields of all device lists
     CMPIObjectPath* PortControllerOp;
@@ -224,7 +232,7 @@ struct RaidController_t {
     pthread_mutex_t BatteryCfgMutex;
     pthread_mutex_t PoolCfgMutex;
     pthread_mutex_t ChassisCfgMutex;
-    // Each points at the embedded list below; guarded by CtrlMutex.
+    // Each points at the embedded list below.
     List_t* VolumeList;
     List_t* ExtentList;  ///< stays null: drive extents live in the drive records
     List_t* DiskList;
@@ -358,20 +366,23 @@ PLEXOR_API void FreeController(void* data);
 
 // Unlink a record and release it; 0, -1 (null argument) or -3 (not in its list, record kept).
 // They take CtrlMutex.
-PLEXOR_API int DeleteVolume(RaidController_t* ctrl, void* device);
-PLEXOR_API int DeleteDisk(RaidController_t* ctrl, void* device);
-PLEXOR_API int DeletePort(RaidController_t* ctrl, void* device);
-PLEXOR_API int DeleteBattery(RaidController_t* ctrl, void* device);
-PLEXOR_API int DeleteChassis(RaidController_t* ctrl, void* device);
-PLEXOR_API int DeletePool(RaidController_t* ctrl, void* device);
+PLEXOR_API int DeleteVolume(RaidController_t* ctrl, void* device) PLEXOR_WITHOUT(ctrl->CtrlMutex);
+PLEXOR_API int DeleteDisk(RaidController_t* ctrl, void* device) PLEXOR_WITHOUT(ctrl->CtrlMutex);
+PLEXOR_API int DeletePort(RaidController_t* ctrl, void* device) PLEXOR_WITHOUT(ctrl->CtrlMutex);
+PLEXOR_API int DeleteBattery(RaidController_t* ctrl, void* device) PLEXOR_WITHOUT(ctrl->CtrlMutex);
+PLEXOR_API int DeleteChassis(RaidController_t* ctrl, void* device) PLEXOR_WITHOUT(ctrl->CtrlMutex);
+PLEXOR_API int DeletePool(RaidController_t* ctrl, void* device) PLEXOR_WITHOUT(ctrl->CtrlMutex);
 
 // Pool membership and look-ups; the caller holds CtrlMutex.
 PLEXOR_API void AddDiskToPool(StoragePool_t* pool, const char* disk);
 PLEXOR_API void RemoveDiskFromPool(StoragePool_t* pool, const char* disk);
-PLEXOR_API StoragePool_t* FindStoragePoolByID(const RaidController_t* ctrl, const char* instanceID);
-PLEXOR_API DiskDrive_t* FindDiskByDeviceID(const RaidController_t* ctrl, const char* deviceID);
+PLEXOR_API StoragePool_t* FindStoragePoolByID(const RaidController_t* ctrl, const char* instanceID)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
+PLEXOR_API DiskDrive_t* FindDiskByDeviceID(const RaidController_t* ctrl, const char* deviceID)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
 /// Searches, logs what it found, and always answers null.
-PLEXOR_API Chassis_t* FindChassisByTag(const RaidController_t* ctrl, const char* tag);
+PLEXOR_API Chassis_t* FindChassisByTag(const RaidController_t* ctrl, const char* tag)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
 
 // ---------------------------------------------------------------------------------------------
 // Cfg: inventory
@@ -389,7 +400,7 @@ PLEXOR_API int NeedUpdate(time_t lastUpdateTime, unsigned char updateEnabled);
 /// Moves the controller's time stamp; reads nothing anew. Always 0. Takes CtrlMutex.
 PLEXOR_API int CheckAndUpdateControllerInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                             RaidController_t* ctrl, void* device,
-                                            CMPIInstance* devInst);
+                                            CMPIInstance* devInst) PLEXOR_WITHOUT(ctrl->CtrlMutex);
 
 // The three walks of the initial inventory. The caller is a worker counted in ActiveThreads.
 PLEXOR_API int BuildPoolInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
@@ -407,39 +418,50 @@ PLEXOR_API void ProcessBuildLogicalDeviceInfo(CMPIContext* ctx, void* args);
 // The caller holds the class's *CfgMutex; they take CtrlMutex.
 PLEXOR_API int BuildSinglePoolInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                    RaidController_t* ctrl, const CMPIInstance* poolInstance,
-                                   const CMPIObjectPath* poolOp);
+                                   const CMPIObjectPath* poolOp) PLEXOR_HOLDS(ctrl->PoolCfgMutex)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int BuildSingleChassisInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                       RaidController_t* ctrl, const CMPIInstance* chassisInstance,
-                                      const CMPIObjectPath* chassisOp);
+                                      const CMPIObjectPath* chassisOp)
+    PLEXOR_HOLDS(ctrl->ChassisCfgMutex) PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int BuildDiskInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                              RaidController_t* ctrl, const CMPIInstance* devInst,
-                             const CMPIObjectPath* devOp);
+                             const CMPIObjectPath* devOp) PLEXOR_HOLDS(ctrl->DiskCfgMutex)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int BuildVolumeInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                RaidController_t* ctrl, const CMPIInstance* devInst,
-                               const CMPIObjectPath* devOp);
+                               const CMPIObjectPath* devOp) PLEXOR_HOLDS(ctrl->VolumeCfgMutex)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int BuildPortInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                              RaidController_t* ctrl, const CMPIInstance* devInst,
-                             const CMPIObjectPath* devOp);
+                             const CMPIObjectPath* devOp) PLEXOR_HOLDS(ctrl->PortCfgMutex)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int BuildBatteryInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                 RaidController_t* ctrl, const CMPIInstance* devInst,
-                                const CMPIObjectPath* devOp);
+                                const CMPIObjectPath* devOp) PLEXOR_HOLDS(ctrl->BatteryCfgMutex)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 
 // Updaters: bring a cached record up to date. Always 0. Locks as for the builders.
 PLEXOR_API int CheckAndUpdatePoolInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
-                                      RaidController_t* ctrl, void* device, CMPIInstance* devInst);
+                                      RaidController_t* ctrl, void* device, CMPIInstance* devInst)
+    PLEXOR_HOLDS(ctrl->PoolCfgMutex) PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int CheckAndUpdateChassisInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                          RaidController_t* ctrl, void* device,
-                                         CMPIInstance* devInst);
+                                         CMPIInstance* devInst) PLEXOR_HOLDS(ctrl->ChassisCfgMutex)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int CheckAndUpdateDiskInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
-                                      RaidController_t* ctrl, void* device, CMPIInstance* devInst);
+                                      RaidController_t* ctrl, void* device, CMPIInstance* devInst)
+    PLEXOR_HOLDS(ctrl->DiskCfgMutex) PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int CheckAndUpdateVolumeInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
-                                        RaidController_t* ctrl, void* device,
-                                        CMPIInstance* devInst);
+                                        RaidController_t* ctrl, void* device, CMPIInstance* devInst)
+    PLEXOR_HOLDS(ctrl->VolumeCfgMutex) PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int CheckAndUpdatePortInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
-                                      RaidController_t* ctrl, void* device, CMPIInstance* devInst);
+                                      RaidController_t* ctrl, void* device, CMPIInstance* devInst)
+    PLEXOR_HOLDS(ctrl->PortCfgMutex) PLEXOR_WITHOUT(ctrl->CtrlMutex);
 PLEXOR_API int CheckAndUpdateBatteryInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                          RaidController_t* ctrl, void* device,
-                                         CMPIInstance* devInst);
+                                         CMPIInstance* devInst) PLEXOR_HOLDS(ctrl->BatteryCfgMutex)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 
 // ---------------------------------------------------------------------------------------------
 // Cfg: refresh and workers
@@ -448,15 +470,17 @@ PLEXOR_API pthread_t PlexorThreads[2];
 PLEXOR_API pthread_attr_t PlexorThreadAttr;
 PLEXOR_API pthread_mutex_t PlexorThreadMutex;
 PLEXOR_API pthread_cond_t PlexorThreadCond;
-PLEXOR_API unsigned int ActiveThreads;       ///< guarded by PlexorThreadMutex
-PLEXOR_API unsigned int TerminateThread;     ///< guarded by PlexorThreadMutex; never reset
-PLEXOR_API unsigned int ThreadActivityDone;  ///< guarded by PlexorThreadMutex; never reset
-PLEXOR_API time_t StateUpdateInterval;       ///< seconds; relaxed atomic
+PLEXOR_API unsigned int ActiveThreads PLEXOR_GUARDED_BY(PlexorThreadMutex);
+// These two are never reset.
+PLEXOR_API unsigned int TerminateThread PLEXOR_GUARDED_BY(PlexorThreadMutex);
+PLEXOR_API unsigned int ThreadActivityDone PLEXOR_GUARDED_BY(PlexorThreadMutex);
+PLEXOR_API time_t StateUpdateInterval;  ///< seconds; relaxed atomic
 
 /// Asks for a refresh of a device class if one is due. 0 skipped or queued, -6 queue full. On a
 /// request's thread, without CtrlMutex.
 PLEXOR_API int HandleDeviceConfigChange(const CMPIInstanceMI* mi, const CMPIContext* ctx,
-                                        RaidController_t* ctrl, int action);
+                                        RaidController_t* ctrl, int action)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 /// Work function of a refresh.
 PLEXOR_API void DoDeviceConfigChange(CMPIContext* ctx, void* args);
 /// Reconciles a class, and before it those it depends on. Always 0.

@@ -53,7 +53,7 @@ void ReleaseDeviceItem(Thread_Args_t* item);
 /// started, nobody else would. False when there are two, or nothing is queued. Takes
 /// PlexorThreadMutex; the item runs without it, and without a flush, which would end what the
 /// caller itself has obtained.
-bool RunQueuedItemAlone(const CMPIContext* ctx);
+bool RunQueuedItemAlone(const CMPIContext* ctx) PLEXOR_WITHOUT(PlexorThreadMutex);
 
 // Beginning a life of the provider and stopping its work before the inventory is released.
 
@@ -61,11 +61,11 @@ bool RunQueuedItemAlone(const CMPIContext* ctx);
 /// ThreadActivityDone, ActiveThreads) does not count for it. Takes no lock but the life's.
 void BeginWork();
 
-/// Workers of the present life among ActiveThreads. The caller holds PlexorThreadMutex.
-unsigned int ActiveWorkers();
+/// Workers of the present life among ActiveThreads.
+unsigned int ActiveWorkers() PLEXOR_HOLDS(PlexorThreadMutex);
 
 /// Whether the initial inventory of the present life is done. Takes PlexorThreadMutex.
-bool InventoryDone();
+bool InventoryDone() PLEXOR_WITHOUT(PlexorThreadMutex);
 
 /// Closes the gate for the life that is about to begin. The caller holds the life's mutex.
 void CloseInventoryGate();
@@ -73,7 +73,7 @@ void CloseInventoryGate();
 /// Asks the present life to end and waits until no work function is running. False when one still
 /// is after the limit: then nothing that it may use can be released. `limit` is asked again after
 /// WakeQuiesce, with PlexorThreadMutex held.
-bool QuiesceWorkers(Deadline (*limit)());
+bool QuiesceWorkers(Deadline (*limit)()) PLEXOR_WITHOUT(PlexorThreadMutex);
 
 /// Has QuiesceWorkers look at its limit again. Takes PlexorThreadMutex.
-void WakeQuiesce();
+void WakeQuiesce() PLEXOR_WITHOUT(PlexorThreadMutex);

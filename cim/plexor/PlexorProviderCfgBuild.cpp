@@ -12,7 +12,7 @@ char* CloneDeviceID(const DeviceKind& kind, const CMPIInstance* inst, const CMPI
 }
 
 int AppendRecord(RaidController_t* ctrl, const DeviceKind& kind, void* record) {
-    const int rc = AddEntryAtListTail(ctrl->*kind.list, record);
+    const int rc = AddEntryAtListTail(DevicesOf(ctrl, kind), record);
     if (rc == RESULT_OK) StoreShared(ctrl->*kind.updateTime, time(nullptr));
     return rc;
 }

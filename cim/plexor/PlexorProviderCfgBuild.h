@@ -26,12 +26,13 @@ char* CloneDeviceID(const DeviceKind& kind, const CMPIInstance* inst, const CMPI
 
 /// Appends a record to its kind's list and stamps the kind's time when that worked. The list's
 /// code. The caller holds CtrlMutex.
-int AppendRecord(RaidController_t* ctrl, const DeviceKind& kind, void* record);
+int AppendRecord(RaidController_t* ctrl, const DeviceKind& kind, void* record)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
 
 /// AppendRecord under CtrlMutex, and a line in the builder's name that says how it ended. The
 /// list's code; the caller's record when it is not 0.
-int PublishRecord(const char* builder, RaidController_t* ctrl, const DeviceKind& kind,
-                  void* record);
+int PublishRecord(const char* builder, RaidController_t* ctrl, const DeviceKind& kind, void* record)
+    PLEXOR_WITHOUT(ctrl->CtrlMutex);
 
 template <typename Record>
 int Publish(const char* builder, RaidController_t* ctrl, const DeviceKind& kind,
@@ -44,4 +45,4 @@ int Publish(const char* builder, RaidController_t* ctrl, const DeviceKind& kind,
 }
 
 /// Stamps the kind's update time. Takes CtrlMutex.
-void StampTime(RaidController_t* ctrl, const DeviceKind& kind);
+void StampTime(RaidController_t* ctrl, const DeviceKind& kind) PLEXOR_WITHOUT(ctrl->CtrlMutex);

@@ -11,7 +11,7 @@ constexpr time_t kLookSeconds = 1;   // how often a waiter looks for a stop
 
 pthread_mutex_t __HoldersMutex = PTHREAD_MUTEX_INITIALIZER;
 pthread_cond_t __HolderLeft = PTHREAD_COND_INITIALIZER;
-ClassLock* __Holders = nullptr;  // guarded by __HoldersMutex
+ClassLock* __Holders PLEXOR_GUARDED_BY(__HoldersMutex) = nullptr;
 
 }  // namespace
 
@@ -63,13 +63,13 @@ bool ClassLock::AwaitTurn() {
     return true;
 }
 
-ClassLock* ClassLock::HolderOf(const pthread_mutex_t* mutex) const {
+ClassLock* ClassLock::HolderOf(const pthread_mutex_t* mutex) const PLEXOR_HOLDS(__HoldersMutex) {
     ClassLock* holder = __Holders;
     while (holder != nullptr && holder->mutex_ != mutex) holder = holder->next_;
     return holder;
 }
 
-void ClassLock::Enlist() {
+void ClassLock::Enlist() PLEXOR_HOLDS(__HoldersMutex) {
     since_ = Deadline::Now();
     next_ = __Holders;
     __Holders = this;

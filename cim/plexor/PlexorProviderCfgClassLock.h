@@ -9,14 +9,14 @@
 /// patience passes it over when the holder has had it for 30 seconds; measured from when it was
 /// taken, so that who comes later does not wait again. That a class begins to be passed over and
 /// that it is held no longer are told at error level.
-class ClassLock {
+class PLEXOR_SCOPED_LOCK ClassLock {
 public:
     enum class Patience { kEndless, kLimited };
 
     /// `deviceClass` is the class's name in the log. A stop of the provider ends every wait.
     ClassLock(RaidController_t* ctrl, pthread_mutex_t& classMutex, const char* deviceClass,
-              Patience patience = Patience::kEndless);
-    ~ClassLock();
+              Patience patience = Patience::kEndless) PLEXOR_TAKES(classMutex);
+    ~ClassLock() PLEXOR_GIVES_BACK();
     ClassLock(const ClassLock&) = delete;
     ClassLock& operator=(const ClassLock&) = delete;
 
@@ -24,7 +24,7 @@ public:
     bool Locked() const { return locked_; }
     /// Gives the class back, telling that it is served again if it had been passed over. Not left
     /// to the destructor: a thread may be cancelled while it logs.
-    void Unlock();
+    void Unlock() PLEXOR_GIVES_BACK();
 
 private:
     bool AwaitTurn();

@@ -133,7 +133,8 @@ void ProcessBuildLogicalDeviceInfo(CMPIContext* ctx, void* args) {
     const DeviceKind* kind = FindKindByCode(work.deviceCode);
     if (kind != nullptr) {
         const ConfigAction_t& action = kind->action;
-        ClassLock lock(work.ctrl, work.ctrl->*kind->classMutex, action.AssociatedClassName);
+        pthread_mutex_t& classMutex = work.ctrl->*kind->classMutex;
+        ClassLock lock(work.ctrl, classMutex, action.AssociatedClassName);
         if (lock.Locked()) action.BuildFunc(work.mi, ctx, work.ctrl, work.inst, work.op);
         lock.Unlock();
     } else {

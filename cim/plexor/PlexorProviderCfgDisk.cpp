@@ -87,9 +87,9 @@ CMPIEnumeration* CandidatePools(const DiskDrive_t* disk, const CMPIContext* ctx)
 
 using DriveOwner = RecordOwner<DiskDrive_t>;
 
-/// Appends the drive and, when that fails, withdraws it from `pool` again. The list's code. The
-/// caller holds CtrlMutex.
-int Append(RaidController_t* ctrl, DriveOwner& disk, StoragePool_t* pool) {
+/// Appends the drive and, when that fails, withdraws it from `pool` again. The list's code.
+int Append(RaidController_t* ctrl, DriveOwner& disk, StoragePool_t* pool)
+    PLEXOR_HOLDS(ctrl->CtrlMutex) {
     void* const list = ctrl->DiskList;
     const int rc = AppendRecord(ctrl, kDrives, disk.get());
     if (rc == RESULT_OK) {

@@ -34,7 +34,7 @@ void OpenGate() {
 
 }  // namespace
 
-void CloseInventoryGate() {
+void CloseInventoryGate() PLEXOR_LOCKS_UNCHECKED {
     // A word that has been reset is nobody's any more.
     if (LoadShared(ThreadActivityDone) == 0) __DoneLife = 0;
 }

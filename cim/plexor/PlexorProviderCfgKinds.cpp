@@ -2,6 +2,8 @@
 // pools, then drives, then volumes.
 #include "PlexorProviderCfgKinds.h"
 
+#include "PlexorProviderLock.h"
+
 const DeviceKind kVolumes = {
     .noun = "volume",
     .recordName = "StorageVolume_t",
@@ -79,6 +81,11 @@ const DeviceKind kEnclosures = {
     .embeddedList = &RaidController_t::__ChassisList,
     .release = FreeChassis,
 };
+
+List_t* DevicesOf(const RaidController_t* ctrl, const DeviceKind& kind) {
+    ExpectHeld(ctrl->CtrlMutex, __func__);
+    return ctrl->*kind.list;
+}
 
 const DeviceKind* FindKindByAction(int action) {
     for (const DeviceKind* kind : kDeviceKinds) {

@@ -32,6 +32,10 @@ constexpr const DeviceKind* kDeviceKinds[] = {&kDrives,    &kVolumes, &kPorts,
 /// for a class that is several of these.
 constexpr int kDeviceCodes = 4;
 
+/// The controller's devices of a kind, for those who hold CtrlMutex.
+List_t* DevicesOf(const RaidController_t* ctrl, const DeviceKind& kind)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
+
 /// The kind with that action code; null for every other number.
 const DeviceKind* FindKindByAction(int action);
 /// The kind with that device code, 1 to kDeviceCodes; null for every other number.

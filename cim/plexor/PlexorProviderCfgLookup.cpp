@@ -2,6 +2,7 @@
 #include <stdlib.h>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderCfgKinds.h"
 
 namespace {
 
@@ -62,18 +63,20 @@ constexpr Lookup<Chassis_t> kChassisLookup = {"FindChassisByTag", "chassis", "ta
 }  // namespace
 
 StoragePool_t* FindStoragePoolByID(const RaidController_t* ctrl, const char* instanceID) {
-    return Find(kPoolLookup, ctrl->PoolList, instanceID);
+    return Find(kPoolLookup, DevicesOf(ctrl, kPools), instanceID);
 }
 
 DiskDrive_t* FindDiskByDeviceID(const RaidController_t* ctrl, const char* deviceID) {
-    return Find(kDiskLookup, ctrl->DiskList, deviceID);
+    return Find(kDiskLookup, DevicesOf(ctrl, kDrives), deviceID);
 }
 
 Chassis_t* FindChassisByTag(const RaidController_t* ctrl, const char* tag) {
     // A chassis is denied after it has been found: clients know the drives by their DeviceID, and
     // with a chassis they would be shown by slot and enclosure.
-    const Chassis_t* found = Find(kChassisLookup, ctrl->ChassisList, tag);
-    if (found != nullptr) LogMissing(kChassisLookup, ctrl->ChassisList, tag);
+    const List_t* enclosures = DevicesOf(ctrl, kEnclosures);
+    if (Find(kChassisLookup, enclosures, tag) != nullptr) {
+        LogMissing(kChassisLookup, enclosures, tag);
+    }
     return nullptr;
 }
 

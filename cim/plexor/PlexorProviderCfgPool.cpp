@@ -15,7 +15,8 @@ int BuildAll(const char* caller, const DeviceKind& kind, const CMPIInstanceMI* m
         {caller, ctx, ctrl->ControllerOp, action.AssociationClassName, action.AssociatedClassName});
     if (found == nullptr) return RESULT_OK;
 
-    ClassLock lock(ctrl, ctrl->*kind.classMutex, action.AssociatedClassName);
+    pthread_mutex_t& classMutex = ctrl->*kind.classMutex;
+    ClassLock lock(ctrl, classMutex, action.AssociatedClassName);
     int rc = RESULT_OK;
     while (rc == RESULT_OK && !StopRequested()) {
         const CMPIInstance* inst = NextInstance(found);

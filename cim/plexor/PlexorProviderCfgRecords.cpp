@@ -151,7 +151,7 @@ namespace {
 int Unlink(RaidController_t* ctrl, const DeviceKind& kind, void* device) {
     if (ctrl == nullptr) return RESULT_BAD_ARGUMENT;
     MutexGuard lock(ctrl->CtrlMutex);
-    return RemoveEntryFromListByKey(ctrl->*kind.list, device);
+    return RemoveEntryFromListByKey(DevicesOf(ctrl, kind), device);
 }
 
 int Delete(RaidController_t* ctrl, const DeviceKind& kind, void* device) {
@@ -195,7 +195,7 @@ int DeleteDisk(RaidController_t* ctrl, void* device) {
     if (ctrl == nullptr) return RESULT_BAD_ARGUMENT;
     // Held to the end: no reader may see the drive gone from the list but still in its pool.
     MutexGuard lock(ctrl->CtrlMutex);
-    const int rc = RemoveEntryFromListByKey(ctrl->DiskList, device);
+    const int rc = RemoveEntryFromListByKey(DevicesOf(ctrl, kDrives), device);
     if (rc != RESULT_OK) return rc;
 
     auto* disk = static_cast<DiskDrive_t*>(device);

@@ -31,15 +31,15 @@ std::atomic<unsigned int> __LivingWorkers;              // of the present life
 pthread_cond_t __ItemEnded = PTHREAD_COND_INITIALIZER;  // with PlexorThreadMutex
 
 /// A worker between two waits. They are linked, so that the present life's can be told from one
-/// that an earlier life left behind. Guarded by PlexorThreadMutex, which the caller holds at both
-/// ends of the scope.
+/// that an earlier life left behind.
 class ActiveWorker {
 public:
-    ActiveWorker() : next_(first_) {
+    ActiveWorker() PLEXOR_HOLDS(PlexorThreadMutex) : next_(first_) {
+        ExpectHeld(PlexorThreadMutex, __func__);
         first_ = this;
         ActiveThreads++;
     }
-    ~ActiveWorker() {
+    ~ActiveWorker() PLEXOR_HOLDS(PlexorThreadMutex) {
         ActiveWorker** link = &first_;
         while (*link != this) link = &(*link)->next_;
         *link = next_;
@@ -51,19 +51,19 @@ public:
     void SetRunning(bool running) { running_ = running; }
 
     /// How many of the present life run an item.
-    static unsigned int CountRunning() {
+    static unsigned int CountRunning() PLEXOR_HOLDS(PlexorThreadMutex) {
         return Count([](const ActiveWorker& worker) {
             return worker.running_ && worker.life_ == PresentLife();
         });
     }
     /// How many belong to earlier lives.
-    static unsigned int CountOld() {
+    static unsigned int CountOld() PLEXOR_HOLDS(PlexorThreadMutex) {
         return Count([](const ActiveWorker& worker) { return worker.life_ != PresentLife(); });
     }
 
 private:
     template <typename Condition>
-    static unsigned int Count(Condition condition) {
+    static unsigned int Count(Condition condition) PLEXOR_HOLDS(PlexorThreadMutex) {
         unsigned int count = 0;
         for (const ActiveWorker* worker = first_; worker != nullptr; worker = worker->next_) {
             if (condition(*worker)) count++;
@@ -71,7 +71,7 @@ private:
         return count;
     }
 
-    static ActiveWorker* first_;
+    static ActiveWorker* first_ PLEXOR_GUARDED_BY(PlexorThreadMutex);
     const unsigned int life_ = OwnLife();
     bool running_ = false;
     ActiveWorker* next_;
@@ -81,9 +81,9 @@ ActiveWorker* ActiveWorker::first_ = nullptr;
 
 std::atomic<unsigned int> __TerminatedLife = 0;  // whose stop set TerminateThread; 0: unknown
 
-/// Told to leave by the stop of this worker's life, not by an earlier one's. The caller holds
-/// PlexorThreadMutex.
-bool ToldToLeave() {
+/// Told to leave by the stop of this worker's life, not by an earlier one's.
+bool ToldToLeave() PLEXOR_HOLDS(PlexorThreadMutex) {
+    ExpectHeld(PlexorThreadMutex, __func__);
     if (LifeIsOver()) return true;
     return TerminateThread != 0 && (__TerminatedLife == 0 || __TerminatedLife == PresentLife());
 }
@@ -91,11 +91,12 @@ bool ToldToLeave() {
 /// A work function's run, with PlexorThreadMutex released.
 class RunningItem {
 public:
-    RunningItem(ActiveWorker& worker, MutexGuard& lock) : worker_(worker), lock_(lock) {
+    RunningItem(ActiveWorker& worker, MutexGuard& lock) PLEXOR_LOCKS_UNCHECKED : worker_(worker),
+                                                                                 lock_(lock) {
         worker_.SetRunning(true);
         lock_.Unlock();
     }
-    ~RunningItem() {
+    ~RunningItem() PLEXOR_LOCKS_UNCHECKED {
         lock_.Lock();
         worker_.SetRunning(false);
         pthread_cond_broadcast(&__ItemEnded);
@@ -128,7 +129,7 @@ Thread_Args_t* TakeItem() {
 }
 
 /// Runs the next item. False when there is none, or none may begin.
-bool RunNextItem(CMPIContext* ctx, long index, MutexGuard& lock) {
+bool RunNextItem(CMPIContext* ctx, long index, MutexGuard& lock) PLEXOR_HOLDS(PlexorThreadMutex) {
     ActiveWorker worker;
     Thread_Args_t* item = TakeItem();
     if (item == nullptr) return false;
@@ -148,8 +149,7 @@ bool RunNextItem(CMPIContext* ctx, long index, MutexGuard& lock) {
 ///   a look: told to leave    yes                       no, it waits for the next wake-up
 ///   a look: work is queued   yes, without a stop       yes, without a stop
 ///   a look: a later life     yes                       yes
-/// The caller holds PlexorThreadMutex.
-void WaitForWork(bool wasBusyWhenTold) {
+void WaitForWork(bool wasBusyWhenTold) PLEXOR_HOLDS(PlexorThreadMutex) {
     for (;;) {
         if (LifeIsOver()) return;
         if (ToldToLeave() && !wasBusyWhenTold) return;
@@ -160,8 +160,9 @@ void WaitForWork(bool wasBusyWhenTold) {
     }
 }
 
-/// Takes items until it is told to leave. The caller holds PlexorThreadMutex.
-void WorkUntilTerminated(CMPIContext* ctx, long index, MutexGuard& lock) {
+/// Takes items until it is told to leave.
+void WorkUntilTerminated(CMPIContext* ctx, long index, MutexGuard& lock)
+    PLEXOR_HOLDS(PlexorThreadMutex) {
     bool wasBusy = false;
     for (;;) {
         if (RunNextItem(ctx, index, lock)) {
@@ -226,7 +227,7 @@ bool JoinWorkers() {
 }
 
 /// What earlier lives left behind in the workers' words.
-void ForgetEarlierLives() {
+void ForgetEarlierLives() PLEXOR_LOCKS_UNCHECKED {
     __LivingWorkers = 0;
     // A word that has been reset is nobody's any more.
     if (LoadShared(TerminateThread) == 0) __TerminatedLife = 0;
@@ -256,6 +257,7 @@ int QueueItem(Thread_Args_t* item) {
 }
 
 unsigned int ActiveWorkers() {
+    ExpectHeld(PlexorThreadMutex, __func__);
     const unsigned int old = ActiveWorker::CountOld();
     return ActiveThreads > old ? ActiveThreads - old : 0;
 }

@@ -4,6 +4,8 @@
 #include <pthread.h>
 #include <time.h>
 
+#include "PlexorProviderThreadSafety.h"
+
 /// A moment on the monotonic clock.
 class Deadline {
 public:
@@ -36,7 +38,8 @@ private:
     timespec moment_ = {};
 };
 
-/// Waits for a signal; the caller holds `mutex`. False when the deadline came first.
-inline bool WaitUntil(pthread_cond_t& cond, pthread_mutex_t& mutex, const Deadline& deadline) {
+/// Waits for a signal. False when the deadline came first.
+inline bool WaitUntil(pthread_cond_t& cond, pthread_mutex_t& mutex, const Deadline& deadline)
+    PLEXOR_HOLDS(mutex) {
     return pthread_cond_clockwait(&cond, &mutex, CLOCK_MONOTONIC, &deadline.Moment()) == 0;
 }

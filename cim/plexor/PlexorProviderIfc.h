@@ -38,13 +38,17 @@ int RetrieveControllerAndDeviceIDs(const CMPIObjectPath* cop, const char* prefix
 // for the device classes.
 void FillControllerInstance(CMPIInstance* inst, RaidController_t* ctrl);
 void FillSoftwareIdentityInstance(CMPIInstance* inst, RaidController_t* ctrl);
-void FillVolumeInstance(CMPIInstance* inst, RaidController_t* ctrl, StorageVolume_t* volume);
-void FillExtentInstance(CMPIInstance* inst, RaidController_t* ctrl, DiskDrive_t* extent);
-void FillPortInstance(CMPIInstance* inst, RaidController_t* ctrl, SASSATAPort_t* port);
-void FillBatteryInstance(CMPIInstance* inst, RaidController_t* ctrl, Battery_t* battery);
+void FillVolumeInstance(CMPIInstance* inst, RaidController_t* ctrl, StorageVolume_t* volume)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
+void FillExtentInstance(CMPIInstance* inst, RaidController_t* ctrl, DiskDrive_t* extent)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
+void FillPortInstance(CMPIInstance* inst, RaidController_t* ctrl, SASSATAPort_t* port)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
+void FillBatteryInstance(CMPIInstance* inst, RaidController_t* ctrl, Battery_t* battery)
+    PLEXOR_HOLDS(ctrl->CtrlMutex);
 
 /// HealthState of a port or battery.
 CMPIUint16 GetHealthStateByOpStatus(CMPIUint16 opStatus);
 /// The drive's condition in one word of the provider's own, and its HealthState.
 const char* GetDiskPhysicalStatus(const RaidController_t* ctrl, const DiskDrive_t* disk,
-                                  CMPIUint16* health);
+                                  CMPIUint16* health) PLEXOR_HOLDS(ctrl->CtrlMutex);

@@ -41,7 +41,8 @@ CMPIUint16 NameSpaceOf(CMPIUint16 nameFormat) {
 /// The member's record. The request waits until there is one: a member is never left out. It does
 /// not wait for ever: who changes the members changes the records in the same hold of CtrlMutex.
 /// Null when a cleanup has given up waiting for the request.
-const DiskDrive_t* WaitForDisk(const RaidController_t* ctrl, const char* deviceID) {
+const DiskDrive_t* WaitForDisk(const RaidController_t* ctrl, const char* deviceID)
+    PLEXOR_HOLDS(ctrl->CtrlMutex) {
     const DiskDrive_t* disk = FindDiskByDeviceID(ctrl, deviceID);
     while (disk == nullptr && !LifeGuard().MemberOfEnded()) {
         sched_yield();
@@ -50,7 +51,8 @@ const DiskDrive_t* WaitForDisk(const RaidController_t* ctrl, const char* deviceI
     return disk;
 }
 
-void AppendMembers(VolumeText& text, const RaidController_t* ctrl, const StoragePool_t* pool) {
+void AppendMembers(VolumeText& text, const RaidController_t* ctrl, const StoragePool_t* pool)
+    PLEXOR_HOLDS(ctrl->CtrlMutex) {
     text.Append(", Drives(");
     // Without members the parenthesis stays open: that is the text's form.
     const List_Entry_t* entry = pool->Drives->Head;
@@ -67,7 +69,8 @@ void AppendMembers(VolumeText& text, const RaidController_t* ctrl, const Storage
     }
 }
 
-void ComposeName(VolumeText& text, const RaidController_t* ctrl, const StorageVolume_t* volume) {
+void ComposeName(VolumeText& text, const RaidController_t* ctrl, const StorageVolume_t* volume)
+    PLEXOR_HOLDS(ctrl->CtrlMutex) {
     if (volume->RaidLevel != nullptr && volume->RaidLevel[0] != '\0') {
         text.Append("%s ", volume->RaidLevel);
     }

@@ -37,7 +37,8 @@ const char* DeviceIdOf(const void* record) {
 }
 
 template <typename Record, void (*Fill)(CMPIInstance*, RaidController_t*, Record*)>
-void RenderDevice(CMPIInstance* inst, RaidController_t* ctrl, void* record) {
+void RenderDevice(CMPIInstance* inst, RaidController_t* ctrl, void* record)
+    PLEXOR_HOLDS(ctrl->CtrlMutex) {
     Fill(inst, ctrl, static_cast<Record*>(record));
 }
 
@@ -180,7 +181,7 @@ int ReturnDevices(const Request& request, RaidController_t* ctrl, const Wanted& 
     const DeviceKind& kind = *request.served->kind;
     int found = 0;
     MutexGuard lock(ctrl->CtrlMutex);
-    const List_Entry_t* entry = (ctrl->*kind.list)->Head;
+    const List_Entry_t* entry = DevicesOf(ctrl, kind)->Head;
     for (; entry != nullptr; entry = entry->Next) {
         if (!SameId(wanted.deviceId, request.served->deviceId(entry->Data))) continue;
         ReturnRecord(request, ctrl, entry->Data);

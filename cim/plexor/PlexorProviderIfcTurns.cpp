@@ -23,21 +23,25 @@ std::atomic<bool> __CleaningUp = false;
 CallsInFlight __Requests;
 CallsInFlight __FactoryCalls;
 
-// Guarded by __TurnMutex.
-pthread_t __Initialiser;             // meaningful while __Initialising
-unsigned int __InitTurns = 0;        // turns given so far; the latest one's number
-unsigned int __CleanupsBegun = 0;    // those that took the turn
-unsigned int __CleanupsEnded = 0;    // likewise
-unsigned int __CleanupsWaiting = 0;  // for another one's end
-Deadline __LeaveBy;                  // meaningful while __CleaningUp
+// Meaningful while __Initialising.
+pthread_t __Initialiser PLEXOR_GUARDED_BY(__TurnMutex);
+// Turns given so far; the latest one's number.
+unsigned int __InitTurns PLEXOR_GUARDED_BY(__TurnMutex) = 0;
+// Cleanups that took the turn, that gave it back, and that wait for another one's end.
+unsigned int __CleanupsBegun PLEXOR_GUARDED_BY(__TurnMutex) = 0;
+unsigned int __CleanupsEnded PLEXOR_GUARDED_BY(__TurnMutex) = 0;
+unsigned int __CleanupsWaiting PLEXOR_GUARDED_BY(__TurnMutex) = 0;
+// Meaningful while __CleaningUp.
+Deadline __LeaveBy PLEXOR_GUARDED_BY(__TurnMutex);
 
 void Announce() {
     pthread_cond_broadcast(&__TurnChanged);
 }
 
-/// Waits until `quiet` or the limit, which may be brought forward; the caller holds __TurnMutex.
+/// Waits until `quiet` or the limit, which may be brought forward.
 template <typename Condition>
-bool Await(const Deadline& limit, Condition quiet) {
+bool Await(const Deadline& limit, Condition quiet) PLEXOR_HOLDS(__TurnMutex) {
+    ExpectHeld(__TurnMutex, __func__);
     while (!quiet()) {
         const Deadline deadline = limit;
         if (WaitUntil(__TurnChanged, __TurnMutex, deadline)) continue;
@@ -50,7 +54,7 @@ bool OldRequestsAreGone() {
     return __Requests.ClosedAreGone();
 }
 
-bool CalledFromTheSearch() {
+bool CalledFromTheSearch() PLEXOR_HOLDS(__TurnMutex) {
     return __Initialising && pthread_equal(__Initialiser, pthread_self());
 }
 
@@ -64,8 +68,8 @@ void Leave(CallsInFlight& calls, unsigned int generation) {
 /// One of the cleanups that wait for another one's end, also when the thread is cancelled.
 class WaitingCleanup {
 public:
-    WaitingCleanup() { __CleanupsWaiting++; }
-    ~WaitingCleanup() {
+    WaitingCleanup() PLEXOR_HOLDS(__TurnMutex) { __CleanupsWaiting++; }
+    ~WaitingCleanup() PLEXOR_HOLDS(__TurnMutex) {
         __CleanupsWaiting--;
         Announce();
     }
@@ -171,7 +175,7 @@ CleanupTurn::~CleanupTurn() {
     while (__CleanupsWaiting != 0) pthread_cond_wait(&__TurnChanged, &__TurnMutex);
 }
 
-void CleanupTurn::AwaitOther(MutexGuard& lock, time_t leaveSeconds) {
+void CleanupTurn::AwaitOther(MutexGuard& lock, time_t leaveSeconds) PLEXOR_LOCKS_UNCHECKED {
     const unsigned int awaited = __CleanupsBegun;
     const WaitingCleanup waiting;
     const Deadline own = Deadline::In(leaveSeconds);

@@ -17,18 +17,20 @@
 
 #include <type_traits>
 
+#include "PlexorProviderThreadSafety.h"
+
 /// Holds a mutex for a scope, or until Unlock. A thread that is cancelled gives it back, too.
-class MutexGuard {
+class PLEXOR_SCOPED_LOCK MutexGuard {
 public:
-    explicit MutexGuard(pthread_mutex_t& mutex) : mutex_(&mutex) { Lock(); }
-    ~MutexGuard() { Unlock(); }
+    explicit MutexGuard(pthread_mutex_t& mutex) PLEXOR_TAKES(mutex) : mutex_(&mutex) { Lock(); }
+    ~MutexGuard() PLEXOR_GIVES_BACK() { Unlock(); }
     MutexGuard(const MutexGuard&) = delete;
     MutexGuard& operator=(const MutexGuard&) = delete;
 
     /// False when the mutex could not be taken.
     bool Locked() const { return locked_; }
-    void Lock() { locked_ = pthread_mutex_lock(mutex_) == 0; }
-    void Unlock() {
+    void Lock() PLEXOR_TAKES() { locked_ = pthread_mutex_lock(mutex_) == 0; }
+    void Unlock() PLEXOR_GIVES_BACK() {
         if (locked_) pthread_mutex_unlock(mutex_);
         locked_ = false;
     }
@@ -37,6 +39,16 @@ private:
     pthread_mutex_t* mutex_;
     bool locked_;
 };
+
+#if defined(PLEXOR_CHECK_LOCKS)
+/// Tells on standard error, and counts, that `function` was called without a mutex that its caller
+/// has to hold. In checking builds only.
+void ExpectHeld(const pthread_mutex_t& mutex, const char* function);
+/// How often that was told.
+unsigned int LocksMissed();
+#else
+inline void ExpectHeld(const pthread_mutex_t&, const char*) {}
+#endif
 
 // Exported words that one thread writes while another reads them without a lock. They keep their
 // plain types for whoever looks at them; only their own value matters, so relaxed.

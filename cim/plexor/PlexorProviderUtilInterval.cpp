@@ -13,7 +13,7 @@ constexpr const char kIntervalOption[] = "/UserVars/CIMtvx_plexorProviderPolling
 
 // A cancelled thread unwinds without an exception object; naming it as one is what the sanitizer
 // objects to, and how it is told from a real one.
-[[gnu::no_sanitize("undefined")]] int GetSampelInterval();
+int GetSampelInterval() __attribute__((no_sanitize("undefined")));
 
 int GetSampelInterval() {
     try {

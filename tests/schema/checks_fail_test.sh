@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# Proves that check-schema, check-size and messages --check notice a change of either side: each case changes one
-# thing in a copy of the tree and wants a complaint that names it.
+# Proves that check-schema, check-size, check-locks and messages --check notice a change of either
+# side: each case changes one thing in a copy of the tree and wants a complaint that names it.
 #
 #   checks_fail_test.sh SOURCE_TREE
 set -euo pipefail
@@ -13,12 +13,13 @@ cases=0 failures=0
 fresh_copy() {
     rm -rf "$scratch/tree"
     mkdir -p "$scratch/tree/cim"
-    cp -r "$tree/cim/plexor" "$tree/cim/hostconfig" "$tree/cim/schema" "$scratch/tree/cim"
+    cp -r "$tree"/cim/{cmpi,plexor,hostconfig,schema} "$scratch/tree/cim"
     cp -r "$tree/docs" "$scratch/tree"
 }
 
 check_schema() { "$tree/scripts/check-schema" "$scratch/tree"; }
 check_size() { "$tree/scripts/check-size" "$scratch/tree"; }
+check_locks() { "$tree/scripts/check-locks" "$scratch/tree" "$file"; }
 check_messages() { "$tree/scripts/messages" --root "$scratch/tree" --check; }
 
 # CHECK COMPLAINT FILE SED_EXPRESSION
@@ -62,13 +63,15 @@ must_complain check_schema "property Caption is set as uint8" cim/plexor/PlexorP
 must_complain check_schema "key devicename of the schema" ${mof}StorageVolume.mof \
     's/DeviceID/DeviceName/'
 must_complain check_schema "sets the key Label" cim/plexor/PlexorProviderIfcKeys.cpp \
-    's/AddKey\(cop, "InstanceID"/AddKey(cop, "Label"/'
+    's/AddKey\(cop, kSoftwareKey/AddKey(cop, "Label"/'
+must_complain check_schema "sets the key Label" cim/plexor/PlexorProviderIfc.h \
+    's/"InstanceID"/"Label"/'
 must_complain check_schema "AddKey does not add strings" cim/plexor/PlexorProviderIfcKeys.cpp \
     's/\(value\), CMPI_chars/(value), CMPI_uint16/'
 must_complain check_schema "SetNameAndCaption is defined in another file too" ${render}.cpp \
     's/^void SetStatusAndHealth/void SetNameAndCaption/'
 must_complain check_schema "served, but not in the schema" cim/plexor/PlexorProviderIfcServe.cpp \
-    's/\{"Tovexa_PlexorBattery"/{"Tovexa_PlexorCell"/'
+    's/= "Tovexa_PlexorBattery"/= "Tovexa_PlexorCell"/'
 
 # What the schema says.
 must_complain check_schema "the schema says uint32" ${mof}StorageVolume.mof \
@@ -101,13 +104,13 @@ must_complain check_schema "PlexorProvider.plain: has Tovexa_PlexorController 0 
 must_complain check_schema "PlexorProviderModule.mof: has Tovexa_PlexorStorageExtent 0 times" \
     cim/schema/registration/PlexorProviderModule.mof 's/= "Tovexa_PlexorStorageExtent"/= ""/'
 
-# What the provider logs: at a call, in both kinds of table, in a choice, in a header.
+# What the provider logs: at a call, in a template, in a choice, in a header.
 must_complain check_messages "no meaning for: A new line" cim/plexor/PlexorProviderIfcKeys.cpp \
     's/"malloc failure/"A new line/'
-must_complain check_messages "no meaning for: %s: checking poool" \
-    cim/plexor/PlexorProviderCfgLookup.cpp 's/: checking pool/: checking poool/'
-must_complain check_messages "no meaning for: NULL DeviceId for port" \
-    cim/plexor/PlexorProviderCfgPortBattery.cpp 's/NULL DeviceID for port/NULL DeviceId for port/'
+must_complain check_messages "no meaning for: %s: looking at" \
+    cim/plexor/PlexorProviderCfgLookup.cpp 's/"%s: checking/"%s: looking at/'
+must_complain check_messages "no meaning for: NULL DeviceId for" \
+    cim/plexor/PlexorProviderCfgBuild.cpp 's/NULL DeviceID for/NULL DeviceId for/'
 must_complain check_messages "locker %p, skipped" cim/plexor/PlexorProviderCfgReconcile.cpp \
     's/locker %p, skip"/locker %p, skipped"/'
 must_complain check_messages "no meaning for: strdup failed" cim/plexor/PlexorProvider.h \
@@ -130,17 +133,29 @@ must_complain check_messages "sources do not have: An old line" docs/messages.me
 must_complain check_messages "twice: malloc failure" docs/messages.meanings \
     's/^List %p is empty/malloc failure/'
 
+# Locks that are taken no more, given back too soon, or taken twice.
+must_complain check_locks "requires holding mutex 'ctrl->CtrlMutex'" \
+    cim/plexor/PlexorProviderCfgRecords.cpp '/Held to the end/,+1d'
+must_complain check_locks "requires holding mutex 'PlexorThreadMutex'" \
+    cim/plexor/PlexorProviderCfgInventory.cpp \
+    '/^bool InventoryDone/,/^}/{/MutexGuard/d}'
+must_complain check_locks "requires holding mutex 'ctrl->CtrlMutex'" \
+    cim/plexor/PlexorProviderIfcServe.cpp 's/^    const List_Entry_t\* entry = DevicesOf/    lock.Unlock();\n&/'
+must_complain check_locks "cannot call function 'StampTime' while mutex 'ctrl->CtrlMutex' is held" \
+    cim/plexor/PlexorProviderCfgDiskUpdate.cpp 's/^        StampTime/        const MutexGuard lock(ctrl->CtrlMutex);\n&/'
+
 # What has grown too long.
 lines=$(printf '    ;\\n%.0s' {1..40})
 must_complain check_size "46 lines, at most 40: void RequestStop() {" \
     cim/plexor/PlexorProviderUtilLife.cpp "s/^void RequestStop\(\) \{/&\n$lines/"
 must_complain check_size "41 lines, at most 40: CallScope() {" cim/plexor/PlexorProviderLock.h \
-    "s/^class MutexGuard \{/class Scope {\n    CallScope() {\n${lines%    ;\\n}    }\n};\n&/"
+    "s/^class PLEXOR_SCOPED_LOCK MutexGuard \{/class Scope {\n    CallScope() {\n${lines%    ;\\n}    }\n};\n&/"
 must_complain check_size "PlexorProviderUtilLife.cpp: 4" cim/plexor/PlexorProviderUtilLife.cpp \
     "1s/^/$(printf '\\n%.0s' {1..400})/"
 
 fresh_copy
-if ! check_schema || ! check_messages || ! check_size; then
+file=cim/plexor/PlexorProviderCfgRecords.cpp
+if ! check_schema || ! check_messages || ! check_size || ! check_locks; then
     echo "FAIL: the unchanged copy is refused"
     failures=$((failures + 1))
 fi

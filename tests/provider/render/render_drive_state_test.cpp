@@ -2,6 +2,7 @@
 #include <string>
 
 #include "PlexorProviderIfc.h"
+#include "PlexorProviderLock.h"
 #include "owned_text.h"
 #include "provider_fixture.h"
 
@@ -66,6 +67,7 @@ protected:
     /// "WORD health" of the drive as it is.
     std::string state() {
         CMPIUint16 health = 4711;
+        const MutexGuard lock(ctrl->CtrlMutex);
         const char* word = GetDiskPhysicalStatus(ctrl, disk, &health);
         return std::string(word) + " " + std::to_string(health);
     }

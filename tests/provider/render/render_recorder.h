@@ -11,6 +11,7 @@
 #include <vector>
 
 #include "PlexorProvider.h"
+#include "PlexorProviderLock.h"
 #include "captured_syslog.h"
 
 namespace plexortest {
@@ -196,11 +197,18 @@ private:
     bool arraysRefused_ = false;
 };
 
+/// Renders into the recorder, with the controller's lock held as a request holds it.
+template <typename Fill, typename... Rest>
+void fillLocked(RenderRecorder& recorder, Fill fill, RaidController_t* ctrl, Rest*... rest) {
+    const MutexGuard lock(ctrl->CtrlMutex);
+    fill(recorder.instance(), ctrl, rest...);
+}
+
 /// The rows that a renderer sets, in order.
 template <class... Records>
 std::vector<PropertyCall> rowsOf(void (*fill)(CMPIInstance*, Records*...), Records*... records) {
     RenderRecorder recorder;
-    fill(recorder.instance(), records...);
+    fillLocked(recorder, fill, records...);
     return recorder.calls();
 }
 
@@ -224,7 +232,7 @@ std::vector<PropertyCall> rowsWithoutArraysToHave(void (*fill)(CMPIInstance*, Re
                                                   Records*... records) {
     RenderRecorder recorder;
     recorder.refuseArrays();
-    fill(recorder.instance(), records...);
+    fillLocked(recorder, fill, records...);
     return recorder.calls();
 }
 
