@@ -2,8 +2,9 @@
 // units (Ifc, Cfg, Util) call in each other. Dependencies point one way, Ifc -> Cfg -> Util; the
 // only references back are `Broker` and `InitCompleteTime`.
 //
-// Everything declared here with C linkage is exported under its plain name. Strings and object
-// paths in records are owned by the record; what the broker returned belongs to the broker.
+// Everything declared here with C linkage is exported under its plain name, and relied on outside;
+// functions that nothing in here calls say so. Strings and object paths in records are owned by the
+// record; what the broker returned belongs to the broker.
 //
 // Which lock guards a controller's devices stands at RaidController_t, the lock order in
 // PlexorProviderLock.h.
@@ -308,7 +309,7 @@ PLEXOR_API char* __SystemClassName;
 
 /// strcasecmp of the string's text (a string without text counts as "") and `str2`.
 PLEXOR_API int CMStringCmp(const CMPIString* str1, const char* str2);
-/// Pushes in front. Null data: no-op, 0. Null list: -1. No memory: -2.
+/// Pushes in front. Null data: no-op, 0. Null list: -1. No memory: -2. Called from outside only.
 PLEXOR_API int AddEntryAtListHead(List_t* list, void* data);
 /// Appends; results as AddEntryAtListHead.
 PLEXOR_API int AddEntryAtListTail(List_t* list, void* data);
@@ -334,7 +335,7 @@ PLEXOR_API void ReleaseSystemInfo();
 PLEXOR_API const char* GetHostName();
 PLEXOR_API const char* GetSystemName();
 PLEXOR_API const char* GetSystemClassName();
-/// Element 0 of an array property; a zero value when there is no array.
+/// Element 0 of an array property; a zero value when there is no array. Called from outside only.
 PLEXOR_API CMPIValue GetArrayProperty(const CMPIInstance* inst, const char* property);
 /// First element of OperationalStatus; 0 when there is no array.
 PLEXOR_API CMPIUint16 GetOperationalStatus(const CMPIInstance* inst);
@@ -352,7 +353,7 @@ PLEXOR_API CMPIObjectPath* GetPortOp(const void* device);
 PLEXOR_API CMPIObjectPath* GetBatteryOp(const void* device);
 PLEXOR_API CMPIObjectPath* GetPoolOp(const void* device);
 PLEXOR_API CMPIObjectPath* GetChassisOp(const void* device);
-PLEXOR_API CMPIObjectPath* GetControllerOp(const void* device);
+PLEXOR_API CMPIObjectPath* GetControllerOp(const void* device);  ///< called from outside only
 
 // Release functions; null is ignored. No locks: the record is in no list any more.
 PLEXOR_API void FreeVolume(void* data);
@@ -397,7 +398,8 @@ PLEXOR_API int BuildControllerInfo(const CMPIInstanceMI* mi, const CMPIContext* 
                                    Array_t* profiles);
 /// Always 1: every record is refreshed on every pass.
 PLEXOR_API int NeedUpdate(time_t lastUpdateTime, unsigned char updateEnabled);
-/// Moves the controller's time stamp; reads nothing anew. Always 0. Takes CtrlMutex.
+/// Moves the controller's time stamp; reads nothing anew. Always 0. Called from outside only:
+/// controllers are not refreshed.
 PLEXOR_API int CheckAndUpdateControllerInfo(const CMPIInstanceMI* mi, const CMPIContext* ctx,
                                             RaidController_t* ctrl, void* device,
                                             CMPIInstance* devInst) PLEXOR_WITHOUT(ctrl->CtrlMutex);

