@@ -20,3 +20,16 @@ if(PLEXOR_COVERAGE)
     add_compile_options(--coverage -O0)
     add_link_options(--coverage)
 endif()
+
+# For the directories around the provider, whose code is not what is measured or busy: what the compiler
+# saves counts for more than what it optimizes or checks. Undefined behaviour, whose checks are nearly
+# half of the time that they take to compile, is looked for in the provider; in the long form of
+# scripts/test everywhere.
+macro(plexor_options_around)
+    if(CMAKE_BUILD_TYPE STREQUAL "Release")
+        add_compile_options(-O1)
+    endif()
+    if(PLEXOR_SANITIZE_PROVIDER_ONLY)
+        add_compile_options(-fno-sanitize=${PLEXOR_SANITIZE_PROVIDER_ONLY})
+    endif()
+endmacro()

@@ -10,6 +10,8 @@ set(PLEXOR_HOSTCONFIG "" CACHE STRING
     "Library of the host's option store (empty: the file-backed stand-in in cim/hostconfig)")
 set(PLEXOR_SANITIZE "" CACHE STRING "Sanitizers for every target, as -fsanitize takes them")
 option(PLEXOR_CHECK_LOCKS "Tell on standard error of a call without the locks that it needs" OFF)
+set(PLEXOR_SANITIZE_PROVIDER_ONLY "" CACHE STRING
+    "Those of PLEXOR_SANITIZE that the test bed, the tests and the benchmarks go without")
 option(PLEXOR_COVERAGE "Instrument for coverage" OFF)
 
 # The two builds must not be taken for one another, so their packages have names of their own. What

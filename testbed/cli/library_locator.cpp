@@ -14,7 +14,7 @@ constexpr const char* kLibraryName = "libPlexorProvider.so";
 /// Below the directory of the build for the host's manager; there is none where that one is
 /// standard.
 constexpr const char* kStandard = "standard";
-constexpr const char* kDirectories[] = {".", BUILT_PROVIDER_DIR, INSTALLED_PROVIDER_DIR};
+constexpr const char* kLibraryDirectories[] = {".", BUILT_PROVIDER_DIR, INSTALLED_PROVIDER_DIR};
 
 }  // namespace
 
@@ -22,7 +22,7 @@ std::string locateLibrary(const std::string& chosen, const BrokerOptions& manage
     // A bare file name would be searched for in the system's directories.
     if (!chosen.empty()) return fs::absolute(chosen).string();
     const fs::path here = toolDirectory();
-    for (const char* directory : kDirectories) {
+    for (const char* directory : kLibraryDirectories) {
         const fs::path file = (here / directory / kLibraryName).lexically_normal();
         const fs::path standard = file.parent_path() / kStandard / kLibraryName;
         if (!manager.hasContextFlush() && fs::exists(standard)) return standard.string();

@@ -9,13 +9,13 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr const char* kDirectories[] = {BUILT_SCENARIO_DIR, INSTALLED_SCENARIO_DIR};
+constexpr const char* kScenarioDirectories[] = {BUILT_SCENARIO_DIR, INSTALLED_SCENARIO_DIR};
 
 }  // namespace
 
 fs::path scenarioDirectory() {
     const fs::path here = toolDirectory();
-    for (const char* directory : kDirectories) {
+    for (const char* directory : kScenarioDirectories) {
         const fs::path found = (here / directory).lexically_normal();
         if (fs::is_directory(found)) return found;
     }

@@ -10,14 +10,14 @@ namespace {
 
 namespace fs = std::filesystem;
 
-constexpr const char* kDirectories[] = {BUILT_SCHEMA_DIR, INSTALLED_SCHEMA_DIR};
+constexpr const char* kSchemaDirectories[] = {BUILT_SCHEMA_DIR, INSTALLED_SCHEMA_DIR};
 
 }  // namespace
 
 fs::path locateSchema(const std::string& chosen) {
     if (!chosen.empty()) return chosen;
     const fs::path here = toolDirectory();
-    for (const char* directory : kDirectories) {
+    for (const char* directory : kSchemaDirectories) {
         const fs::path schema = (here / directory).lexically_normal();
         if (fs::exists(schema / kSchemaFile)) return schema;
     }

@@ -2,7 +2,9 @@
 #include <gtest/gtest.h>
 #include <httplib.h>
 
+#include <cstdlib>
 #include <regex>
+#include <vector>
 
 #include "canned_answers.h"
 #include "elements.h"
@@ -46,7 +48,13 @@ std::string chunked(const std::string& body) {
            std::string(size) + body + "\r\n0\r\nCIMStatusCode: 0\r\n\r\n";
 }
 
-TEST(TruncatedAnswers, AreUnknownAtEveryByte) {
+/// Every 11th byte for the tool, whose start is what takes the time; the client alone is asked at
+/// every one. With PLEXOR_LONG in the environment the tool as well.
+std::size_t stride() {
+    return getenv("PLEXOR_LONG") != nullptr ? 1 : 11;
+}
+
+TEST(TruncatedAnswers, AreUnknownToTheCheck) {
     const std::string whole = http(realAnswer());
     ASSERT_NE(whole.find(kSameId), std::string::npos);
     std::size_t size = whole.size();
@@ -54,7 +62,10 @@ TEST(TruncatedAnswers, AreUnknownAtEveryByte) {
     const std::string command =
         "ask --check --refresh 0 --class " + std::string(kBattery) + " " + server.url();
     ASSERT_EQ(runTool(command).status, 0);
-    for (size = 0; size < whole.size(); size++) {
+    std::vector<std::size_t> cuts = {whole.size() - 1, whole.find("\r\n\r\n") + 4};
+    for (std::size_t cut = 0; cut < whole.size(); cut += stride()) cuts.push_back(cut);
+    for (const std::size_t cut : cuts) {
+        size = cut;
         const Outcome outcome = runTool(command);
         ASSERT_EQ(outcome.status, 3) << size << ": " << outcome.output;
         ASSERT_EQ(outcome.output.find("PLEXOR UNKNOWN - 127.0.0.1:"), 0u) << outcome.output;
@@ -62,11 +73,11 @@ TEST(TruncatedAnswers, AreUnknownAtEveryByte) {
     }
 }
 
-TEST(TruncatedAnswers, AreNoAnswersInOtherForms) {
+TEST(TruncatedAnswers, AreNoAnswersAtEveryByteInAnyForm) {
     const std::string body = realAnswer();
     const std::size_t lastTag = body.rfind('>');
     const std::string untilTheEnd = "HTTP/1.1 200 OK\r\n\r\n" + body.substr(0, lastTag + 1);
-    for (const std::string& whole : {chunked(body), untilTheEnd}) {
+    for (const std::string& whole : {http(body), chunked(body), untilTheEnd}) {
         std::size_t size = whole.size();
         const ScriptedServer server([&](const std::string&) { return whole.substr(0, size); });
         testbed::WbemClient client(testbed::parseWbemUrl(server.url()),

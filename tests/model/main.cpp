@@ -148,12 +148,15 @@ int main(int argc, char** argv) {
     CLI::App app("Compares the provider's cache with a model under random changes");
     unsigned seed = std::random_device()();
     int steps = 10000;
+    int longSteps = 0;
     std::string manager = "host";
     app.add_option("--seed", seed, "Seed of the changes; drawn when not given");
     app.add_option("--steps", steps, "Number of requests");
+    app.add_option("--long-steps", longSteps, "The number with PLEXOR_LONG in the environment");
     app.add_option("--manager", manager,
                    "Kind of manager, but for random-order and dangling-fails");
     CLI11_PARSE(app, argc, argv);
+    if (longSteps > 0 && getenv("PLEXOR_LONG") != nullptr) steps = longSteps;
 
     std::cout << "seed " << seed << ", " << steps << " steps" << std::endl;
     testbed::BrokerOptions options;
