@@ -109,6 +109,18 @@ TYPED_TEST(DeviceUpdateFetch, StampsInAHoldOfTheLockOfItsOwn) {
     EXPECT_THAT(atEnds, Each(std::pair<int, time_t>{6, this->kStart}));
 }
 
+TYPED_TEST(DeviceUpdateFetch, ReadsOddStatusAsZero) {
+    ASSERT_EQ(this->buildIt(), 0);
+    for (const OddValue& odd : oddArrays()) {
+        SCOPED_TRACE(odd.label);
+        this->record()->OperationalStatus = 6;
+        this->give(this->path_, "OperationalStatus", odd);
+        CMPIInstance* fresh = this->instanceAt(this->path_);
+        ASSERT_EQ(this->update(TypeParam::update, this->record(), fresh), 0);
+        EXPECT_EQ(this->record()->OperationalStatus, 0);
+    }
+}
+
 TYPED_TEST(DeviceUpdateFetch, LogsAFailureThatCameWithAnInstanceAndUsesTheInstance) {
     ASSERT_EQ(this->buildIt(), 0);
     this->repository.setProperty(this->path_, "OperationalStatus", CimValue::uint16Array({6}));
