@@ -1,3 +1,4 @@
+// Opening and ending arenas, thread by thread, and the shells that stay to tell of late uses.
 #include "arena.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// The names of the table entries, and the lists of calls, living objects and misuses.
 #include "books.h"
 
 #include <algorithm>

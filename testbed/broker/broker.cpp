@@ -1,3 +1,4 @@
+// Putting a broker together: its tables, the scope of a call, objects for clients, start and stop.
 #include "broker.h"
 
 #include <utility>

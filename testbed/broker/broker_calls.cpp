@@ -1,3 +1,4 @@
+// Admitting an up-call by its thread and context, and the call's entry in the books.
 #include "broker_calls.h"
 
 #include <string>

@@ -1,3 +1,4 @@
+// The table of makers: new instances, paths, strings and arrays, and the tests of types.
 #include <cstring>
 #include <tuple>
 

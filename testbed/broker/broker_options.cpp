@@ -1,3 +1,4 @@
+// Where a manager offers the flush: in the context's table, or as a function of its own.
 #include "broker_options.h"
 
 #include <cmpift.h>

@@ -1,3 +1,4 @@
+// The entries that ask: get, enumerate, and the four walks along associations.
 #include <algorithm>
 
 #include "broker_calls.h"

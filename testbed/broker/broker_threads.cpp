@@ -1,3 +1,4 @@
+// Preparing a context for a thread of the provider's, attaching it and detaching it.
 #include "broker_calls.h"
 #include "broker_tables.h"
 #include "object_context.h"

@@ -1,3 +1,4 @@
+// The entries that a provider may find but not use: they answer that they are not supported.
 #include <cerrno>
 #include <tuple>
 

@@ -1,3 +1,4 @@
+// What a fault rule makes of a call's answer: refused, NULL, falsified or late.
 #include "call.h"
 
 #include <cstring>

@@ -1,3 +1,4 @@
+// Comparing names, finding values by them, and the texts and identities of object paths.
 #include "cim_object.h"
 
 #include <algorithm>

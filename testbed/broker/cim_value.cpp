@@ -1,3 +1,4 @@
+// Making CIM values, comparing them and showing them as text.
 #include "cim_value.h"
 
 #include <cstdio>

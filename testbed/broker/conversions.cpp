@@ -1,3 +1,4 @@
+// Packing values into CMPIData, type by type, and reading what a provider passed.
 #include "conversions.h"
 
 #include <cstring>

@@ -1,3 +1,4 @@
+// Finding and loading the module with the exported flush, and pointing it at the brokers.
 #include "exported_flush.h"
 
 #include <dlfcn.h>

@@ -1,3 +1,4 @@
+// Matching calls with the rules, counting the rules down, and waits that can be ended.
 #include "faults.h"
 
 #include <algorithm>

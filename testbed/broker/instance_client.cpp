@@ -1,3 +1,4 @@
+// One request on the provider's table: a call scope, the arguments, and what the result collects.
 #include "instance_client.h"
 
 #include <charconv>

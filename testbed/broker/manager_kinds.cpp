@@ -1,3 +1,4 @@
+// The tables of behaviours and of managers, and reading a user's choice of them.
 #include "manager_kinds.h"
 
 #include <algorithm>

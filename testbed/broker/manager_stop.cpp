@@ -1,3 +1,4 @@
+// Repeating the cleanup on more threads while none returns, with a request going on beside it.
 #include "manager_stop.h"
 
 #include <atomic>

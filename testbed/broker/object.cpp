@@ -1,3 +1,4 @@
+// Begin, end and late use of an object, and the parts that end with it.
 #include "object.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// The function table of arrays, and reading and setting their elements.
 #include "object_array.h"
 
 #include "conversions.h"

@@ -1,3 +1,4 @@
+// The two function tables of contexts, with and without a flush, and their entries.
 #include "object_context.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// The function table of enumerations, walking one, and its array.
 #include "object_enumeration.h"
 
 #include "object_instance.h"

@@ -1,3 +1,4 @@
+// The function table of instances, the property filter, and the check of a property's type.
 #include "object_instance.h"
 
 #include <algorithm>

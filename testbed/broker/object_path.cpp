@@ -1,3 +1,4 @@
+// The function table of object paths: namespace, host, class and keys.
 #include "object_path.h"
 
 #include <tuple>

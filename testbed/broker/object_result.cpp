@@ -1,3 +1,4 @@
+// The function table of results, and what a strict broker refuses to take from a provider.
 #include "object_result.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// The function table of strings, and strings that live as long as another object.
 #include "object_string.h"
 
 #include <cstring>

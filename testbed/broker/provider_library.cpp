@@ -1,3 +1,4 @@
+// Opening the library, calling its factories, and the cleanup before it is closed.
 #include "provider_library.h"
 
 #include <dlfcn.h>

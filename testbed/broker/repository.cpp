@@ -1,3 +1,4 @@
+// Namespaces, classes with what they inherit, and the instances.
 #include "repository.h"
 
 #include <algorithm>

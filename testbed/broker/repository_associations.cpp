@@ -1,3 +1,4 @@
+// Associations between instances, walking them, and the order of results.
 #include <algorithm>
 #include <mutex>
 #include <set>

@@ -1,3 +1,4 @@
+// Closing and opening the gate, and whether an up-call passes, fails or waits before it.
 #include "stop_gate.h"
 
 namespace testbed {

@@ -1,3 +1,4 @@
+// The definitions of the options, and the address, credentials and classes that follow from them.
 #include "ask_options.h"
 
 #include <CLI/CLI.hpp>

@@ -1,3 +1,4 @@
+// Asking class by class, refusing what was not asked for, and asking once more after a while.
 #include "ask_server.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// The options of a check, its printed result, and the exit status of wrong usage.
 #include "check_command.h"
 
 #include <CLI/CLI.hpp>

@@ -1,3 +1,4 @@
+// Reading what a site expects, overrules and ignores, with spellings that mean the same.
 #include "check_policy.h"
 
 #include <algorithm>

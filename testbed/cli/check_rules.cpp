@@ -1,3 +1,4 @@
+// The tables of states and charges, and judging an instance by them.
 #include "check_rules.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Collecting what is found, counted, missing or surplus, and composing the line of it.
 #include "check_summary.h"
 
 #include <algorithm>

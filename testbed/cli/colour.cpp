@@ -1,3 +1,4 @@
+// The terminal's codes for green, yellow and red, and when standard output gets them.
 #include "colour.h"
 
 #include <unistd.h>

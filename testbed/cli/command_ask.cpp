@@ -1,3 +1,4 @@
+// Asking on a thread of its own, within the user's time, and printing tree, check or metrics.
 #include "command_ask.h"
 
 #include <unistd.h>

@@ -1,3 +1,4 @@
+// Counting the provider's queries by subject and kind, and the table of them.
 #include "command_calls.h"
 
 #include <syslog.h>

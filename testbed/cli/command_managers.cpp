@@ -1,3 +1,4 @@
+// Prints the table of managers and their behaviours.
 #include "command_managers.h"
 
 #include <CLI/CLI.hpp>

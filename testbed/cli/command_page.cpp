@@ -1,3 +1,4 @@
+// Serves the page over HTTP until a signal comes, and asks the WBEM server on its behalf.
 #include "command_page.h"
 
 #include <poll.h>

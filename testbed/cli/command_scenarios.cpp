@@ -1,3 +1,4 @@
+// A line for each scenario: its description, or what is wrong with its file.
 #include "command_scenarios.h"
 
 #include <CLI/CLI.hpp>

@@ -1,3 +1,4 @@
+// Running the server: provider, CIM-XML, page and control socket, and commands meanwhile.
 #include "command_serve.h"
 
 #include <poll.h>

@@ -1,3 +1,4 @@
+// Loading the provider, waiting for its inventory, and printing it as tree, JSON or check.
 #include "command_show.h"
 
 #include <syslog.h>

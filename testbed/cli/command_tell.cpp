@@ -1,3 +1,4 @@
+// Passing each command on to the server's control socket and printing what it answers.
 #include "command_tell.h"
 
 #include <CLI/CLI.hpp>

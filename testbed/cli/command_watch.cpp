@@ -1,3 +1,4 @@
+// The loop of polling, printing what differs and carrying out commands.
 #include "command_watch.h"
 
 #include <syslog.h>

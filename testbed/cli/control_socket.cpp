@@ -1,3 +1,4 @@
+// Both ends of the control socket: taking connections and their lines, and sending one command.
 #include "control_socket.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// Reading and waiting, with terminals of other jobs and named pipes that get a next writer.
 #include "input_lines.h"
 
 #include <fcntl.h>

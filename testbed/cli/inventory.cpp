@@ -1,3 +1,4 @@
+// The table of the classes that the provider serves, and what identifies and names their instances.
 #include "inventory.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Comparing two inventories, instance by instance and property by property.
 #include "inventory_changes.h"
 
 #include "check_rules.h"

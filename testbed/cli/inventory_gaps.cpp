@@ -1,3 +1,4 @@
+// Looking for the signs: missing members, controllers without devices, what has come and gone.
 #include "inventory_gaps.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// CIM values, instances, errors and the check's result as JSON.
 #include "json_view.h"
 
 #include <nlohmann/json.hpp>

@@ -1,3 +1,4 @@
+// The directories in which the library may lie, and picking the build for the manager.
 #include "library_locator.h"
 
 #include <filesystem>

@@ -1,3 +1,4 @@
+// Carrying out the live commands, passing the array's time, and noticing a new version of the file.
 #include "live_session.h"
 
 #include <sys/stat.h>

@@ -1,3 +1,4 @@
+// Defining the option, checking its list, and applying it to the scenario's manager.
 #include "manager_option.h"
 
 #include <CLI/CLI.hpp>

@@ -1,3 +1,4 @@
+// Composing the gauges: elements by class, states of elements, and the outcome of the asking.
 #include "metrics_view.h"
 
 #include <cstdio>

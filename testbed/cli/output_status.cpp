@@ -1,3 +1,4 @@
+// Flushing standard output, and the exit status when that fails.
 #include "output_status.h"
 
 #include <cerrno>

@@ -1,3 +1,4 @@
+// Writing the option file, and removing it with its variable at the end.
 #include "polling_interval.h"
 
 #include <unistd.h>

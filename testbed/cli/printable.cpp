@@ -1,3 +1,4 @@
+// Characters that show nothing or mislead, the width of texts, and folding them into lines.
 #include "printable.h"
 
 #include <unictype.h>

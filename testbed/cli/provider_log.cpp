@@ -1,3 +1,4 @@
+// The tool's own `syslog`, which hands the provider's lines to whoever wants them.
 #include "provider_log.h"
 
 #include <syslog.h>

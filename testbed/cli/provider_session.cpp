@@ -1,3 +1,4 @@
+// Starting and stopping a provider, and waiting until its inventory has arrived.
 #include "provider_session.h"
 
 #include <pthread.h>

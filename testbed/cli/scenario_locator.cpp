@@ -1,3 +1,4 @@
+// Looking for scenarios as built and as installed, and finding one by its name.
 #include "scenario_locator.h"
 
 #include <CLI/CLI.hpp>

@@ -1,3 +1,4 @@
+// Standard classes from a file, if one is given, then the provider's, then missing qualifiers.
 #include "schema_choice.h"
 
 #include <filesystem>

@@ -1,3 +1,4 @@
+// The directories in which the MOF files may lie, as seen from the tool.
 #include "schema_locator.h"
 
 #include <stdexcept>

@@ -1,3 +1,4 @@
+// Blocking SIGINT and SIGTERM, and reading them from a descriptor.
 #include "stop_signals.h"
 
 #include <poll.h>

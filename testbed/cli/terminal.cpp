@@ -1,3 +1,4 @@
+// Width and character set of the terminal, and the line that tells how long one has been waiting.
 #include "terminal.h"
 
 #include <langinfo.h>

@@ -1,3 +1,4 @@
+// Asks the system for the program's file.
 #include "tool_directory.h"
 
 namespace testbed {

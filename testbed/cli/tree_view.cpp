@@ -1,3 +1,4 @@
+// Building the tree from controllers, devices and software, and printing it folded to the terminal.
 #include "tree_view.h"
 
 #include <algorithm>

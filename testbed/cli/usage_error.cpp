@@ -1,3 +1,4 @@
+// Naming the option, command or argument that is wrong, and leaving out values and passwords.
 #include "usage_error.h"
 
 #include <CLI/CLI.hpp>

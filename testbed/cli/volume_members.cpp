@@ -1,3 +1,4 @@
+// Splitting the list of drives in a volume's name.
 #include "volume_members.h"
 
 #include <algorithm>

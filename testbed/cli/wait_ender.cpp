@@ -1,3 +1,4 @@
+// The thread that waits for the signal and then ends the faults' waits.
 #include "wait_ender.h"
 
 #include <poll.h>

@@ -1,3 +1,4 @@
+// The test bed behind a C interface: broker, simulated array and requests for programs in C.
 #include "plexor_desk.h"
 
 #include <cstdio>

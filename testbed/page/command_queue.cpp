@@ -1,3 +1,4 @@
+// Submitting a command and waiting for its result, and attending to what has been submitted.
 #include "command_queue.h"
 
 #include <sys/eventfd.h>

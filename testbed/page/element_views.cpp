@@ -1,3 +1,4 @@
+// The tables of looks, and the words, sizes and members that go with an element.
 #include "element_views.h"
 
 #include <cstdio>

@@ -1,3 +1,4 @@
+// Collecting the words of value maps, the kinds of elements and the commands into one JSON object.
 #include "page_about.h"
 
 #include <nlohmann/json.hpp>

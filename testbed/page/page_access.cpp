@@ -1,3 +1,4 @@
+// Checking a request's host, origin, credentials and token.
 #include "page_access.h"
 
 #include <openssl/crypto.h>

@@ -1,3 +1,4 @@
+// Comparing two inventories for the page: who came, who went, whose state changed.
 #include "page_changes.h"
 
 #include <ctime>

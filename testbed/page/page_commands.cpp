@@ -1,3 +1,4 @@
+// The tables of commands for each kind of element, and which commands a page may give.
 #include "page_commands.h"
 
 #include <algorithm>

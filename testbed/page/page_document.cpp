@@ -1,3 +1,4 @@
+// The document's text, and the difference between two versions of it.
 #include "page_document.h"
 
 #include <map>

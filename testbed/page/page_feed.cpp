@@ -1,3 +1,4 @@
+// The thread that asks while somebody looks, and the event streams that carry the news.
 #include "page_feed.h"
 
 #include <algorithm>

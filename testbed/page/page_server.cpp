@@ -1,3 +1,4 @@
+// Routing requests to files, document, events, token and command, and the headers of every answer.
 #include "page_server.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Racks of slots from the scenario, progress from the schedule, and the timeline's next commands.
 #include "simulated_array.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Words, numbers, strings with their escapes, and comments of MOF.
 #include "mof_lexer.h"
 
 #include "cim_object.h"

@@ -1,3 +1,4 @@
+// Recursive descent over the tokens, one function for each construct of MOF.
 #include "mof_parser.h"
 
 #include "mof_error.h"

@@ -1,3 +1,4 @@
+// Following the includes, within bounds of size, number and depth.
 #include "mof_reader.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Reading integers, reals and texts, and fitting them to a CIM type.
 #include "mof_value.h"
 
 #include <algorithm>

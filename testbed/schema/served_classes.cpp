@@ -1,3 +1,4 @@
+// Reading the provider's MOF, and settling what each property takes over from its superclass.
 #include "served_classes.h"
 
 #include <algorithm>

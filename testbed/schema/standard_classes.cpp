@@ -1,3 +1,4 @@
+// Putting superclasses first, and merging in what their members hand down.
 #include "standard_classes.h"
 
 #include <algorithm>

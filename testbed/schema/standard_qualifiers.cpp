@@ -1,3 +1,4 @@
+// The tables of abstract classes, of references and of value maps, and adding them to the classes.
 #include "standard_qualifiers.h"
 
 #include <algorithm>

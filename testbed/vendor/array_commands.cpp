@@ -1,3 +1,4 @@
+// The tables of verbs and kinds, and one function for each verb.
 #include "array_commands.h"
 
 #include <algorithm>

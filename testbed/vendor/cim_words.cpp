@@ -1,3 +1,4 @@
+// The tables of codes and words, of states by kind of device, and of RAID levels.
 #include "cim_words.h"
 
 #include "cim_object.h"

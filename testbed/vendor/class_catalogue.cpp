@@ -1,3 +1,4 @@
+// Looking up superclasses, properties and roles, and defining the classes in a repository.
 #include "class_catalogue.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Splitting a line at blanks, with quoted texts and JSON values kept whole.
 #include "command_words.h"
 
 #include "json_document.h"

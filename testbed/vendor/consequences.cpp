@@ -1,3 +1,4 @@
+// Following enclosures, drives, batteries and volumes through a change: spares, rebuilds, states.
 #include "consequences.h"
 
 #include <algorithm>

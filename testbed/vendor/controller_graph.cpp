@@ -1,3 +1,4 @@
+// A controller's objects: port controller, system, card and software.
 #include "vendor_graphs.h"
 
 namespace testbed {

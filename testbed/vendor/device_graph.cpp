@@ -1,3 +1,4 @@
+// The objects of enclosures, ports, batteries and other devices.
 #include "vendor_graphs.h"
 
 namespace testbed {

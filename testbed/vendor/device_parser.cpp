@@ -1,3 +1,4 @@
+// Reading pools, drives, volumes, enclosures, ports and batteries from a scenario.
 #include "scenario_reading.h"
 
 namespace testbed {

@@ -1,3 +1,4 @@
+// Reading a fault rule from a scenario: which calls it is for, and what becomes of them.
 #include "scenario_reading.h"
 
 namespace testbed {

@@ -1,3 +1,4 @@
+// Reading JSON with the position in mind, for errors that tell line and column.
 #include "json_document.h"
 
 #include <algorithm>

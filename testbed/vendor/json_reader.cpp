@@ -1,3 +1,4 @@
+// Taking texts, numbers, flags, codes and lists from an object, and refusing what is left over.
 #include "json_reader.h"
 
 #include <charconv>

@@ -1,3 +1,4 @@
+// Writing out elements that stand for many, with their numbers put in, within bounds.
 #include <algorithm>
 
 #include "json_reader.h"

@@ -1,3 +1,4 @@
+// Applying commands, what follows from them, and reloads, and arming the faults anew.
 #include "live_array.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Class names and keys of the host, of controllers and of their devices.
 #include "naming.h"
 
 namespace testbed {

@@ -1,3 +1,4 @@
+// Placing graphs in the repository, exchanging old ones for new ones, and withdrawing them.
 #include "object_graph.h"
 
 #include <map>

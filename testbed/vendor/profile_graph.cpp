@@ -1,3 +1,4 @@
+// The objects of the host and of the vendor's registered profiles.
 #include <algorithm>
 
 #include "vendor_graphs.h"

@@ -1,3 +1,4 @@
+// Comparing the drives of two documents, and the command that inserts one again.
 #include "pulled_drives.h"
 
 #include "command_words.h"

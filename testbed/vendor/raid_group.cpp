@@ -1,3 +1,4 @@
+// The condition of each place, and how many losses a RAID level bears.
 #include "raid_group.h"
 
 #include <algorithm>

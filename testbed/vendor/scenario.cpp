@@ -1,3 +1,4 @@
+// Finding the parts of a scenario by name and id.
 #include "scenario.h"
 
 namespace testbed {

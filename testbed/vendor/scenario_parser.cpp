@@ -1,3 +1,4 @@
+// Reading host, vendor, controllers, profiles and manager, and files with their errors by line.
 #include "scenario_parser.h"
 
 #include <cerrno>

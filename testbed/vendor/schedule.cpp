@@ -1,3 +1,4 @@
+// Adding commands, cancelling them, and taking those that are due.
 #include "schedule.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Reading a controller's software: the named kinds, and the list for everything else.
 #include "scenario_reading.h"
 
 namespace testbed {

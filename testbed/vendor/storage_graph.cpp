@@ -1,3 +1,4 @@
+// The objects of pools, drives and volumes: extents, firmware, slots, settings.
 #include "vendor_graphs.h"
 
 namespace testbed {

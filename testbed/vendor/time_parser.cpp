@@ -1,3 +1,4 @@
+// Reading a scenario's times: how long things take, and the timeline of commands.
 #include <algorithm>
 
 #include "array_commands.h"

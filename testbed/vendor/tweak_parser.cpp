@@ -1,3 +1,4 @@
+// Reading what a scenario overrules of an object: its class, keys and properties, with their types.
 #include <limits>
 
 #include "class_catalogue.h"

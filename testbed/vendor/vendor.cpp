@@ -1,3 +1,4 @@
+// Building all graphs of a scenario, and replacing those that a change concerns.
 #include "vendor.h"
 
 #include <map>

@@ -1,3 +1,4 @@
+// Telling loopback addresses from public ones, and insisting on a user where others can ask.
 #include "access.h"
 
 #include <boost/asio/ip/address.hpp>

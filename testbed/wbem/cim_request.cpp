@@ -1,3 +1,4 @@
+// Checking HTTP's headers and the message's against each other, and reading the parameters.
 #include "cim_request.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Taking the elements, errors and statuses out of a response message.
 #include "cim_response.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// The table of CIM types, and writing and reading numbers, truth values and characters.
 #include "cim_scalar.h"
 
 #include <algorithm>

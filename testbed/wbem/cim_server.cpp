@@ -1,3 +1,4 @@
+// From the HTTP request through the operation to the response message, or to the refusal.
 #include "cim_server.h"
 
 #include "cim_status.h"

@@ -1,3 +1,4 @@
+// The names of the codes, and what a client gets for a code that is none of CIM's.
 #include "cim_status.h"
 
 #include <iterator>

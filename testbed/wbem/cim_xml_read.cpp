@@ -1,3 +1,4 @@
+// Parsing a message within a bounded depth, and its elements one by one.
 #include "cim_xml_read.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Appending values, keys, qualifiers and class members, and writing the document out.
 #include "cim_xml_write.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Decoding and comparing the header, and reading a password from its file.
 #include "credentials.h"
 
 #include <cerrno>

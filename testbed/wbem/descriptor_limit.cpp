@@ -1,3 +1,4 @@
+// Asks the system for the limit of descriptors and raises it.
 #include "descriptor_limit.h"
 
 #include <sys/resource.h>

@@ -1,3 +1,4 @@
+// Reading requests, handing them to workers, and sending answers and streams, as coroutines.
 #include "http_connection.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Finding a header by its name.
 #include "http_message.h"
 
 #include "cim_object.h"

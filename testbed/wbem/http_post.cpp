@@ -1,3 +1,4 @@
+// Connecting, shaking hands, sending and receiving, each before the deadline.
 #include "http_post.h"
 
 #include <openssl/ssl.h>

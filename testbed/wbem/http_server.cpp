@@ -1,3 +1,4 @@
+// Accepting clients, making room when there are too many, and starting and ending the threads.
 #include "http_server.h"
 
 #include <algorithm>

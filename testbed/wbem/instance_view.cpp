@@ -1,3 +1,4 @@
+// Leaving out the properties of subclasses, and looking up once for each class what it knows.
 #include "instance_view.h"
 
 #include <algorithm>

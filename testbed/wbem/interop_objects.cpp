@@ -1,3 +1,4 @@
+// The classes and instances of root/interop.
 #include "interop_objects.h"
 
 namespace testbed {

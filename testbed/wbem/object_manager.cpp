@@ -1,3 +1,4 @@
+// Dividing operations between provider and repository, and joining their answers.
 #include "object_manager.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// The table of operations, with the parameters that each of them takes.
 #include "operations.h"
 
 namespace testbed {

@@ -1,3 +1,4 @@
+// Associators, References and their names: reading the filters and walking the repository.
 #include "cim_status.h"
 #include "cim_xml_write.h"
 #include "instance_view.h"

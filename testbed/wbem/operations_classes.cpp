@@ -1,3 +1,4 @@
+// GetClass, EnumerateClasses and EnumerateClassNames.
 #include <algorithm>
 
 #include "cim_status.h"

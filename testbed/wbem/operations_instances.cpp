@@ -1,3 +1,4 @@
+// GetInstance, EnumerateInstances and EnumerateInstanceNames.
 #include "cim_status.h"
 #include "cim_xml_write.h"
 #include "instance_view.h"

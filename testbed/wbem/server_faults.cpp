@@ -1,3 +1,4 @@
+// The table of a fault's members, reading one, and what it does to connections and responses.
 #include "server_faults.h"
 
 #include <algorithm>

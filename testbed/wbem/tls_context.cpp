@@ -1,3 +1,4 @@
+// Making contexts from PEM files, or from a key and certificate of the server's own making.
 #include "tls_context.h"
 
 #include <openssl/evp.h>

@@ -1,3 +1,4 @@
+// Composing the request messages, posting them, and telling a server's failure in its own words.
 #include "wbem_client.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Taking a URL apart: scheme, credentials, host, port and namespace.
 #include "wbem_url.h"
 
 #include <algorithm>

@@ -1,3 +1,4 @@
+// Decoding UTF-8 strictly, and replacing what XML cannot carry.
 #include "xml_text.h"
 
 namespace testbed {

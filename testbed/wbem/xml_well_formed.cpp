@@ -1,3 +1,4 @@
+// A pass of the parser over the message, which refuses declared entities and other encodings.
 #include "xml_well_formed.h"
 
 #include <expat.h>
