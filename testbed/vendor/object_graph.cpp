@@ -7,6 +7,16 @@
 #include "class_catalogue.h"
 
 namespace testbed {
+namespace {
+
+/// An instance with its class, which the vendor may have made up.
+void put(Repository& repository, const GraphObject& object) {
+    const ObjectPath& path = object.instance.path;
+    defineClassBelow(repository, path.nameSpace, path.className, object.cimClass);
+    repository.put(object.instance);
+}
+
+}  // namespace
 
 void ObjectGraph::add(const std::string& cimClass, const ObjectPath& path,
                       std::vector<NamedValue> properties, const Tweaks& tweaks) {
@@ -29,10 +39,7 @@ std::string ObjectGraph::vendorAssociation(const GraphLink& link) const {
 }
 
 void ObjectGraph::renew(Repository& repository) const {
-    for (const auto& [instance, cimClass] : objects_) {
-        defineClassBelow(repository, instance.path.nameSpace, instance.path.className, cimClass);
-        repository.put(instance);
-    }
+    for (const GraphObject& object : objects_) put(repository, object);
 }
 
 void ObjectGraph::place(Repository& repository) const {
@@ -70,14 +77,12 @@ void ObjectGraph::exchange(Repository& repository, const std::vector<ObjectGraph
         for (const GraphLink& link : graph.links_) oldLinks.insert(identityOf(link));
     }
     for (const ObjectGraph& graph : after) {
-        for (const auto& [instance, cimClass] : graph.objects_) {
-            const std::string identity = instance.path.identity();
+        for (const GraphObject& object : graph.objects_) {
+            const std::string identity = object.instance.path.identity();
             newObjects.insert(identity);
             const auto old = oldObjects.find(identity);
-            if (old != oldObjects.end() && *old->second == instance) continue;
-            defineClassBelow(repository, instance.path.nameSpace, instance.path.className,
-                             cimClass);
-            repository.put(instance);
+            if (old != oldObjects.end() && *old->second == object.instance) continue;
+            put(repository, object);
         }
     }
     // Links after all objects: an object that is listed exists.
