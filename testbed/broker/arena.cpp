@@ -80,8 +80,9 @@ ThreadArenas::ThreadArenas(bool perThread, ThreadEnd atThreadEnd)
     : perThread_(perThread), atThreadEnd_(std::move(atThreadEnd)) {
     // Not a thread_local object: that would keep a module with this code mapped until the thread's
     // end.
-    if (atThreadEnd_ && pthread_key_create(&threadEnd_, threadEnds) != 0)
+    if (atThreadEnd_ && pthread_key_create(&threadEnd_, threadEnds) != 0) {
         throw std::runtime_error("no more keys for thread ends");
+    }
 }
 
 ThreadArenas::~ThreadArenas() {
@@ -157,8 +158,9 @@ bool ThreadArenas::flush() {
 ThreadArenas::Stack ThreadArenas::all() {
     const std::lock_guard lock(mutex_);
     Stack arenas;
-    for (const auto& [thread, stack] : byThread_)
+    for (const auto& [thread, stack] : byThread_) {
         arenas.insert(arenas.end(), stack.begin(), stack.end());
+    }
     return arenas;
 }
 

@@ -160,8 +160,9 @@ bool Broker::waitUntilUnused(std::chrono::milliseconds limit) {
 
 std::vector<Broker::Kept> Broker::kept() {
     std::vector<Kept> list;
-    for (const std::shared_ptr<Arena>& arena : tables_->core.arenas.all())
+    for (const std::shared_ptr<Arena>& arena : tables_->core.arenas.all()) {
         list.push_back({arena->threadId(), arena->context(), arena->count()});
+    }
     return list;
 }
 

@@ -31,9 +31,10 @@ CMPIInstance* newInstance(const CMPIBroker* broker, const CMPIObjectPath* instan
     const auto path = readPath(instancePath, Entry::NewInstance);
     return answerBroker<CMPIInstance*>(broker, describeCall(Entry::NewInstance, path), status,
                                        [&](BrokerCore& core, CMPIStatus& outcome) -> CMPIInstance* {
-                                           if (path)
+                                           if (path) {
                                                return &makeInArena<InstanceObject>(
                                                    core, startOf(core, *path));
+                                           }
                                            outcome.rc = CMPI_RC_ERR_INVALID_PARAMETER;
                                            return nullptr;
                                        });
@@ -133,8 +134,9 @@ CMPIBoolean isOfType(const CMPIBroker* broker, const void* object, const char* t
     return answerBroker<CMPIBoolean>(broker, describeCall(Entry::BrokerTypeTest), status,
                                      [&](BrokerCore& core, CMPIStatus& outcome) {
                                          const char* type = typeOf(core, object);
-                                         if (type == nullptr)
+                                         if (type == nullptr) {
                                              outcome.rc = CMPI_RC_ERR_INVALID_HANDLE;
+                                         }
                                          const bool is = type != nullptr && typeName != nullptr &&
                                                          std::strcmp(type, typeName) == 0;
                                          return static_cast<CMPIBoolean>(is);
@@ -145,8 +147,9 @@ CMPIString* getType(const CMPIBroker* broker, const void* object, CMPIStatus* st
     return answerBroker<CMPIString*>(broker, describeCall(Entry::BrokerTypeTest), status,
                                      [&](BrokerCore& core, CMPIStatus& outcome) -> CMPIString* {
                                          const char* type = typeOf(core, object);
-                                         if (type != nullptr)
+                                         if (type != nullptr) {
                                              return &makeInArena<StringObject>(core, type);
+                                         }
                                          outcome.rc = CMPI_RC_ERR_INVALID_HANDLE;
                                          return nullptr;
                                      });

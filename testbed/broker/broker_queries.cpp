@@ -131,12 +131,15 @@ CMPIrc refusalOf(const BrokerCore& core, const std::optional<ObjectPath>& source
     if (!repository.hasNamespace(source->nameSpace)) return CMPI_RC_ERR_FAILED;
     if (core.options.unknownClassFails) {
         for (const auto& name :
-             {std::optional(source->className), filter.assocClass, filter.resultClass})
-            if (name && !repository.hasClass(source->nameSpace, *name))
+             {std::optional(source->className), filter.assocClass, filter.resultClass}) {
+            if (name && !repository.hasClass(source->nameSpace, *name)) {
                 return CMPI_RC_ERR_INVALID_CLASS;
+            }
+        }
     }
-    if (core.options.danglingFails && !toReferences && repository.hasDangling(*source, filter))
+    if (core.options.danglingFails && !toReferences && repository.hasDangling(*source, filter)) {
         return CMPI_RC_ERR_NOT_FOUND;
+    }
     return CMPI_RC_OK;
 }
 
@@ -160,11 +163,12 @@ CMPIEnumeration* walk(const CMPIBroker* broker, const CMPIContext* ctx,
             outcome.rc = refusalOf(core, path, filter, toReferences);
             if (outcome.rc != CMPI_RC_OK) return nullptr;
             std::vector<Instance> found;
-            if (!isLostOn(core, *path))
+            if (!isLostOn(core, *path)) {
                 found = toReferences
                             ? core.repository.references(*path, filter.resultClass.value_or(""),
                                                          filter.role.value_or(""))
                             : core.repository.associators(*path, filter);
+            }
             return enumerationOf(core, std::move(found), onlyNames, readNames(properties));
         });
 }

@@ -50,8 +50,9 @@ ExportedFlush::ExportedFlush(const BrokerOptions& options) {
     if (!options.exportsFlush()) return;
     const fs::path file = locateModule();
     module_ = dlopen(file.c_str(), RTLD_NOW | RTLD_GLOBAL);
-    if (module_ == nullptr)
+    if (module_ == nullptr) {
         throw std::runtime_error("cannot load " + file.string() + ": " + dlerror());
+    }
     ++exporters;
     direct(module_, Broker::flushThreadEverywhere);
 }

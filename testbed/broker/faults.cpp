@@ -85,10 +85,11 @@ void Faults::runHook(const FaultEffect& effect) {
 }
 
 void Faults::wait(const FaultEffect& effect, bool isQuery) {
-    if (effect)
+    if (effect) {
         sleep(effect->delay);
-    else if (isQuery)
+    } else if (isQuery) {
         sleep(drawLatency());
+    }
 }
 
 void Faults::sleep(std::chrono::milliseconds time) {

@@ -117,12 +117,14 @@ void setBehaviour(BrokerOptions& options, const std::string& word) {
     const std::string name = word.substr(0, equals);
     const std::string value = equals == std::string::npos ? "on" : word.substr(equals + 1);
     const ManagerBehaviour* behaviour = findRow(managerBehaviours(), name);
-    if (behaviour == nullptr)
+    if (behaviour == nullptr) {
         throw UnknownManager("unknown manager or behaviour \"" + name + "\"; managers are " +
                              namesOf(managerKinds()) + "; behaviours are " +
                              namesOf(managerBehaviours()));
-    if (value != "on" && value != "off")
+    }
+    if (value != "on" && value != "off") {
         throw UnknownManager("a behaviour is on or off, not \"" + value + "\"");
+    }
     behaviour->set(options, value == "on");
 }
 
@@ -148,9 +150,10 @@ std::span<const ManagerKind> managerKinds() {
 
 void setManagerKind(BrokerOptions& options, const std::string& name) {
     const ManagerKind* kind = findRow(managerKinds(), name);
-    if (kind == nullptr)
+    if (kind == nullptr) {
         throw UnknownManager("unknown manager \"" + name + "\"; managers are " +
                              namesOf(managerKinds()));
+    }
     for (const ManagerBehaviour& behaviour : kBehaviours) behaviour.set(options, false);
     for (const char* behaviour : kind->behaviours) setBehaviour(options, behaviour);
 }
@@ -160,10 +163,11 @@ void chooseManager(BrokerOptions& options, const std::string& words) {
     std::istringstream list(words);
     bool first = true;
     for (std::string word; std::getline(list, word, ',');) {
-        if (first && findRow(managerKinds(), word) != nullptr)
+        if (first && findRow(managerKinds(), word) != nullptr) {
             setManagerKind(chosen, word);
-        else
+        } else {
             setBehaviour(chosen, word);
+        }
         first = false;
     }
     options = std::move(chosen);

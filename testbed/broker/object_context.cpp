@@ -31,8 +31,9 @@ CMPIData getEntryAt(const CMPIContext* ctx, CMPICount index, CMPIString** name,
                                       outcome.rc = CMPI_RC_ERR_NOT_FOUND;
                                       return dataWithout(CMPI_notFound);
                                   }
-                                  if (name != nullptr)
+                                  if (name != nullptr) {
                                       *name = derivedString(object, entries[index].first);
+                                  }
                                   return toData(object, entries[index].second);
                               });
 }

@@ -31,8 +31,9 @@ CMPIData getPropertyAt(const CMPIInstance* instance, CMPICount index, CMPIString
                                       outcome.rc = CMPI_RC_ERR_NO_SUCH_PROPERTY;
                                       return dataWithout(CMPI_notFound);
                                   }
-                                  if (name != nullptr)
+                                  if (name != nullptr) {
                                       *name = derivedString(object, properties[index].first);
+                                  }
                                   return toData(object, properties[index].second);
                               });
 }
@@ -119,8 +120,9 @@ void InstanceObject::setFilter(const char** properties, const char** keys) {
     if (!filter_) return;
     const std::vector<std::string> keyNames = readNames(keys).value_or(std::vector<std::string>());
     filter_->insert(filter_->end(), keyNames.begin(), keyNames.end());
-    if (core().options.filteredKeys == FilteredKeys::Stay && keys == nullptr)
+    if (core().options.filteredKeys == FilteredKeys::Stay && keys == nullptr) {
         for (const auto& [name, value] : content_.path.keys) filter_->push_back(name);
+    }
     std::erase_if(content_.properties,
                   [&](const NamedValue& property) { return isHidden(property.first); });
 }
@@ -149,9 +151,10 @@ CMPIrc InstanceObject::set(const char* name, const CMPIValue* value, CMPIType ty
 
 Instance InstanceObject::returned() const {
     Instance instance = content_;
-    if (core().options.filteredKeys == FilteredKeys::NamesGoToo)
+    if (core().options.filteredKeys == FilteredKeys::NamesGoToo) {
         std::erase_if(instance.path.keys,
                       [&](const NamedValue& key) { return isHidden(key.first); });
+    }
     return instance;
 }
 

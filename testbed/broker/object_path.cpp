@@ -70,8 +70,9 @@ CMPIData getKeyAt(const CMPIObjectPath* path, CMPICount index, CMPIString** name
                                       outcome.rc = CMPI_RC_ERR_NO_SUCH_PROPERTY;
                                       return dataWithout(CMPI_notFound);
                                   }
-                                  if (name != nullptr)
+                                  if (name != nullptr) {
                                       *name = derivedString(object, keys[index].first);
+                                  }
                                   return keyData(object, keys[index].second);
                               });
 }

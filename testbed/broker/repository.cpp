@@ -94,8 +94,9 @@ std::vector<PropertyDefinition> Repository::allProperties(std::string_view nameS
                                                           std::string_view className) const {
     const std::shared_lock lock(mutex_);
     std::vector<PropertyDefinition> properties;
-    for (const PropertyDefinition* known : propertiesLocked(nameSpace, className))
+    for (const PropertyDefinition* known : propertiesLocked(nameSpace, className)) {
         properties.push_back(*known);
+    }
     return properties;
 }
 
@@ -103,8 +104,9 @@ std::vector<KeyDefinition> Repository::keys(std::string_view nameSpace,
                                             std::string_view className) const {
     const std::shared_lock lock(mutex_);
     std::vector<KeyDefinition> keys;
-    for (const PropertyDefinition* known : propertiesLocked(nameSpace, className))
+    for (const PropertyDefinition* known : propertiesLocked(nameSpace, className)) {
         if (known->isKey) keys.push_back({known->name, known->type});
+    }
     return keys;
 }
 

@@ -22,8 +22,9 @@ void Repository::associate(std::string_view assocClass, AssociationEnd left, Ass
     const std::unique_lock lock(mutex_);
     const std::size_t number = nextAssociation_++;
     ends_[association.leftIdentity].push_back(number);
-    if (association.rightIdentity != association.leftIdentity)
+    if (association.rightIdentity != association.leftIdentity) {
         ends_[association.rightIdentity].push_back(number);
+    }
     associations_.emplace(number, std::move(association));
 }
 

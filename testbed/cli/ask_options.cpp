@@ -76,8 +76,9 @@ WbemUrl addressOf(const AskOptions& options) {
     if (!options.url.empty()) return parseWbemUrl(options.url);
     const bool bareV6 = options.host.find(':') != std::string::npos && options.host[0] != '[';
     const std::string port = options.port ? ":" + std::to_string(options.port) : "";
-    if (options.host.find_first_of("/@?#") != std::string::npos)
+    if (options.host.find_first_of("/@?#") != std::string::npos) {
         throw WbemError("--hostname is a name or an address and nothing else");
+    }
     return parseWbemUrl((options.ssl ? "https://" : "http://") +
                         (bareV6 ? "[" + options.host + "]" : options.host) + port);
 }
@@ -92,15 +93,17 @@ void setCredentials(const AskOptions& options, WbemUrl& url) {
         url.credentials->password = readPassword(options.passwordFile);
         url.hasPassword = true;
     }
-    if (url.credentials && !url.hasPassword)
+    if (url.credentials && !url.hasPassword) {
         throw WbemError("a user, but no password; name its file with --password-file");
+    }
 }
 
 /// The namespace that URL and option agree on.
 std::string namespaceOf(const AskOptions& options, const WbemUrl& url) {
     if (options.nameSpace.empty()) return url.nameSpace.empty() ? kDefaultNamespace : url.nameSpace;
-    if (!url.nameSpace.empty() && !sameName(url.nameSpace, options.nameSpace))
+    if (!url.nameSpace.empty() && !sameName(url.nameSpace, options.nameSpace)) {
         throw WbemError("the URL names one namespace and --namespace another");
+    }
     return options.nameSpace;
 }
 
@@ -125,10 +128,12 @@ void addAskOptions(CLI::App& command, AskOptions& options, bool isPlugin) {
 }
 
 void requireSense(const AskOptions& options) {
-    if (options.url.empty() && options.host.empty())
+    if (options.url.empty() && options.host.empty()) {
         throw CLI::RequiredError("a URL or --hostname");
-    if (options.refreshSeconds && *options.refreshSeconds >= options.timeoutSeconds)
+    }
+    if (options.refreshSeconds && *options.refreshSeconds >= options.timeoutSeconds) {
         throw CLI::ValidationError("--refresh", "must be shorter than --timeout");
+    }
 }
 
 AskTarget targetOf(const AskOptions& options) {

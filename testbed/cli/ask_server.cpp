@@ -33,14 +33,17 @@ void requireAsked(const std::string& className, const std::string& nameSpace,
     std::set<std::string> met;
     for (const Instance& instance : response.instances) {
         const ObjectPath& path = instance.path;
-        if (!sameName(path.className, className))
+        if (!sameName(path.className, className)) {
             throw WbemError("an instance of " + quoted(path.className) + " in the answer for " +
                             className);
-        if (!sameName(path.nameSpace, nameSpace))
+        }
+        if (!sameName(path.nameSpace, nameSpace)) {
             throw WbemError("an instance in " + quoted(path.nameSpace) + " in the answer for " +
                             nameSpace);
-        if (!met.insert(identityIn(instance, served)).second)
+        }
+        if (!met.insert(identityIn(instance, served)).second) {
             throw WbemError("the same instance twice in the answer for " + className);
+        }
     }
 }
 
@@ -76,8 +79,9 @@ std::string secondsText(std::chrono::milliseconds time) {
 
 /// Puts what the later answers lack behind them.
 void complete(Inventory& later, Inventory& earlier) {
-    for (std::size_t i = later.size(); i < earlier.size(); i++)
+    for (std::size_t i = later.size(); i < earlier.size(); i++) {
         later.push_back(std::move(earlier[i]));
+    }
 }
 
 }  // namespace

@@ -71,8 +71,9 @@ CheckSummary summaryOf(const std::function<CheckSummary()>& make) {
 std::string checkText(const CheckSummary& summary, int verbosity) {
     std::string text = summary.line() + "\n";
     if (verbosity == 0) return text;
-    for (const std::string& detail : verbosity > 1 ? summary.details : summary.problems)
+    for (const std::string& detail : verbosity > 1 ? summary.details : summary.problems) {
         text += detail + "\n";
+    }
     return text;
 }
 

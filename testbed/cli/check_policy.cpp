@@ -16,15 +16,17 @@ std::string foldedWord(std::string text) {
 }
 
 std::optional<CheckLevel> levelNamed(const std::string& name) {
-    for (const CheckLevel level : {CheckLevel::Ok, CheckLevel::Warning, CheckLevel::Critical})
+    for (const CheckLevel level : {CheckLevel::Ok, CheckLevel::Warning, CheckLevel::Critical}) {
         if (sameName(name, levelName(level))) return level;
+    }
     return std::nullopt;
 }
 
 /// NULL for a word that names no kind.
 const ServedClass* kindNamed(const std::string& singular) {
-    for (const ServedClass& served : servedClasses())
+    for (const ServedClass& served : servedClasses()) {
         if (served.isCounted && sameName(singular, served.singular)) return &served;
+    }
     return nullptr;
 }
 

@@ -121,16 +121,19 @@ Verdict verdictOfState(const std::vector<const StateRule*>& rules, const Instanc
     // No state of the provider's: the worse of what the two numbers say.
     const std::uint64_t health = numberOf(instance, "HealthState");
     const CheckLevel level = std::max(rules.front()->level, levelOfHealth(health));
-    if (levelOfHealth(health) == level)
+    if (levelOfHealth(health) == level) {
         return verdictOf(level, wordOr(healthStateWords(), health, "undefined"));
+    }
     return verdictOf(level, wordOr(operationalStatusWords(), status, "undefined"));
 }
 
 Verdict verdictOfCharge(const Instance& instance) {
     const std::uint64_t status = numberOf(instance, "BatteryStatus");
-    for (const ChargeRule& rule : kChargeRules)
-        if (rule.batteryStatus == status)
+    for (const ChargeRule& rule : kChargeRules) {
+        if (rule.batteryStatus == status) {
             return verdictOf(rule.level, wordOr(batteryStatusWords(), status, "undefined"));
+        }
+    }
     return {};
 }
 
@@ -164,8 +167,9 @@ std::string shortName(const Instance& instance) {
     const auto* said = std::find_if(std::begin(kStateRules), std::end(kStateRules),
                                     [&](const StateRule& rule) { return saysState(name, rule); });
     if (said != std::end(kStateRules)) name.resize(name.rfind(" - "));
-    for (const char* detail : {", Drives(", " Fw: "})
+    for (const char* detail : {", Drives(", " Fw: "}) {
         if (const std::size_t at = name.find(detail); at != std::string::npos) name.resize(at);
+    }
     return name;
 }
 

@@ -55,8 +55,9 @@ std::string clipped(std::string name) {
 /// "answered with status 5 (…)"
 std::string statusOf(const Response& response) {
     std::string text = "answered with status " + std::to_string(response.rc);
-    if (response.message && !response.message->empty())
+    if (response.message && !response.message->empty()) {
         text += " (" + inLine(clipped(*response.message)) + ")";
+    }
     return text;
 }
 
@@ -87,8 +88,9 @@ class Summary {
 public:
     Summary(const Inventory& inventory, const CheckTerms& terms) : terms_(terms) {
         for (const ClassAnswer& answer : inventory) take(answer);
-        for (const auto& [status, classNames] : statuses_)
+        for (const auto& [status, classNames] : statuses_) {
             errors_.push_back(someOf(classNames, 1) + " " + status);
+        }
         if (!terms.failure.empty()) errors_.push_back(terms.failure);
         noteArriving(inventory);
         if (nothing().empty() && !arriving_) noteCounts();
@@ -147,9 +149,11 @@ private:
     void noteArriving(const Inventory& inventory) {
         std::vector<std::string> signs;
         if (!terms_.arriving.empty()) signs.push_back(terms_.arriving);
-        if (nothing().empty())
-            for (std::string& gap : gapsIn(inventory, terms_.policy))
+        if (nothing().empty()) {
+            for (std::string& gap : gapsIn(inventory, terms_.policy)) {
                 signs.push_back(std::move(gap));
+            }
+        }
         arriving_ = !signs.empty();
         if (arriving_) errors_.push_back("inventory still arriving: " + someOf(signs, 2, "; "));
     }
@@ -160,12 +164,14 @@ private:
             const auto expected = terms_.expected.find(count.kind->plural);
             if (!count.known || expected == terms_.expected.end()) continue;
             const std::size_t wanted = expected->second.count;
-            if (count.number < wanted)
+            if (count.number < wanted) {
                 missing_.push_back("only " + std::to_string(count.number) + " of " +
                                    counted(wanted, *count.kind));
-            if (count.number > wanted && expected->second.exact)
+            }
+            if (count.number > wanted && expected->second.exact) {
                 surplus_.push_back(counted(count.number, *count.kind) + " instead of " +
                                    std::to_string(wanted));
+            }
         }
     }
 
@@ -174,13 +180,15 @@ private:
         if (counts_.empty()) return "nothing to judge";
         const Count& first = counts_.front();
         const bool ofControllers = first.kind == &servedClasses().front();
-        if (first.number == 0 && (ofControllers || counts_.size() == 1))
+        if (first.number == 0 && (ofControllers || counts_.size() == 1)) {
             return std::string("no ") + first.kind->plural;
+        }
         const bool devices = std::any_of(counts_.begin() + 1, counts_.end(),
                                          [](const Count& count) { return count.number > 0; });
         // The provider shows a controller before its devices.
-        if (counts_.size() > 1 && !devices)
+        if (counts_.size() > 1 && !devices) {
             return counted(first.number, *first.kind) + ", but no devices";
+        }
         return "";
     }
 
@@ -198,12 +206,14 @@ private:
         parts.insert(parts.end(), surplus_.begin(), surplus_.end());
         parts.insert(parts.end(), errors_.begin(), errors_.end());
         if (errors_.empty() && !nothing().empty()) parts.push_back(nothing());
-        if (parts.empty())
+        if (parts.empty()) {
             for (const Count& count : counts_) parts.push_back(counted(count.number, *count.kind));
+        }
         if (ignored_ > 0) parts.push_back(std::to_string(ignored_) + " ignored");
         std::string text;
-        for (const std::string& part : parts)
+        for (const std::string& part : parts) {
             text += (text.empty() ? "" : status() == kCheckOk ? ", " : "; ") + part;
+        }
         return text;
     }
 
@@ -221,9 +231,10 @@ private:
     std::string numbers() const {
         if (counts_.empty()) return "";
         std::size_t warnings = 0, criticals = 0;
-        for (const Finding& finding : findings_)
+        for (const Finding& finding : findings_) {
             (finding.verdict.level == CheckLevel::Critical ? criticals : warnings) +=
                 finding.names.size();
+        }
         std::string text;
         for (const Count& count : counts_) text += numberOf(count) + " ";
         text += "warning=" + std::to_string(warnings) + " critical=" + std::to_string(criticals);

@@ -122,8 +122,9 @@ int check(const AskOptions& options) {
 
 std::string statusErrors(const Inventory& inventory) {
     std::string errors;
-    for (const ClassAnswer& answer : inventory)
+    for (const ClassAnswer& answer : inventory) {
         if (answer.response.rc != CMPI_RC_OK) errors += errorLine(statusLine(answer));
+    }
     return errors;
 }
 
@@ -141,8 +142,9 @@ int show(const AskOptions& options) {
         Report report{options.json ? jsonView(answers.inventory, options.check.policy)
                                    : treeOf(options, answers.inventory),
                       statusErrors(answers.inventory)};
-        if (!answers.arriving.empty())
+        if (!answers.arriving.empty()) {
             report.errors += errorLine("inventory still arriving: " + answers.arriving);
+        }
         report.status = report.errors.empty() ? 0 : kServerFailed;
         return report;
     };

@@ -38,8 +38,9 @@ std::string subjectOf(const CallRecord& call, Repository& repository,
         "CIM_DiskDrive",       "CIM_StorageVolume",  "CIM_StoragePool",   "CIM_Chassis",
         "CIM_SASSATAPort",     "CIM_Battery",        "CIM_StorageExtent", "CIM_Slot",
         "CIM_PhysicalPackage", "CIM_PortController", "CIM_ComputerSystem"};
-    for (const char* subject : kSubjects)
+    for (const char* subject : kSubjects) {
         if (repository.isA(nameSpace, call.className, subject)) return subject;
+    }
     return call.className;
 }
 
@@ -68,8 +69,9 @@ int printCalls(const CallsOptions& options) {
     directProviderLog(LOG_ERR, nullptr);
     ProviderSession session(scenario, locateLibrary(options.library, scenario.manager),
                             options.provider, options.schema);
-    if (!session.waitForInventory(std::chrono::seconds(options.timeoutSeconds), "root/cimv2"))
+    if (!session.waitForInventory(std::chrono::seconds(options.timeoutSeconds), "root/cimv2")) {
         return kProviderFailed;
+    }
     int total = 0;
     for (const auto& [subject, calls] : countCalls(session, scenario.vendor.nameSpace)) {
         std::cout << "made on " << subject << "\n";

@@ -52,9 +52,10 @@ std::string urlOf(const HttpServerOptions& options, std::uint16_t port) {
 /// Serves until a signal comes.
 [[noreturn]] void show(const PageOptions& options) {
     requireSense(options.ask);
-    if (isPublic(options.http.address) && !options.insecurePublic)
+    if (isPublic(options.http.address) && !options.insecurePublic) {
         throw std::runtime_error("everybody who reaches " + options.http.address +
                                  " could look; say --insecure-public if they may");
+    }
     signal(SIGPIPE, SIG_IGN);
     StopSignals signals;
     PageFeed feed(sourceOf(options));

@@ -21,8 +21,9 @@ std::vector<fs::path> shippedScenarios() {
     std::vector<fs::path> files;
     const fs::path directory = scenarioDirectory();
     if (directory.empty()) return files;
-    for (const auto& entry : fs::directory_iterator(directory))
+    for (const auto& entry : fs::directory_iterator(directory)) {
         if (entry.path().extension() == ".json") files.push_back(entry.path());
+    }
     std::sort(files.begin(), files.end());
     return files;
 }

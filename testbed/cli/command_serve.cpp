@@ -48,8 +48,9 @@ constexpr std::size_t kOtherDescriptors = 64;
 
 Registration registrationOf(ProviderSession& session) {
     Registration registration{session.client(), kServedNamespace, {}};
-    for (const ServedClass& served : servedClasses())
+    for (const ServedClass& served : servedClasses()) {
         registration.classes.emplace_back(served.name);
+    }
     return registration;
 }
 
@@ -120,10 +121,11 @@ private:
     HttpServerOptions httpOptions(const ServeOptions& options) {
         HttpServerOptions http = options.http;
         http.welcome = [this] { return faults_.welcome(); };
-        if (!options.certificate.empty())
+        if (!options.certificate.empty()) {
             http.tls = tlsFromFiles(options.certificate, options.key);
-        else if (options.selfSigned)
+        } else if (options.selfSigned) {
             http.tls = tlsSelfSigned(hostName());
+        }
         raiseDescriptorLimit(http.connections + kOtherDescriptors);
         return http;
     }
@@ -139,12 +141,13 @@ private:
     /// "server NAME=VALUE..." and "clear server".
     bool executeOwn(const std::string& line) override {
         constexpr std::string_view kVerb = "server ";
-        if (line == "clear server")
+        if (line == "clear server") {
             faults_.clear();
-        else if (line.starts_with(kVerb))
+        } else if (line.starts_with(kVerb)) {
             faults_.add(parseServerFault(std::string_view(line).substr(kVerb.size())));
-        else
+        } else {
             return false;
+        }
         http_.listen(!faults_.refusesConnections());
         return true;
     }
@@ -203,9 +206,10 @@ bool serve(const ServeOptions& options) {
     AccessOptions access = options.access;
     access.address = options.http.address;
     auto credentials = accessOf(access);
-    if (!credentials && isPublic(access.address))
+    if (!credentials && isPublic(access.address)) {
         std::cerr << "plexor-testbed: warning: everybody who reaches " << access.address
                   << " may ask\n";
+    }
     WaitEnder ender(signals);
     ServeOptions watched = options;
     watched.live.onBroker = [&ender](Broker& broker) { ender.watch(&broker.faults()); };

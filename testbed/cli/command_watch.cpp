@@ -65,8 +65,9 @@ private:
     static bool tellsOfChange(const std::string& text) {
         if (text.starts_with("Data 0x")) return false;  // the lists' own tracing
         for (const char* part : {" changed. ", " pool changed, ", " removed from ", " deleted",
-                                 " added to the list", "failed, status"})
+                                 " added to the list", "failed, status"}) {
             if (text.find(part) != std::string::npos) return true;
+        }
         return false;
     }
 

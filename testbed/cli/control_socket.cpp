@@ -37,8 +37,10 @@ sockaddr_un addressOf(const std::string& path) {
 FileDescriptor connectTo(const std::string& path) {
     const sockaddr_un address = addressOf(path);
     FileDescriptor descriptor(socket(AF_UNIX, SOCK_STREAM | SOCK_CLOEXEC, 0));
-    if (connect(descriptor.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) != 0)
+    if (connect(descriptor.get(), reinterpret_cast<const sockaddr*>(&address), sizeof address) !=
+        0) {
         return FileDescriptor();
+    }
     return descriptor;
 }
 
@@ -105,8 +107,9 @@ ControlSocket::~ControlSocket() {
 void ControlSocket::watch(std::vector<pollfd>& sources) const {
     if (!listener_.isOpen()) return;
     sources.push_back({listener_.get(), POLLIN, 0});
-    for (const Connection& connection : connections_)
+    for (const Connection& connection : connections_) {
         sources.push_back({connection.descriptor.get(), POLLIN, 0});
+    }
 }
 
 void ControlSocket::takeConnections() {
@@ -146,16 +149,20 @@ CommandResult tellSocket(const std::string& path, const std::string& command) {
     if (!descriptor.isOpen()) failAt(path, std::strerror(errno));
     limitWaits(descriptor.get(), kAnswerLimit);
     std::string line = command;
-    for (char& c : line)
+    for (char& c : line) {
         if (c == '\n') c = ' ';
+    }
     std::string reply;
     char buffer[4096];
-    if (sendAll(descriptor.get(), line + "\n"))
-        for (ssize_t size = 0; (size = recv(descriptor.get(), buffer, sizeof buffer, 0)) > 0;)
+    if (sendAll(descriptor.get(), line + "\n")) {
+        for (ssize_t size = 0; (size = recv(descriptor.get(), buffer, sizeof buffer, 0)) > 0;) {
             reply.append(buffer, static_cast<std::size_t>(size));
+        }
+    }
     if (reply.starts_with(kOkReply)) return {false, false, reply.substr(std::strlen(kOkReply))};
-    if (reply.starts_with(kRefusedReply))
+    if (reply.starts_with(kRefusedReply)) {
         return {true, false, reply.substr(std::strlen(kRefusedReply))};
+    }
     failAt(path, "no answer");
 }
 

@@ -27,8 +27,9 @@ std::span<const ServedClass> servedClasses() {
 }
 
 const ServedClass* findServedClass(const std::string& name) {
-    for (const ServedClass& served : kServedClasses)
+    for (const ServedClass& served : kServedClasses) {
         if (sameName(served.name, name)) return &served;
+    }
     return nullptr;
 }
 
@@ -64,8 +65,9 @@ std::string nameOf(const Instance& instance) {
 Inventory collectInventory(InstanceClient& client, const std::vector<std::string>& classNames,
                            const std::string& nameSpace) {
     Inventory inventory;
-    for (const std::string& name : classNames)
+    for (const std::string& name : classNames) {
         inventory.push_back({name, client.enumerateInstances(name, {}, nameSpace)});
+    }
     return inventory;
 }
 

@@ -20,15 +20,17 @@ std::string propertyChanges(const Instance& before, const Instance& after) {
 namespace {
 
 const Instance* findPath(const ClassAnswer& answer, const ObjectPath& path) {
-    for (const Instance& instance : answer.response.instances)
+    for (const Instance& instance : answer.response.instances) {
         if (instance.path == path) return &instance;
+    }
     return nullptr;
 }
 
 void compareClass(const ClassAnswer& before, const ClassAnswer& after,
                   std::vector<std::string>& lines) {
-    for (const Instance& old : before.response.instances)
+    for (const Instance& old : before.response.instances) {
         if (findPath(after, old.path) == nullptr) lines.push_back("- " + nameOf(old));
+    }
     for (const Instance& now : after.response.instances) {
         const Instance* old = findPath(before, now.path);
         if (old == nullptr) {
@@ -43,8 +45,9 @@ void compareClass(const ClassAnswer& before, const ClassAnswer& after,
 
 std::vector<std::string> changeLines(const Inventory& before, const Inventory& after) {
     std::vector<std::string> lines;
-    for (std::size_t i = 0; i < before.size() && i < after.size(); i++)
+    for (std::size_t i = 0; i < before.size() && i < after.size(); i++) {
         compareClass(before[i], after[i], lines);
+    }
     for (std::string& line : lines) line = printable(line);
     return lines;
 }

@@ -16,9 +16,11 @@ const ServedClass& kDrives = servedClasses()[3];
 
 /// NULL for a class that was not answered.
 const std::vector<Instance>* answered(const Inventory& inventory, const std::string& className) {
-    for (const ClassAnswer& answer : inventory)
-        if (sameName(answer.className, className))
+    for (const ClassAnswer& answer : inventory) {
+        if (sameName(answer.className, className)) {
             return answer.response.rc == CMPI_RC_OK ? &answer.response.instances : nullptr;
+        }
+    }
     return nullptr;
 }
 
@@ -47,8 +49,9 @@ std::set<std::string> devicesOf(const std::string& controllerId, const ServedCla
     std::set<std::string> ids;
     for (const Instance& instance : instances) {
         const auto identity = identityOf(served, instance);
-        if (identity && belongsTo(served, *identity, controllerId))
+        if (identity && belongsTo(served, *identity, controllerId)) {
             ids.insert(identity->substr(controllerId.size() + 1));
+        }
     }
     return ids;
 }
@@ -62,12 +65,15 @@ std::string missingMember(const Instance& volume, const std::set<std::string>& d
         return id.find(',') != std::string::npos;
     });
     if (commas) return "";
-    if (distinct.size() > drives.size())
+    if (distinct.size() > drives.size()) {
         return std::to_string(distinct.size()) + " drives, of which " +
                std::to_string(drives.size()) + " are there";
-    for (const std::string& member : members)
-        if (!member.empty() && !isPlace(member) && !drives.contains(member))
+    }
+    for (const std::string& member : members) {
+        if (!member.empty() && !isPlace(member) && !drives.contains(member)) {
             return "drive " + member + ", which is not there";
+        }
+    }
     return "";
 }
 
@@ -78,8 +84,9 @@ std::set<std::string> drivesBeside(const Instance& volume, const DriveIds& drive
     const auto identity = identityOf(kVolumes, volume);
     std::set<std::string> ids;
     if (!identity) return ids;
-    for (const auto& [controllerId, own] : drives)
+    for (const auto& [controllerId, own] : drives) {
         if (belongsTo(kVolumes, *identity, controllerId)) ids.insert(own.begin(), own.end());
+    }
     return ids;
 }
 
@@ -137,8 +144,9 @@ std::vector<std::string> gapsIn(const Inventory& inventory, const CheckPolicy& p
         const auto id = identityOf(kControllers, controller);
         if (!id) continue;
         drives[*id] = allDrives ? devicesOf(*id, kDrives, *allDrives) : std::set<std::string>();
-        if (!policy.ignores(kControllers, controller) && !mayHaveDevices(inventory, *id))
+        if (!policy.ignores(kControllers, controller) && !mayHaveDevices(inventory, *id)) {
             gaps.push_back(shortName(controller) + " has no devices");
+        }
     }
     findMissingMembers(inventory, drives, gaps);
     return gaps;

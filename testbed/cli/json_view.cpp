@@ -23,17 +23,19 @@ struct ToJson {
     }
     ordered_json operator()(const std::vector<CimValue>& elements) const {
         ordered_json list = ordered_json::array();
-        for (const CimValue& element : elements)
+        for (const CimValue& element : elements) {
             list.push_back(element.isNull ? ordered_json(nullptr)
                                           : std::visit(ToJson(), element.data));
+        }
         return list;
     }
 };
 
 ordered_json valuesAsJson(const std::vector<NamedValue>& values) {
     ordered_json object = ordered_json::object();
-    for (const auto& [name, value] : values)
+    for (const auto& [name, value] : values) {
         object[name] = value.isNull ? ordered_json(nullptr) : std::visit(ToJson(), value.data);
+    }
     return object;
 }
 
@@ -48,11 +50,13 @@ ordered_json verdictAsJson(const std::optional<Verdict>& verdict) {
 
 ordered_json errorsAsJson(const Inventory& inventory) {
     ordered_json list = ordered_json::array();
-    for (const ClassAnswer& answer : inventory)
-        if (answer.response.rc != CMPI_RC_OK)
+    for (const ClassAnswer& answer : inventory) {
+        if (answer.response.rc != CMPI_RC_OK) {
             list.push_back({{"class", answer.className},
                             {"status", static_cast<int>(answer.response.rc)},
                             {"message", answer.response.message.value_or("")}});
+        }
+    }
     return list;
 }
 
@@ -72,11 +76,12 @@ ordered_json jsonDocument(const Inventory& inventory, const CheckPolicy& policy,
     document["errors"] = errorsAsJson(inventory);
     for (const ClassAnswer& answer : inventory) {
         ordered_json& list = document[answer.className] = ordered_json::array();
-        for (const Instance& instance : answer.response.instances)
+        for (const Instance& instance : answer.response.instances) {
             list.push_back({{"path", instance.path.text()},
                             {"keys", valuesAsJson(instance.path.keys)},
                             {"properties", valuesAsJson(instance.properties)},
                             {"verdict", verdictAsJson(policy.judge(answer.className, instance))}});
+        }
     }
     return document;
 }

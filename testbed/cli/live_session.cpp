@@ -55,9 +55,10 @@ int secondsOf(const CommandWord& word) {
     int seconds = -1;
     const char* end = word.text.data() + word.text.size();
     const auto [rest, error] = std::from_chars(word.text.data(), end, seconds);
-    if (error != std::errc() || rest != end || seconds < 0 || seconds > kLongestWait)
+    if (error != std::errc() || rest != end || seconds < 0 || seconds > kLongestWait) {
         refuseCommand("a number of seconds from 0 to " + std::to_string(kLongestWait) +
                       " is needed behind wait");
+    }
     return seconds;
 }
 
@@ -65,8 +66,9 @@ int secondsOf(const CommandWord& word) {
 double speedOf(const CommandWord& word) {
     const nlohmann::json value = nlohmann::json::parse(word.text, nullptr, false);
     const double speed = value.is_number() ? value.get<double>() : 0;
-    if (speed < kSlowest || speed > kFastest)
+    if (speed < kSlowest || speed > kFastest) {
         refuseCommand("a number from 0.001 to 1000000 is needed behind speed");
+    }
     return speed;
 }
 
@@ -161,12 +163,14 @@ bool LiveSession::steerTime(const std::vector<CommandWord>& words) {
     const std::string& verb = words.at(0).text;
     const bool isSpeed = verb == "speed";
     if (!isSpeed && verb != "pause" && verb != "play") return false;
-    if (words.size() != (isSpeed ? 2 : 1))
+    if (words.size() != (isSpeed ? 2 : 1)) {
         refuseCommand(verb + (isSpeed ? " takes one number" : " takes nothing"));
-    if (isSpeed)
+    }
+    if (isSpeed) {
         clock_.setSpeed(speedOf(words[1]));
-    else
+    } else {
         clock_.pause(verb == "pause");
+    }
     return true;
 }
 

@@ -63,12 +63,14 @@ int runTool(int argc, char** argv) {
     testbed::addTellCommand(app, status);
     testbed::addScenariosCommand(app, status);
     app.set_version_flag("-V,--version", "plexor-testbed " PLEXOR_VERSION);
-    for (CLI::App* command : app.get_subcommands(nullptr))
+    for (CLI::App* command : app.get_subcommands(nullptr)) {
         command->set_version_flag("-V,--version", "plexor-testbed " PLEXOR_VERSION);
+    }
     app.callback([&app] {
-        if (app.get_subcommands().empty())
+        if (app.get_subcommands().empty()) {
             throw CLI::RequiredError(
                 "a command (ask, calls, managers, page, scenarios, serve, show, tell or watch)");
+        }
     });
     return run(app, status, argc, argv);
 }

@@ -42,10 +42,12 @@ const ServedClass* kindOf(const ClassAnswer& answer) {
 
 std::string countsOf(const Inventory& inventory) {
     std::string text = gauge("plexor_elements", "Elements by kind.");
-    for (const ClassAnswer& answer : inventory)
-        if (const ServedClass* kind = kindOf(answer))
+    for (const ClassAnswer& answer : inventory) {
+        if (const ServedClass* kind = kindOf(answer)) {
             text += "plexor_elements{" + label("kind", kind->singular) + "} " +
                     std::to_string(answer.response.instances.size()) + "\n";
+        }
+    }
     return text;
 }
 

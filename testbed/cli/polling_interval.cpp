@@ -20,8 +20,9 @@ PollingInterval::PollingInterval(unsigned seconds) {
     file_ = std::string(folder != nullptr ? folder : "/tmp") + "/plexor-testbed-XXXXXX";
     const int descriptor = mkstemp(file_.data());
     const std::string text = std::string(kOption) + " = " + std::to_string(seconds) + "\n";
-    if (descriptor < 0 || write(descriptor, text.data(), text.size()) < 0)
+    if (descriptor < 0 || write(descriptor, text.data(), text.size()) < 0) {
         throw std::runtime_error("cannot write " + file_);
+    }
     close(descriptor);
     setenv(kVariable, file_.c_str(), 1);
 }

@@ -39,10 +39,11 @@ std::string replaced(std::string_view text, Keep keep) {
     std::string result;
     while (!text.empty()) {
         const Unit unit = firstUnit(text);
-        if (keep(unit))
+        if (keep(unit)) {
             result += text.substr(0, unit.size);
-        else
+        } else {
             result += '?';
+        }
         text.remove_prefix(unit.size);
     }
     return result;

@@ -15,8 +15,9 @@ void defineChosenClasses(Repository& repository, const std::string& nameSpace,
     const bool isStandard = std::filesystem::is_regular_file(chosen);
     if (isStandard) defineStandardClasses(repository, nameSpace, chosen);
     defineServedClasses(repository, nameSpace, locateSchema(isStandard ? "" : chosen));
-    for (const std::string& name : repository.namespaceNames())
+    for (const std::string& name : repository.namespaceNames()) {
         qualifyStandardClasses(repository, name);
+    }
 }
 
 }  // namespace testbed

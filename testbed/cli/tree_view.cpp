@@ -142,8 +142,9 @@ private:
         };
         const auto parts =
             foldedLines(line.text, room(before), room(std::max(before, kTwigColumns) + 2));
-        for (const TextPart& part : parts)
+        for (const TextPart& part : parts) {
             out_ += (&part == &parts.front() ? first : continued) + paintedPart(line, part) + "\n";
+        }
     }
 
     const TreeStyle& style_;
@@ -153,8 +154,9 @@ private:
 
 /// Headings get the number of what is beneath them.
 void countChildren(std::vector<Branch>& sections) {
-    for (Branch& branch : sections)
+    for (Branch& branch : sections) {
         branch.line.text += " (" + std::to_string(branch.children.size()) + ")";
+    }
 }
 
 Roots controllersOf(const Inventory& inventory, const TreeStyle& style) {

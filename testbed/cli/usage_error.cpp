@@ -23,8 +23,9 @@ bool isOption(std::string_view argument) {
 
 std::string commandNames(const CLI::App& app) {
     std::string names;
-    for (const CLI::App* command : app.get_subcommands(nullptr))
+    for (const CLI::App* command : app.get_subcommands(nullptr)) {
         names += (names.empty() ? "" : ", ") + command->get_name();
+    }
     return names;
 }
 
@@ -46,9 +47,10 @@ bool isWord(std::string_view argument) {
 std::string unexpected(const CLI::App& app, const std::string& first) {
     const bool commandMissing =
         &commandIn(app) == &app && !app.get_subcommands(nullptr).empty() && !isOption(first);
-    if (commandMissing)
+    if (commandMissing) {
         return "there is no command " + (isWord(first) ? first : "of that name") +
                "; commands are " + commandNames(app);
+    }
     const auto arguments = app.remaining(true);
     const auto option = std::find_if(arguments.begin(), arguments.end(), isOption);
     if (option != arguments.end()) return "there is no option " + optionName(*option);
@@ -63,8 +65,9 @@ std::string withoutCredentials(std::string text, int argc, const char* const* ar
             const std::string value = argument.substr(begin);
             const std::size_t at = value.rfind('@');
             if (at == std::string::npos) continue;
-            for (std::size_t found; (found = text.find(value)) != std::string::npos;)
+            for (std::size_t found; (found = text.find(value)) != std::string::npos;) {
                 text.replace(found, value.size(), "***" + value.substr(at + 1));
+            }
         }
     }
     return text;
