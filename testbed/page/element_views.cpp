@@ -51,8 +51,9 @@ constexpr StateLook kStateLooks[] = {
 };
 
 const Look& lookNamed(const std::string& name) {
-    for (const Look& look : kLooks)
+    for (const Look& look : kLooks) {
         if (name == look.look) return look;
+    }
     return kLooks[0];
 }
 
@@ -61,8 +62,9 @@ const Look& lookOf(const std::string& className, const std::string& word,
     if (!verdict) return lookNamed("plain");
     if (verdict->ignored) return lookNamed("ignored");
     if (verdict->level == CheckLevel::Critical) return lookNamed("critical");
-    for (const StateLook& row : kStateLooks)
+    for (const StateLook& row : kStateLooks) {
         if (sameName(className, row.className) && word == row.word) return lookNamed(row.look);
+    }
     return lookNamed(levelName(verdict->level));
 }
 
@@ -83,9 +85,11 @@ std::string wordFor(const std::string& className, const Instance& instance,
 
 /// The name without "on controller C0", which stands above it.
 std::string labelOf(const std::string& name, const std::string& controller) {
-    for (const char* joint : {" on controller ", " on Controller "})
-        if (name.ends_with(joint + controller))
+    for (const char* joint : {" on controller ", " on Controller "}) {
+        if (name.ends_with(joint + controller)) {
             return name.substr(0, name.size() - controller.size() - std::string(joint).size());
+        }
+    }
     return name;
 }
 
@@ -101,8 +105,9 @@ ElementState stateOf(const std::string& className, const Instance& instance,
 
 ordered_json looksAsJson() {
     ordered_json looks = ordered_json::array();
-    for (const Look& look : kLooks)
+    for (const Look& look : kLooks) {
         looks.push_back({{"look", look.look}, {"sign", look.sign}, {"meaning", look.meaning}});
+    }
     return looks;
 }
 
@@ -133,8 +138,9 @@ ElementViews::ElementViews(const Inventory& inventory, const CheckPolicy& policy
     for (const ClassAnswer& answer : inventory) {
         const ServedClass* served = findServedClass(answer.className);
         for (const Instance& instance : answer.response.instances) {
-            if (served == &controllers)
+            if (served == &controllers) {
                 controllers_.push_back(identityOf(*served, instance).value_or(""));
+            }
             if (sameName(answer.className, kDrive)) drives_.insert(keyOf(*served, instance));
         }
     }

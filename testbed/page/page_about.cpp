@@ -24,9 +24,10 @@ ordered_json wordsAsJson(CodeWords words) {
 
 ordered_json pageAbout(const std::string& source, bool steers) {
     ordered_json about = {{"source", printable(source)}, {"looks", looksAsJson()}};
-    for (const ServedClass& served : servedClasses())
+    for (const ServedClass& served : servedClasses()) {
         about["kinds"][served.singular] = {
             {"class", served.name}, {"heading", served.heading}, {"plural", served.plural}};
+    }
     about["words"] = {{"OperationalStatus", wordsAsJson(operationalStatusWords())},
                       {"HealthState", wordsAsJson(healthStateWords())},
                       {"EnabledState", wordsAsJson(enabledStateWords())},

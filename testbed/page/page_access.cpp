@@ -18,8 +18,9 @@ std::string randomToken() {
     unsigned char bytes[16];
     if (RAND_bytes(bytes, sizeof bytes) != 1) throw std::runtime_error("no random numbers");
     std::string token;
-    for (const unsigned char byte : bytes)
+    for (const unsigned char byte : bytes) {
         for (const int digit : {byte >> 4, byte & 15}) token += "0123456789abcdef"[digit];
+    }
     return token;
 }
 

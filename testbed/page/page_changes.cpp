@@ -48,9 +48,10 @@ private:
 
     void addAll(const std::vector<const Instance*>& instances, const std::string& what) {
         const std::size_t count = instances.size();
-        if (count > kMostNamed)
+        if (count > kMostNamed) {
             changes_.push_back({timeStamp(), "", "",
                                 std::to_string(count) + " " + served_.plural + " have " + what});
+        }
         for (std::size_t i = 0; i < count && count <= kMostNamed; i++) {
             const bool isThere = what == "come";
             const std::string state = isThere ? word(*instances[i]) : "";
@@ -77,9 +78,11 @@ private:
 };
 
 const ClassAnswer* answerFor(const Inventory& inventory, const std::string& className) {
-    for (const ClassAnswer& answer : inventory)
-        if (sameName(answer.className, className))
+    for (const ClassAnswer& answer : inventory) {
+        if (sameName(answer.className, className)) {
             return answer.response.rc == CMPI_RC_OK ? &answer : nullptr;
+        }
+    }
     return nullptr;
 }
 
@@ -100,20 +103,22 @@ std::vector<PageChange> changesBetween(const Inventory& before, const Inventory&
     for (const ServedClass& served : servedClasses()) {
         const ClassAnswer* then = answerFor(before, served.name);
         const ClassAnswer* now = answerFor(after, served.name);
-        if (then && now)
+        if (then && now) {
             Comparison(served, policy, changes)
                 .compare(then->response.instances, now->response.instances);
+        }
     }
     return changes;
 }
 
 ordered_json changesAsJson(const std::vector<PageChange>& changes) {
     ordered_json list = ordered_json::array();
-    for (const PageChange& change : changes)
+    for (const PageChange& change : changes) {
         list.push_back({{"time", change.time},
                         {"key", change.key},
                         {"level", change.level},
                         {"text", change.text}});
+    }
     return list;
 }
 

@@ -53,9 +53,11 @@ ordered_json entry(const std::string& label, const std::string& command, const s
 
 ordered_json commandsOf(const std::string& kind) {
     ordered_json list = ordered_json::array();
-    for (const StateVerb& row : stateVerbs())
-        if (kind == row.kind)
+    for (const StateVerb& row : stateVerbs()) {
+        if (kind == row.kind) {
             list.push_back(entry(row.verb, row.verb + (" " + kind) + " {}", kind));
+        }
+    }
     if (kind == "drive") {
         list.push_back(entry("replace", "replace drive {}", kind));
         list.push_back(entry("remove", "remove drive {}", kind));
@@ -66,18 +68,20 @@ ordered_json commandsOf(const std::string& kind) {
 /// Commands for which the command itself is label enough.
 ordered_json wholeCommands(std::span<const char* const> commands) {
     ordered_json list = ordered_json::array();
-    for (const char* command : commands)
+    for (const char* command : commands) {
         list.push_back(
             entry(command, command, command == std::string_view("clear server") ? command : ""));
+    }
     return {{"buttons", list}, {"states", ordered_json::array()}};
 }
 
 ordered_json choicesOf(const char* kind, StateWords states) {
     ordered_json list = ordered_json::array();
-    for (const StateWord& state : states)
+    for (const StateWord& state : states) {
         list.push_back(entry(
             state.word, std::string("set ") + kind + " {} state=" + ordered_json(state.word).dump(),
             kind));
+    }
     return list;
 }
 
@@ -85,8 +89,9 @@ ordered_json choicesOf(const char* kind, StateWords states) {
 
 ordered_json commandsAsJson() {
     ordered_json commands = ordered_json::object();
-    for (const char* kind : {"drive", "volume", "port", "battery", "enclosure"})
+    for (const char* kind : {"drive", "volume", "port", "battery", "enclosure"}) {
         commands[kind] = {{"buttons", commandsOf(kind)}, {"states", ordered_json::array()}};
+    }
     commands["drive"]["states"] = choicesOf("drive", driveStates());
     commands["volume"]["states"] = choicesOf("volume", volumeStates());
     commands["battery"]["states"] = choicesOf("battery", batteryStates());
@@ -98,8 +103,9 @@ ordered_json commandsAsJson() {
 bool isForPages(const std::string& command) {
     const std::string verb = verbOf(command);
     if (std::find(std::begin(kSessionVerbs), std::end(kSessionVerbs), verb) !=
-        std::end(kSessionVerbs))
+        std::end(kSessionVerbs)) {
         return true;
+    }
     try {
         checkArrayCommand(command);
         return true;

@@ -39,8 +39,9 @@ std::string documentText(const PageDocument& document, const Json& about) {
 
 Json documentChange(const PageDocument& before, const PageDocument& after) {
     Json change = {{"set", Json::object()}, {"elements", Json::object()}};
-    for (const auto& [name, value] : after.rest.items())
+    for (const auto& [name, value] : after.rest.items()) {
         if (!before.rest.contains(name) || before.rest[name] != value) change["set"][name] = value;
+    }
     if (before.elements == after.elements) return change;
     for (const auto& [name, list] : after.elements->items()) {
         const auto old = before.elements->find(name);

@@ -32,17 +32,20 @@ HttpStream::Text eventText(const char* name, const std::string& data) {
 }
 
 ClassAnswer* answerFor(Inventory& inventory, const std::string& className) {
-    for (ClassAnswer& answer : inventory)
+    for (ClassAnswer& answer : inventory) {
         if (sameName(answer.className, className)) return &answer;
+    }
     return nullptr;
 }
 
 /// Drives that stand in no rack, in rows of their controllers.
 void addRows(Json& racks, const Json& drives) {
     std::set<std::string> placed;
-    for (const Json& rack : racks)
-        for (const Json& slot : rack["slots"])
+    for (const Json& rack : racks) {
+        for (const Json& slot : rack["slots"]) {
             if (slot.contains("drive")) placed.insert(slot["drive"].get<std::string>());
+        }
+    }
     for (const Json& drive : drives) {
         const Json& view = drive["view"];
         if (placed.contains(view["key"].get<std::string>())) continue;
@@ -202,16 +205,19 @@ std::string PageFeed::arrivingNow(const Inventory& inventory) {
 /// Classes that were not answered stay as they were last.
 void PageFeed::show(Inventory answered) {
     const bool isFirst = shown_.empty();
-    if (!isFirst)
-        for (PageChange& change : changesBetween(shown_, answered, source_.policy))
+    if (!isFirst) {
+        for (PageChange& change : changesBetween(shown_, answered, source_.policy)) {
             changes_.push_front(std::move(change));
+        }
+    }
     changes_.resize(std::min(changes_.size(), kMostChanges));
     for (ClassAnswer& answer : answered) {
         ClassAnswer* old = answerFor(shown_, answer.className);
-        if (!old)
+        if (!old) {
             shown_.push_back(std::move(answer));
-        else if (answer.response.rc == CMPI_RC_OK)
+        } else if (answer.response.rc == CMPI_RC_OK) {
             *old = std::move(answer);
+        }
     }
 }
 
@@ -230,9 +236,10 @@ void PageFeed::build(const std::lock_guard<std::mutex>&) {
         Json elements = Json::object();
         for (const ClassAnswer& answer : shown_) {
             Json& list = elements[answer.className] = std::move(all[answer.className]);
-            for (std::size_t i = 0; i < list.size(); i++)
+            for (std::size_t i = 0; i < list.size(); i++) {
                 list[i]["view"] =
                     views.of(*findServedClass(answer.className), answer.response.instances[i]);
+            }
         }
         elements_ = std::make_shared<const Json>(std::move(elements));
     }
@@ -264,9 +271,10 @@ void PageFeed::publish(PageDocument document) {
 
 std::string PageFeed::headLocked() const {
     char age[40] = "null";
-    if (answered_)
+    if (answered_) {
         std::snprintf(age, sizeof age, "%.1f",
                       std::chrono::duration<double>(Clock::now() - *answered_).count());
+    }
     return "\"serial\":" + std::to_string(serial_) + ",\"age\":" + age;
 }
 

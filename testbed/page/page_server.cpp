@@ -37,8 +37,9 @@ HttpHeaders pageHeaders(std::string type) {
 
 HttpResponse refusal(int status) {
     HttpResponse response{status, pageHeaders("text/plain"), {}};
-    if (status == 401)
+    if (status == 401) {
         response.headers.emplace_back("WWW-Authenticate", "Basic realm=\"plexor-testbed\"");
+    }
     return response;
 }
 
@@ -47,8 +48,9 @@ HttpResponse jsonResponse(std::string text) {
 }
 
 const PageFile* fileFor(std::string_view target) {
-    for (const PageFile& file : pageFiles())
+    for (const PageFile& file : pageFiles()) {
         if (file.target == target) return &file;
+    }
     return nullptr;
 }
 
@@ -99,13 +101,16 @@ std::optional<HttpOutcome> PageServer::answer(const HttpRequest& request) const 
 }
 
 HttpOutcome PageServer::answerGet(const HttpRequest& request) const {
-    if (const PageFile* file = fileFor(request.target))
+    if (const PageFile* file = fileFor(request.target)) {
         return HttpResponse{200, pageHeaders(std::string(file->type)), std::string(file->content)};
-    if (isDocument(request.target))
+    }
+    if (isDocument(request.target)) {
         return jsonResponse(feed_.document(knownSerial(request.target)));
-    if (request.target == kToken)
+    }
+    if (request.target == kToken) {
         return jsonResponse(
             jsonLine({{"token", maySteer(request) ? ordered_json(access_.token()) : nullptr}}));
+    }
     return HttpResponse{200, pageHeaders("text/event-stream"), {}, {}, feed_.follow()};
 }
 
@@ -115,8 +120,9 @@ HttpOutcome PageServer::answerCommand(const HttpRequest& request) const {
     if (!type || !type->starts_with("application/json")) return refusal(415);
     const std::string command = commandIn(request.body);
     if (command.empty() || !isOneLine(command)) return refusal(400);
-    if (!isForPages(command))
+    if (!isForPages(command)) {
         return resultResponse({true, false, "not for pages; plexor-testbed tell takes it"});
+    }
     return SlowWork([this, command] { return resultResponse(carryOut_(command)); });
 }
 

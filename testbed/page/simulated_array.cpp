@@ -57,14 +57,16 @@ public:
 
     ordered_json take() {
         for (const ControllerDescription& controller : array_.scenario().controllers) {
-            for (const EnclosureDescription& enclosure : controller.enclosures)
+            for (const EnclosureDescription& enclosure : controller.enclosures) {
                 addEnclosure(controller, enclosure);
+            }
             auto loose = slotsOf(controller, "");
-            if (!loose.empty())
+            if (!loose.empty()) {
                 racks_.push_back({{"controller", controller.id},
                                   {"name", "Drives without an enclosure"},
                                   {"row", true},
                                   {"slots", slotsAsJson(std::move(loose))}});
+            }
         }
         return std::move(racks_);
     }
@@ -87,19 +89,22 @@ private:
     std::vector<Slot> slotsOf(const ControllerDescription& controller,
                               const std::string& enclosure) const {
         std::vector<Slot> slots;
-        for (const DriveDescription& drive : controller.drives)
-            if (enclosureOf(controller, drive) == enclosure)
+        for (const DriveDescription& drive : controller.drives) {
+            if (enclosureOf(controller, drive) == enclosure) {
                 slots.push_back({drive.slot,
                                  {{"drive", keyFor("drive", controller.id, drive.id)},
                                   {"id", printable(drive.id)}}});
+            }
+        }
         const ControllerDescription* original = array_.original().findController(controller.id);
         for (const PulledDrive& pulled : pulled_) {
             const DriveDescription* drive = original && pulled.controller == controller.id
                                                 ? findById(original->drives, pulled.id)
                                                 : nullptr;
-            if (drive && enclosureOf(controller, *drive) == enclosure)
+            if (drive && enclosureOf(controller, *drive) == enclosure) {
                 slots.push_back(
                     {drive->slot, {{"id", printable(drive->id)}, {"insert", pulled.insert}}});
+            }
         }
         return slots;
     }
@@ -118,8 +123,9 @@ private:
 template <typename Descriptions>
 void addTargets(CommandTargets& targets, const char* kind, const std::string& controller,
                 const Descriptions& list) {
-    for (const auto& item : list)
+    for (const auto& item : list) {
         targets.emplace(keyFor(kind, controller, item.id), targetOf(controller, item.id));
+    }
 }
 
 /// What is under way: "drive C0 32_7" of the schedule.
@@ -172,11 +178,13 @@ SimulatedArray simulatedArray(const LiveArray& array, const ArrayClock& clock) {
         addTargets(simulated.targets, "volume", controller.id, controller.volumes);
         addTargets(simulated.targets, "port", controller.id, controller.ports);
         addTargets(simulated.targets, "battery", controller.id, controller.batteries);
-        for (const DriveDescription& drive : controller.drives)
-            if (drive.slot && !drive.enclosure.empty())
+        for (const DriveDescription& drive : controller.drives) {
+            if (drive.slot && !drive.enclosure.empty()) {
                 simulated.places.emplace(
                     controller.id + " " + std::to_string(*drive.slot) + "e" + drive.enclosure,
                     keyFor("drive", controller.id, drive.id));
+            }
+        }
     }
     return simulated;
 }

@@ -133,8 +133,9 @@ unsigned MofLexer::readEscape() {
     if ((name | 0x20) != 'x' || !isHexDigit(peek(1))) fail(line_, "an unknown escape in a literal");
     ++place_;
     unsigned code = 0;
-    for (int digits = 0; digits < 4 && isHexDigit(peek()); ++digits)
+    for (int digits = 0; digits < 4 && isHexDigit(peek()); ++digits) {
         code = code * 16 + hexValue(text_[place_++]);
+    }
     return code;
 }
 
@@ -178,8 +179,9 @@ MofToken MofLexer::next() {
         ++place_;
         return read(MofTokenKind::Alias, belongsToWord);
     }
-    if (c == '\0' || kSymbols.find(c) == kSymbols.npos)
+    if (c == '\0' || kSymbols.find(c) == kSymbols.npos) {
         fail(line_, "a character that does not belong here");
+    }
     ++place_;
     return {MofTokenKind::Symbol, std::string(1, c), line_};
 }

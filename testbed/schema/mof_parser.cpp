@@ -34,8 +34,9 @@ bool MofParser::takeWord(std::string_view keyword) {
 }
 
 std::string MofParser::expectWord(const char* what) {
-    if (token_.kind != MofTokenKind::Word)
+    if (token_.kind != MofTokenKind::Word) {
         fail(std::string(what) + " expected, not " + token_.shown());
+    }
     std::string word = std::move(token_.text);
     advance();
     return word;
@@ -89,8 +90,9 @@ void MofParser::parseClass(QualifierList qualifiers) {
     definition.name = expectWord("the name of the class");
     definition.qualifiers = std::move(qualifiers.others);
     definition.isAssociation = qualifiers.isAssociation;
-    if (!document_.classNames.insert(foldName(definition.name)).second)
+    if (!document_.classNames.insert(foldName(definition.name)).second) {
         fail("the class " + definition.name + " twice");
+    }
     skipAlias();
     if (take(':')) definition.superclass = expectWord("the name of the superclass");
     expect('{');
@@ -103,16 +105,18 @@ void MofParser::parseClass(QualifierList qualifiers) {
 void MofParser::parseMember(ClassDefinition& definition) {
     QualifierList qualifiers = parseQualifiers();
     const Declared head = parseTypeAndName();
-    if (token_.isSymbol('('))
+    if (token_.isSymbol('(')) {
         parseMethod(definition, head, std::move(qualifiers.others));
-    else
+    } else {
         parseProperty(definition, head, std::move(qualifiers));
+    }
 }
 
 void MofParser::parseProperty(ClassDefinition& definition, const Declared& head,
                               QualifierList qualifiers) {
-    for (const PropertyDefinition& other : definition.properties)
+    for (const PropertyDefinition& other : definition.properties) {
         if (sameName(other.name, head.name)) fail("the property " + head.name + " twice");
+    }
     PropertyDefinition property;
     property.name = head.name;
     property.referenceClass = head.referenceClass;
@@ -126,8 +130,9 @@ void MofParser::parseProperty(ClassDefinition& definition, const Declared& head,
 
 void MofParser::parseMethod(ClassDefinition& definition, const Declared& head,
                             Qualifiers qualifiers) {
-    for (const MethodDefinition& other : definition.methods)
+    for (const MethodDefinition& other : definition.methods) {
         if (sameName(other.name, head.name)) fail("the method " + head.name + " twice");
+    }
     if (head.type == CMPI_ref) fail("the method " + head.name + " returns a reference");
     MethodDefinition method{head.name, head.type, "", {}, std::move(qualifiers)};
     expect('(');
@@ -144,8 +149,9 @@ void MofParser::parseMethod(ClassDefinition& definition, const Declared& head,
 void MofParser::parseParameter(MethodDefinition& method) {
     QualifierList qualifiers = parseQualifiers();
     const Declared head = parseTypeAndName();
-    for (const ParameterDefinition& other : method.parameters)
+    for (const ParameterDefinition& other : method.parameters) {
         if (sameName(other.name, head.name)) fail("the parameter " + head.name + " twice");
+    }
     method.parameters.push_back({head.name, parseArraySuffix(head.type), head.referenceClass,
                                  std::move(qualifiers.others)});
 }

@@ -10,8 +10,9 @@ CimValue valueless(CMPIType type) {
 }
 
 bool hasNamed(const Qualifiers& qualifiers, const std::string& name) {
-    for (const NamedValue& qualifier : qualifiers)
+    for (const NamedValue& qualifier : qualifiers) {
         if (sameName(qualifier.first, name)) return true;
+    }
     return false;
 }
 
@@ -77,19 +78,22 @@ void MofParser::skipFlavours() {
 /// Behind the word "qualifier": NAME : TYPE [= DEFAULT], SCOPE(...) [, FLAVOR(...)];
 void MofParser::parseQualifierDeclaration() {
     const std::string name = expectWord("the name of the qualifier");
-    if (document_.qualifierTypes.count(foldName(name)) > 0)
+    if (document_.qualifierTypes.count(foldName(name)) > 0) {
         fail("the qualifier " + name + " is declared twice");
+    }
     expect(':');
     const std::string typeWord = expectWord("the type of the qualifier");
     const auto element = mofType(typeWord);
     if (!element) fail("unknown type " + typeWord);
     const CMPIType type = parseArraySuffix(*element);
-    if (take('=') && !typedValue(parseValue(), type))
+    if (take('=') && !typedValue(parseValue(), type)) {
         fail("the default of " + name + " is no " + typeName(type));
+    }
     while (take(',')) {
         const std::string list = expectWord("\"scope\" or \"flavor\"");
-        if (!sameName(list, "scope") && !sameName(list, "flavor"))
+        if (!sameName(list, "scope") && !sameName(list, "flavor")) {
             fail("\"scope\" or \"flavor\" expected, not \"" + list + "\"");
+        }
         expect('(');
         do {
             expectWord("a word");

@@ -21,8 +21,9 @@ constexpr std::size_t kDeepestInclude = 32;
 /// None for what is no readable file of bearable size.
 std::optional<std::string> contentOf(const fs::path& file) {
     std::error_code error;
-    if (!fs::is_regular_file(file, error) || fs::file_size(file, error) > kLargestFile)
+    if (!fs::is_regular_file(file, error) || fs::file_size(file, error) > kLargestFile) {
         return std::nullopt;
+    }
     std::ifstream stream(file, std::ios::binary);
     std::stringstream text;
     text << stream.rdbuf();
@@ -33,10 +34,12 @@ class Reader {
 public:
     /// `file` was asked for at that line of `from`.
     void read(const fs::path& file, const std::string& from, int line) {
-        if (std::find(open_.begin(), open_.end(), file) != open_.end())
+        if (std::find(open_.begin(), open_.end(), file) != open_.end()) {
             throw MofError(from, line, file.string() + " includes itself");
-        if (open_.size() >= kDeepestInclude || ++files_ > kMostFiles)
+        }
+        if (open_.size() >= kDeepestInclude || ++files_ > kMostFiles) {
             throw MofError(from, line, "too many included files");
+        }
         const auto text = contentOf(file);
         if (!text) throw MofError(from, line, "cannot read " + file.string());
         open_.push_back(file);

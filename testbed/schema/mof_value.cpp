@@ -145,8 +145,9 @@ std::optional<CMPIType> mofType(std::string_view name) {
         CMPI_uint16,  CMPI_uint32, CMPI_uint64,   CMPI_sint8,  CMPI_sint16,
         CMPI_sint32,  CMPI_sint64, CMPI_real32,   CMPI_real64,
     };
-    for (const CMPIType type : kTypes)
+    for (const CMPIType type : kTypes) {
         if (sameName(typeName(type), name)) return type;
+    }
     return std::nullopt;
 }
 

@@ -17,8 +17,9 @@ public:
     Hierarchy(Repository& repository, const std::string& nameSpace,
               std::vector<ClassDefinition> classes)
         : repository_(repository), nameSpace_(nameSpace), classes_(std::move(classes)) {
-        for (std::size_t i = 0; i < classes_.size(); i++)
+        for (std::size_t i = 0; i < classes_.size(); i++) {
             places_.emplace(foldName(classes_[i].name), i);
+        }
     }
 
     void define() {
@@ -44,20 +45,22 @@ private:
         const std::string& superclass = definition.superclass;
         const auto above = members_.find(foldName(superclass));
         Members members;
-        if (above != members_.end())
+        if (above != members_.end()) {
             members = above->second;
-        else if (!superclass.empty())
+        } else if (!superclass.empty()) {
             members = membersOfKnown(definition.name, superclass);
+        }
         for (PropertyDefinition& property : definition.properties) {
             const auto [entry, isNew] = members.try_emplace(
                 foldName(property.name), Member{definition.name, property.isKey});
             property.originClass = entry->second.origin;
             property.isKey = entry->second.isKey = entry->second.isKey || property.isKey;
         }
-        for (MethodDefinition& method : definition.methods)
+        for (MethodDefinition& method : definition.methods) {
             method.originClass =
                 members.try_emplace(foldName(method.name), Member{definition.name, false})
                     .first->second.origin;
+        }
         if (associations_.count(foldName(superclass)) > 0) definition.isAssociation = true;
         if (definition.isAssociation) associations_.insert(foldName(definition.name));
         members_[foldName(definition.name)] = std::move(members);
@@ -72,12 +75,15 @@ private:
 
     /// Of a class that the files do not define.
     Members membersOfKnown(const std::string& name, const std::string& superclass) const {
-        if (!repository_.hasClass(nameSpace_, superclass))
+        if (!repository_.hasClass(nameSpace_, superclass)) {
             throw std::runtime_error("schema: " + name + " derives from " + superclass +
                                      ", which is not known");
+        }
         Members members;
-        for (const PropertyDefinition& property : repository_.allProperties(nameSpace_, superclass))
+        for (const PropertyDefinition& property :
+             repository_.allProperties(nameSpace_, superclass)) {
             members[foldName(property.name)] = {property.originClass, property.isKey};
+        }
         return members;
     }
 

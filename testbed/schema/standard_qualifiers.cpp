@@ -146,24 +146,29 @@ bool hasQualifier(const Qualifiers& qualifiers, const char* name) {
 
 void addAbstract(ClassDefinition& definition) {
     if (hasQualifier(definition.qualifiers, "Abstract")) return;
-    for (const char* name : kAbstract)
-        if (sameName(name, definition.name))
+    for (const char* name : kAbstract) {
+        if (sameName(name, definition.name)) {
             definition.qualifiers.emplace_back("Abstract", CimValue::boolean(true));
+        }
+    }
 }
 
 void addReferenceClass(const ClassDefinition& definition, PropertyDefinition& property) {
     if (property.type != CMPI_ref || !property.referenceClass.empty()) return;
-    for (const ReferenceClass& row : kReferences)
-        if (sameName(row.className, definition.name) && sameName(row.role, property.name))
+    for (const ReferenceClass& row : kReferences) {
+        if (sameName(row.className, definition.name) && sameName(row.role, property.name)) {
             property.referenceClass = row.target;
+        }
+    }
 }
 
 void addMeanings(const ClassDefinition& definition, PropertyDefinition& property) {
     if (hasQualifier(property.qualifiers, "ValueMap")) return;
     std::vector<CimValue> numbers, texts;
     for (const Meaning& row : kMeanings) {
-        if (!sameName(row.className, definition.name) || !sameName(row.property, property.name))
+        if (!sameName(row.className, definition.name) || !sameName(row.property, property.name)) {
             continue;
+        }
         numbers.push_back(CimValue::string(row.number));
         texts.push_back(CimValue::string(row.text));
     }

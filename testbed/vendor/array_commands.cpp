@@ -85,8 +85,9 @@ std::uint64_t milliseconds(const Words& words, std::size_t i) {
 }
 
 const char* listOfKind(const std::string& kind) {
-    for (const Kind& row : kKinds)
+    for (const Kind& row : kKinds) {
         if (kind == row.word) return row.list;
+    }
     std::string known;
     for (const Kind& row : kKinds) known += std::string(known.empty() ? "" : ", ") + row.word;
     refuseCommand("unknown kind \"" + kind + "\" (known: " + known + ")");
@@ -95,8 +96,9 @@ const char* listOfKind(const std::string& kind) {
 /// What a state stands for, member by member; a new state must not be overruled by old numbers.
 void forgetState(json& element) {
     for (const char* name :
-         {"state", "status", "operationalStatus", "extentStatus", "batteryStatus", "primordial"})
+         {"state", "status", "operationalStatus", "extentStatus", "batteryStatus", "primordial"}) {
         element.erase(name);
+    }
 }
 
 void setMembers(json& object, const Words& words, std::size_t first) {
@@ -104,8 +106,9 @@ void setMembers(json& object, const Words& words, std::size_t first) {
     std::set<std::string> names;
     for (std::size_t i = first; i < words.size(); i++) {
         if (words[i].name.empty()) refuseCommand("not NAME=VALUE: " + words[i].text);
-        if (!names.insert(words[i].name).second)
+        if (!names.insert(words[i].name).second) {
             refuseCommand("\"" + words[i].name + "\" is given twice");
+        }
     }
     if (names.contains("state")) forgetState(object);
     if (names.contains("status")) object.erase("operationalStatus");
@@ -133,8 +136,9 @@ std::string poolOf(const json& drive) {
 std::string homeOf(json& controller, const json& drive) {
     for (const json& pool : controller.value("pools", json::array())) {
         const json members = pool.value("members", json::array());
-        if (std::find(members.begin(), members.end(), idOf(drive)) != members.end())
+        if (std::find(members.begin(), members.end(), idOf(drive)) != members.end()) {
             return idOf(pool);
+        }
     }
     const json* pool = findElement(controller, "pools", poolOf(drive));
     return pool && !pool->value("primordial", false) ? idOf(*pool) : "";
@@ -159,15 +163,17 @@ void applyStateVerb(json& controller, json& element, const StateVerb& verb) {
     if (std::string(verb.member) == "state") forgetState(element);
     element.erase("operationalStatus");
     element[verb.member] = verb.value;
-    if (isDrive && std::string(verb.verb) == "restore" && homeOf(controller, element).empty())
+    if (isDrive && std::string(verb.verb) == "restore" && homeOf(controller, element).empty()) {
         setState(element, "unconfigured good");
+    }
 }
 
 void changeElement(json& document, const Words& words) {
     const std::string& verb = words[0].text;
     const std::string& kind = text(words, 1, "the kind");
-    if (verb == "set" && kind == "controller")
+    if (verb == "set" && kind == "controller") {
         return setMembers(controllerIn(document, words, 2), words, 3);
+    }
     const char* list = listOfKind(kind);
     json& controller = controllerIn(document, words, 2);
     if (verb == "add") {
@@ -186,8 +192,9 @@ void changeElement(json& document, const Words& words) {
         return;
     }
     if (verb == "replace" && kind == "drive") return replaceDrive(controller, element);
-    for (const StateVerb& row : kStateVerbs)
+    for (const StateVerb& row : kStateVerbs) {
         if (verb == row.verb && kind == row.kind) return applyStateVerb(controller, element, row);
+    }
     refuseCommand("unknown command \"" + verb + " " + kind + "\"; help lists the known ones");
 }
 
@@ -222,8 +229,9 @@ constexpr Verb kVerbs[] = {
 };
 
 const Verb& verbOf(const Words& words) {
-    for (const Verb& row : kVerbs)
+    for (const Verb& row : kVerbs) {
         if (words.at(0).text == row.word) return row;
+    }
     refuseCommand("unknown command \"" + words[0].text + "\"; help lists the known ones");
 }
 
@@ -250,8 +258,9 @@ std::string commandHelpText() {
 json* findElement(json& owner, const std::string& list, const std::string& id) {
     const auto elements = owner.find(list);
     if (elements == owner.end() || !elements->is_array()) return nullptr;
-    for (json& element : *elements)
+    for (json& element : *elements) {
         if (idOf(element) == id) return &element;
+    }
     return nullptr;
 }
 

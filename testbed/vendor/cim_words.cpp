@@ -181,14 +181,16 @@ StateWords portStates() {
 }
 
 std::optional<std::uint16_t> codeOf(CodeWords words, std::string_view word) {
-    for (const CodeWord& row : words)
+    for (const CodeWord& row : words) {
         if (sameName(row.word, word)) return row.code;
+    }
     return std::nullopt;
 }
 
 std::string_view wordOf(CodeWords words, std::uint64_t code) {
-    for (const CodeWord& row : words)
+    for (const CodeWord& row : words) {
         if (row.code == code) return row.word;
+    }
     return {};
 }
 
@@ -197,8 +199,9 @@ std::string listOf(CodeWords words) {
 }
 
 const StateWord* findState(StateWords states, std::string_view word) {
-    for (const StateWord& row : states)
+    for (const StateWord& row : states) {
         if (sameName(row.word, word)) return &row;
+    }
     return nullptr;
 }
 
@@ -213,8 +216,9 @@ RaidLevels raidLevels() {
 const RaidLevel* findRaidLevel(std::string_view name) {
     std::string letters(name);
     std::erase_if(letters, [](char c) { return c == ' ' || c == '-'; });
-    for (const RaidLevel& row : kRaidLevels)
+    for (const RaidLevel& row : kRaidLevels) {
         if (sameName(row.word, letters)) return &row;
+    }
     return nullptr;
 }
 

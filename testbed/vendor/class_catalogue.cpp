@@ -9,8 +9,9 @@ namespace {
 
 /// The superclass of a CIM class; "" for a root class and for what is not in the catalogue.
 std::string_view superclassOf(std::string_view cimClass) {
-    for (const CatalogueClass& row : catalogueClasses())
+    for (const CatalogueClass& row : catalogueClasses()) {
         if (sameName(row.name, cimClass)) return row.superclass;
+    }
     return {};
 }
 
@@ -18,8 +19,9 @@ std::string_view superclassOf(std::string_view cimClass) {
 bool isAssociation(std::string_view cimClass) {
     const auto associations = catalogueAssociations();
     return std::any_of(associations.begin(), associations.end(), [&](const AssociationRoles& row) {
-        for (std::string_view name = row.className; !name.empty(); name = superclassOf(name))
+        for (std::string_view name = row.className; !name.empty(); name = superclassOf(name)) {
             if (name == cimClass) return true;
+        }
         return false;
     });
 }
@@ -33,8 +35,9 @@ std::vector<PropertyDefinition> propertiesOf(const std::string& cimClass) {
     }
     for (const AssociationRoles& row : catalogueAssociations()) {
         if (cimClass != row.className) continue;
-        for (const char* role : {row.leftRole, row.rightRole})
+        for (const char* role : {row.leftRole, row.rightRole}) {
             properties.push_back({role, CMPI_ref, true, cimClass, CimValue::null(CMPI_ref), {}});
+        }
     }
     return properties;
 }
@@ -42,15 +45,17 @@ std::vector<PropertyDefinition> propertiesOf(const std::string& cimClass) {
 }  // namespace
 
 const AssociationRoles& rolesOf(std::string_view cimAssociation) {
-    for (const AssociationRoles& row : catalogueAssociations())
+    for (const AssociationRoles& row : catalogueAssociations()) {
         if (cimAssociation == row.className) return row;
+    }
     throw std::out_of_range("no association class " + std::string(cimAssociation));
 }
 
 std::optional<CMPIType> declaredType(std::string_view cimClass, std::string_view property) {
     for (std::string_view name = cimClass; !name.empty(); name = superclassOf(name)) {
-        for (const CatalogueProperty& row : catalogueProperties())
+        for (const CatalogueProperty& row : catalogueProperties()) {
             if (sameName(row.className, name) && sameName(row.name, property)) return row.type;
+        }
     }
     return std::nullopt;
 }
@@ -79,10 +84,11 @@ void defineCimClasses(Repository& repository, std::string_view nameSpace) {
 
 void defineClasses(Repository& repository, std::string_view nameSpace, const std::string& prefix) {
     defineCimClasses(repository, nameSpace);
-    for (const VendorClass& row : vendorClasses())
+    for (const VendorClass& row : vendorClasses()) {
         repository.defineClass(
             nameSpace,
             {prefix + "_" + row.suffix, row.cimClass, {}, {}, isAssociation(row.cimClass)});
+    }
 }
 
 void defineClassBelow(Repository& repository, std::string_view nameSpace,

@@ -47,8 +47,9 @@ public:
 private:
     json takeJson() {
         const std::size_t end = endOfJson(text_, at_);
-        if (end < text_.size() && !isBlank(text_[end]))
+        if (end < text_.size() && !isBlank(text_[end])) {
             refuseCommand("a blank is missing behind " + text_.substr(at_, end - at_));
+        }
         json value = parseJson(text_.substr(at_, end - at_), "command");
         at_ = end;
         return value;
@@ -59,8 +60,9 @@ private:
         while (at_ < text_.size() && !isBlank(text_[at_])) {
             const bool valueFollows = text_[at_] == '=' && at_ > begin && at_ + 1 < text_.size();
             ++at_;
-            if (!valueFollows || std::string("\"{[").find(text_[at_]) == std::string::npos)
+            if (!valueFollows || std::string("\"{[").find(text_[at_]) == std::string::npos) {
                 continue;
+            }
             if (text_.find('=', begin) != at_ - 1) continue;
             const std::string name = text_.substr(begin, at_ - 1 - begin);
             json value = takeJson();

@@ -38,8 +38,9 @@ public:
             const EnclosureDescription* old = findById(before_.enclosures, enclosure.id);
             const bool isLost = isLostStatus(enclosure.operationalStatus);
             if (!old || isLostStatus(old->operationalStatus) == isLost) continue;
-            for (const DriveDescription& drive : after_.drives)
+            for (const DriveDescription& drive : after_.drives) {
                 if (drive.enclosure == enclosure.id) isLost ? hide(drive) : bringBack(drive);
+            }
         }
     }
 
@@ -49,19 +50,23 @@ public:
             if (!old || pool.primordial) continue;
             std::vector<std::string> places = groupPlaces(before_, *old);
             if (!hasChanged(pool, places)) continue;
-            for (const DriveDescription& drive : after_.drives)
+            for (const DriveDescription& drive : after_.drives) {
                 if (holds(drive.pools, pool.id)) followDrive(pool, drive, places);
+            }
             callSpares(pool, places);
             element(pool.id, "pools")["members"] = places;
         }
-        for (const DriveDescription& drive : after_.drives)
-            if (conditionOf(drive) != Filling)
+        for (const DriveDescription& drive : after_.drives) {
+            if (conditionOf(drive) != Filling) {
                 aftermath_.cancelled.push_back(subjectOf("drive", after_.id, drive.id));
+            }
+        }
     }
 
     void followVolumes() {
-        for (const VolumeDescription& volume : after_.volumes)
+        for (const VolumeDescription& volume : after_.volumes) {
             for (const std::string& id : volume.pools) followVolume(volume, id);
+        }
     }
 
     void followBatteries() {
@@ -70,9 +75,11 @@ public:
             if (old && old->batteryStatus == battery.batteryStatus) continue;
             const std::string subject = subjectOf("battery", after_.id, battery.id);
             aftermath_.cancelled.push_back(subject);
-            for (const BatteryStep& step : batterySteps())
-                if (step.batteryStatus == battery.batteryStatus)
+            for (const BatteryStep& step : batterySteps()) {
+                if (step.batteryStatus == battery.batteryStatus) {
                     schedule(subject, step.next, step.seconds);
+                }
+            }
         }
     }
 
@@ -135,8 +142,9 @@ private:
 
     const DriveDescription* standInFor(const std::string& id,
                                        const std::vector<std::string>& places) const {
-        for (const DriveDescription& drive : after_.drives)
+        for (const DriveDescription& drive : after_.drives) {
             if (drive.spareFor == id && holds(places, drive.id)) return &drive;
+        }
         return nullptr;
     }
 

@@ -47,8 +47,9 @@ ObjectGraph controllerGraph(const Naming& naming, const ControllerDescription& c
                {"OperationalStatus", CimValue::uint16Array({controller.operationalStatus})}},
               controller.part("system"));
     graph.link("CIM_LogicalIdentity", system, port);
-    for (const SoftwareDescription& software : controller.software)
+    for (const SoftwareDescription& software : controller.software) {
         addSoftware(graph, naming, controller, software);
+    }
     return graph;
 }
 

@@ -26,12 +26,14 @@ std::vector<std::string> readPools(JsonReader& reader, const ControllerDescripti
     const bool named = reader.has("pool") || reader.has("pools");
     std::vector<std::string> pools = reader.texts("pool");
     for (std::string& pool : reader.texts("pools")) pools.push_back(std::move(pool));
-    for (const std::string& pool : pools)
+    for (const std::string& pool : pools) {
         if (!findById(controller.pools, pool)) reader.fail("no pool \"" + pool + "\"");
+    }
     if (reader.flag("noPool")) return {};
     if (named) return pools;
-    for (const PoolDescription& pool : controller.pools)
+    for (const PoolDescription& pool : controller.pools) {
         if (pool.primordial == primordial) pools.push_back(pool.id);
+    }
     if (pools.size() > 1) reader.fail("\"pool\" is missing and there is a choice");
     return pools;
 }
@@ -50,8 +52,9 @@ void readDriveLocation(JsonReader& reader, const ControllerDescription& controll
     if (!reader.flag("noSlot") && reader.has("slot")) drive.slot = reader.number16("slot", 0);
     reader.take("slot");
     drive.enclosure = reader.text("enclosure", "");
-    if (!drive.enclosure.empty() && !findById(controller.enclosures, drive.enclosure))
+    if (!drive.enclosure.empty() && !findById(controller.enclosures, drive.enclosure)) {
         reader.fail("no enclosure \"" + drive.enclosure + "\"");
+    }
     if (reader.flag("noEnclosure")) drive.enclosure.clear();
     drive.noPackage = reader.flag("noPackage");
     drive.noMedia = reader.flag("noMedia");
@@ -62,17 +65,19 @@ const RaidLevel* readRaidLevel(JsonReader& reader) {
     const auto word = reader.optionalText("raid");
     if (!word) return nullptr;
     const RaidLevel* level = findRaidLevel(*word);
-    if (!level)
+    if (!level) {
         reader.place().fail(
             "unknown RAID level \"" + *word + "\" (known: " + listOf(raidLevels()) + ")", "raid");
+    }
     return level;
 }
 
 }  // namespace
 
 std::uint16_t readStatus(JsonReader& reader, std::uint16_t absent) {
-    if (reader.has("status") && reader.has("operationalStatus"))
+    if (reader.has("status") && reader.has("operationalStatus")) {
         reader.fail("\"status\" and \"operationalStatus\" are the same");
+    }
     const std::uint16_t status = reader.code("status", operationalStatusWords(), absent);
     return reader.code("operationalStatus", operationalStatusWords(), status);
 }
@@ -111,8 +116,9 @@ DriveDescription readDrive(const JsonPlace& place, const ControllerDescription& 
     drive.id = reader.text("id");
     drive.name = reader.text("name", drive.id);
     drive.interface = reader.text("interface", "SAS");
-    if (drive.interface != "SAS" && drive.interface != "SATA")
+    if (drive.interface != "SAS" && drive.interface != "SATA") {
         reader.fail("unknown interface \"" + drive.interface + "\" (known: SAS, SATA)");
+    }
     readDriveState(reader, drive);
     readDriveLocation(reader, controller, drive);
     drive.pools = readPools(reader, controller, drive.primordial);
@@ -120,8 +126,9 @@ DriveDescription readDrive(const JsonPlace& place, const ControllerDescription& 
     drive.blocks = readBlocks(reader, "capacity", 0);
     drive.consumableBlocks = readBlocks(reader, "consumable", drive.blocks);
     drive.spareFor = reader.text("spareFor", "");
-    if (const StateWord* before = reader.state("before", driveStates()))
+    if (const StateWord* before = reader.state("before", driveStates())) {
         drive.before = before->word;
+    }
     readTweaks(reader, drive, "CIM_DiskDrive",
                {{"extent", "CIM_StorageExtent"},
                 {"package", "CIM_PhysicalPackage"},

@@ -137,8 +137,9 @@ private:
     }
 
     bool open(json value) {
-        if (open_.size() == kDeepest)
+        if (open_.size() == kDeepest) {
             fail("nested deeper than " + std::to_string(kDeepest) + " levels");
+        }
         open_.push_back(&put(std::move(value)));
         arrived();
         return true;

@@ -123,8 +123,9 @@ std::vector<std::string> JsonReader::texts(const std::string& name) {
     if (!member) return {};
     if (!member->value->is_array()) return {readText(*member)};
     std::vector<std::string> result;
-    for (std::size_t i = 0; i < member->value->size(); ++i)
+    for (std::size_t i = 0; i < member->value->size(); ++i) {
         result.push_back(readText(member->element(i)));
+    }
     return result;
 }
 
@@ -133,8 +134,9 @@ std::uint16_t JsonReader::code(const std::string& name, CodeWords words, std::ui
     if (!member) return absent;
     const bool isWord = member->value->is_string();
     const std::string word = isWord ? member->value->get<std::string>() : "";
-    if (!isWord || isNumber(word))
+    if (!isWord || isNumber(word)) {
         return static_cast<std::uint16_t>(readNumber(*member, UINT16_MAX));
+    }
     const auto code = codeOf(words, word);
     if (!code) member->fail("unknown word \"" + word + "\" (known: " + listOf(words) + ")");
     return *code;
@@ -145,8 +147,9 @@ const StateWord* JsonReader::state(const std::string& name, StateWords states) {
     if (!member) return nullptr;
     const std::string word = readText(*member);
     const StateWord* state = findState(states, word);
-    if (!state)
+    if (!state) {
         place_.fail("unknown " + name + " \"" + word + "\" (known: " + listOf(states) + ")", name);
+    }
     return state;
 }
 
@@ -155,15 +158,18 @@ std::vector<JsonPlace> JsonReader::list(const std::string& name) {
     if (!member) return {};
     if (!member->value->is_array()) member->fail("a list is needed here");
     std::vector<JsonPlace> elements;
-    for (std::size_t i = 0; i < member->value->size(); ++i)
-        for (JsonPlace& element : repetitionsOf(member->element(i)))
+    for (std::size_t i = 0; i < member->value->size(); ++i) {
+        for (JsonPlace& element : repetitionsOf(member->element(i))) {
             elements.push_back(std::move(element));
+        }
+    }
     return elements;
 }
 
 void JsonReader::finish() const {
-    for (const auto& [name, value] : place_.value->items())
+    for (const auto& [name, value] : place_.value->items()) {
         if (!known_.contains(name)) place_.fail("unknown member \"" + name + "\"", name);
+    }
 }
 
 }  // namespace testbed

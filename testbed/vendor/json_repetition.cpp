@@ -17,16 +17,18 @@ bool isRepeated(const json& element) {
 
 void replaceNumber(std::string& text, const std::string& number) {
     static const std::string mark = "{n}";
-    for (std::size_t at = text.find(mark); at != std::string::npos; at = text.find(mark, at))
+    for (std::size_t at = text.find(mark); at != std::string::npos; at = text.find(mark, at)) {
         text.replace(at, mark.size(), number);
+    }
 }
 
 void replaceNumber(json& value, const std::string& number) {
     if (value.is_string()) {
         replaceNumber(value.get_ref<std::string&>(), number);
     } else if (value.is_structured()) {
-        for (json& child : value)
+        for (json& child : value) {
             if (!value.is_array() || !isRepeated(child)) replaceNumber(child, number);
+        }
     }
 }
 
@@ -34,15 +36,17 @@ void replaceNumber(json& value, const std::string& number) {
 std::uint64_t countElements(const JsonPlace& place) {
     const json& value = *place.value;
     std::uint64_t sum = 0;
-    if (value.is_object())
+    if (value.is_object()) {
         for (const auto& [name, child] : value.items()) sum += countElements(place.member(name));
-    if (value.is_array())
+    }
+    if (value.is_array()) {
         for (std::size_t i = 0; i < value.size(); ++i) {
             const JsonPlace element = place.element(i);
             const std::uint64_t times =
                 isRepeated(value[i]) ? readNumber(element.member("count"), kMostRepetitions) : 1;
             sum += times * (1 + countElements(element));
         }
+    }
     return std::min(sum, kMostElements + 1);
 }
 
@@ -69,17 +73,20 @@ std::vector<JsonPlace> repetitionsOf(const JsonPlace& element) {
 }
 
 void limitRepetitions(const JsonPlace& document) {
-    if (countElements(document) > kMostElements)
+    if (countElements(document) > kMostElements) {
         document.fail("more than " + std::to_string(kMostElements) + " elements with all counts");
+    }
 }
 
 void expandRepetitions(json& document) {
     if (!document.is_structured()) return;
     if (document.is_array()) {
         json expanded = json::array();
-        for (json& element : document)
-            for (JsonPlace& place : repetitionsOf({&element, "", ""}))
+        for (json& element : document) {
+            for (JsonPlace& place : repetitionsOf({&element, "", ""})) {
                 expanded.push_back(*place.value);
+            }
+        }
         document = std::move(expanded);
     }
     for (json& child : document) expandRepetitions(child);

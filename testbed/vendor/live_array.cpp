@@ -48,8 +48,9 @@ void LiveArray::adopt(json document) {
     Scenario next = scenarioOf(document, "command");
     const bool sameVendor = next.vendor.nameSpace == scenario_.vendor.nameSpace &&
                             next.vendor.classPrefix == scenario_.vendor.classPrefix;
-    if (!sameVendor || next.host.id != scenario_.host.id)
+    if (!sameVendor || next.host.id != scenario_.host.id) {
         throw ScenarioError(file_ + ": host and vendor cannot change while the array runs");
+    }
     changeVendor(broker_.repository(), scenario_, next);
     armFaults(document, next);
     broker_.faults().setLatency(next.latency.minimum, next.latency.maximum);
@@ -70,8 +71,9 @@ void LiveArray::begin(json document) {
     for (const auto& [fault, id] : old) broker_.faults().remove(id);
     begun_ = scenario_;
     schedule_.clear();
-    for (const TimedCommand& entry : scenario_.timeline)
+    for (const TimedCommand& entry : scenario_.timeline) {
         schedule_.add({now_ + entry.at, entry.command, ""});
+    }
 }
 
 void LiveArray::reload() {
@@ -126,9 +128,10 @@ double LiveArray::nextDue() const {
 void LiveArray::save(const std::string& file) const {
     json document = document_;
     document.erase("timeline");
-    for (const ScheduledCommand& entry : schedule_.commands())
+    for (const ScheduledCommand& entry : schedule_.commands()) {
         document["timeline"].push_back(
             {{"at", std::max(0.0, entry.at - now_)}, {"command", entry.command}});
+    }
     errno = 0;
     std::ofstream stream(file);
     stream << document.dump(2) << std::endl;

@@ -8,8 +8,9 @@ constexpr const char* kHostClass = "OMC_UnitaryComputerSystem";
 
 ObjectPath tweakedPath(ObjectPath path, const Tweaks& tweaks) {
     for (const auto& [name, value] : tweaks.keys) path.key(name, value);
-    for (const std::string& name : tweaks.omitKeys)
+    for (const std::string& name : tweaks.omitKeys) {
         std::erase_if(path.keys, [&](const NamedValue& key) { return sameName(key.first, name); });
+    }
     return path;
 }
 

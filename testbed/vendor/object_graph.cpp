@@ -54,8 +54,9 @@ void ObjectGraph::placeLink(Repository& repository, const GraphLink& link) const
 }
 
 void ObjectGraph::withdraw(Repository& repository) const {
-    for (const GraphLink& link : links_)
+    for (const GraphLink& link : links_) {
         repository.dissociate(vendorAssociation(link), link.left, link.right);
+    }
     for (const GraphObject& object : objects_) repository.remove(object.instance.path);
 }
 
@@ -72,8 +73,9 @@ void ObjectGraph::exchange(Repository& repository, const std::vector<ObjectGraph
     std::map<std::string, const Instance*> oldObjects;
     std::set<std::string> oldLinks, newObjects, newLinks;
     for (const ObjectGraph& graph : before) {
-        for (const GraphObject& object : graph.objects_)
+        for (const GraphObject& object : graph.objects_) {
             oldObjects[object.instance.path.identity()] = &object.instance;
+        }
         for (const GraphLink& link : graph.links_) oldLinks.insert(identityOf(link));
     }
     for (const ObjectGraph& graph : after) {
@@ -86,17 +88,24 @@ void ObjectGraph::exchange(Repository& repository, const std::vector<ObjectGraph
         }
     }
     // Links after all objects: an object that is listed exists.
-    for (const ObjectGraph& graph : after)
-        for (const GraphLink& link : graph.links_)
-            if (newLinks.insert(identityOf(link)).second && !oldLinks.contains(identityOf(link)))
+    for (const ObjectGraph& graph : after) {
+        for (const GraphLink& link : graph.links_) {
+            if (newLinks.insert(identityOf(link)).second && !oldLinks.contains(identityOf(link))) {
                 graph.placeLink(repository, link);
+            }
+        }
+    }
     for (const ObjectGraph& graph : before) {
-        for (const GraphLink& link : graph.links_)
-            if (!newLinks.contains(identityOf(link)))
+        for (const GraphLink& link : graph.links_) {
+            if (!newLinks.contains(identityOf(link))) {
                 repository.dissociate(graph.vendorAssociation(link), link.left, link.right);
-        for (const GraphObject& object : graph.objects_)
-            if (!newObjects.contains(object.instance.path.identity()))
+            }
+        }
+        for (const GraphObject& object : graph.objects_) {
+            if (!newObjects.contains(object.instance.path.identity())) {
                 repository.remove(object.instance.path);
+            }
+        }
     }
 }
 

@@ -26,8 +26,9 @@ ObjectGraph profileGraph(const Naming& naming, const ProfileDescription& profile
               profile.tweaks);
     for (const ControllerDescription& controller : controllers) {
         const auto& chosen = profile.controllers;
-        if (chosen && std::find(chosen->begin(), chosen->end(), controller.id) == chosen->end())
+        if (chosen && std::find(chosen->begin(), chosen->end(), controller.id) == chosen->end()) {
             continue;
+        }
         graph.link("CIM_ElementConformsToProfile", path, naming.portController(controller));
     }
     return graph;

@@ -12,8 +12,9 @@ using nlohmann::json;
 const json* elementOf(const json& owner, const char* list, const std::string& id) {
     const auto elements = owner.find(list);
     if (elements == owner.end() || !elements->is_array()) return nullptr;
-    for (const json& element : *elements)
+    for (const json& element : *elements) {
         if (idOf(element) == id) return &element;
+    }
     return nullptr;
 }
 
@@ -29,16 +30,19 @@ std::string valueText(const json& value) {
 /// Members that tell how the old drive was.
 bool isOfTheOldDrive(const std::string& name, const json& value) {
     for (const char* number : {"status", "operationalStatus", "extentStatus", "enabledState",
-                               "primordial", "spareFor", "before"})
+                               "primordial", "spareFor", "before"}) {
         if (name == number) return true;
+    }
     return name == "state" && value != "hot spare" && value != "unconfigured good";
 }
 
 std::string insertCommand(const std::string& controller, const json& drive) {
     std::string command = "add drive " + quotedWord(controller) + " id=" + valueText(idOf(drive));
-    for (const auto& [name, value] : drive.items())
-        if (name != "id" && !isOfTheOldDrive(name, value))
+    for (const auto& [name, value] : drive.items()) {
+        if (name != "id" && !isOfTheOldDrive(name, value)) {
             command += " " + name + "=" + valueText(value);
+        }
+    }
     return command;
 }
 
@@ -50,9 +54,11 @@ std::vector<PulledDrive> pulledDrives(const json& original, const json& document
         const std::string id = idOf(controller);
         const json* now = elementOf(document, "controllers", id);
         if (!now) continue;
-        for (const json& drive : controller.value("drives", json::array()))
-            if (!elementOf(*now, "drives", idOf(drive)))
+        for (const json& drive : controller.value("drives", json::array())) {
+            if (!elementOf(*now, "drives", idOf(drive))) {
                 pulled.push_back({id, idOf(drive), insertCommand(id, drive)});
+            }
+        }
     }
     return pulled;
 }

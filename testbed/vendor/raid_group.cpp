@@ -48,18 +48,21 @@ std::vector<std::string> groupPlaces(const ControllerDescription& controller,
                                      const PoolDescription& pool) {
     if (!pool.members.empty()) return pool.members;
     std::vector<std::string> places;
-    for (const DriveDescription& drive : controller.drives)
-        if (holds(drive.pools, pool.id) && conditionOf(drive) != Filling)
+    for (const DriveDescription& drive : controller.drives) {
+        if (holds(drive.pools, pool.id) && conditionOf(drive) != Filling) {
             places.push_back(drive.id);
+        }
+    }
     for (const DriveDescription& drive : controller.drives) {
         if (!holds(drive.pools, pool.id) || conditionOf(drive) != Filling) continue;
         const auto lost = std::find_if(places.begin(), places.end(), [&](const std::string& id) {
             return conditionOf(*findById(controller.drives, id)) == Lost;
         });
-        if (lost == places.end())
+        if (lost == places.end()) {
             places.push_back(drive.id);
-        else
+        } else {
             *lost = drive.id;
+        }
     }
     return places;
 }
@@ -81,10 +84,12 @@ const char* volumeStateOver(const VolumeDescription& volume,
                             const std::vector<DriveCondition>& places) {
     const Tolerance tolerance = toleranceOf(volume, places.size());
     std::vector<std::size_t> missing(tolerance.spans);
-    for (std::size_t i = 0; i < places.size(); ++i)
+    for (std::size_t i = 0; i < places.size(); ++i) {
         if (places[i] != Sound) ++missing[i * tolerance.spans / places.size()];
-    for (const std::size_t count : missing)
+    }
+    for (const std::size_t count : missing) {
         if (count > tolerance.losses) return "offline";
+    }
     if (std::count(places.begin(), places.end(), Lost) > 0) return "degraded";
     return std::count(places.begin(), places.end(), Filling) > 0 ? "rebuilding" : "optimal";
 }

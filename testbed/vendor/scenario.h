@@ -193,8 +193,9 @@ struct Scenario {
 /// The element with that id, NULL without one.
 template <typename Description>
 const Description* findById(const std::vector<Description>& list, const std::string& id) {
-    for (const Description& item : list)
+    for (const Description& item : list) {
         if (item.id == id) return &item;
+    }
     return nullptr;
 }
 

@@ -70,8 +70,9 @@ std::vector<ControllerDescription> readControllers(JsonReader& scenario) {
     for (const JsonPlace& place : scenario.list("controllers")) {
         controllers.push_back(readController(place));
         const ControllerDescription& latest = controllers.back();
-        if (findById(controllers, latest.id) != &latest)
+        if (findById(controllers, latest.id) != &latest) {
             place.fail("second controller \"" + latest.id + "\"");
+        }
     }
     return controllers;
 }
@@ -85,8 +86,9 @@ ProfileDescription readProfile(const JsonPlace& place, const Scenario& scenario,
     profile.version = reader.text("version", "1.0.0");
     profile.organization = reader.number16("organization", 11);
     if (reader.has("controllers")) profile.controllers = reader.texts("controllers");
-    for (const std::string& id : profile.controllers.value_or(std::vector<std::string>{}))
+    for (const std::string& id : profile.controllers.value_or(std::vector<std::string>{})) {
         if (!scenario.findController(id)) reader.fail("no controller \"" + id + "\"");
+    }
     readTweaks(reader, profile, "CIM_RegisteredProfile");
     reader.finish();
     return profile;
@@ -113,16 +115,18 @@ std::vector<ProfileDescription> usualProfiles() {
 std::vector<ProfileDescription> readProfiles(JsonReader& reader, const Scenario& scenario) {
     if (!reader.has("profiles")) return usualProfiles();
     std::vector<ProfileDescription> profiles;
-    for (const JsonPlace& place : reader.list("profiles"))
+    for (const JsonPlace& place : reader.list("profiles")) {
         profiles.push_back(readProfile(place, scenario, profiles.size()));
+    }
     return profiles;
 }
 
 LatencyRange readLatency(JsonReader& scenario) {
     const auto place = scenario.take("latencyMs");
     if (!place) return {};
-    if (!place->value->is_array() || place->value->size() != 2)
+    if (!place->value->is_array() || place->value->size() != 2) {
         place->fail("a list of two numbers is needed here");
+    }
     const std::uint64_t minimum = readNumber(place->element(0), INT32_MAX);
     const std::uint64_t maximum = readNumber(place->element(1), INT32_MAX);
     if (minimum > maximum) place->fail("the second number must not be below the first");
@@ -138,8 +142,9 @@ void readManagerMembers(JsonReader reader, BrokerOptions& options) {
     options.name = reader.text("name", options.name);
     options.allProperties = reader.flag("allProperties");
     options.strictProperties = reader.flag("strictProperties", true);
-    if (const auto seed = reader.number("orderSeed", UINT32_MAX))
+    if (const auto seed = reader.number("orderSeed", UINT32_MAX)) {
         options.orderSeed = static_cast<std::uint32_t>(*seed);
+    }
     if (reader.has("staticNamespaces")) options.staticNamespaces = reader.texts("staticNamespaces");
     reader.finish();
 }
@@ -172,11 +177,13 @@ Scenario readDocument(const JsonPlace& place) {
     scenario.vendor = readVendor(reader);
     scenario.controllers = readControllers(reader);
     scenario.profiles = readProfiles(reader, scenario);
-    for (const JsonPlace& fault : reader.list("faults"))
+    for (const JsonPlace& fault : reader.list("faults")) {
         scenario.faults.push_back(readFault(fault));
+    }
     scenario.latency = readLatency(reader);
-    if (const auto seed = reader.number("shuffle", UINT32_MAX))
+    if (const auto seed = reader.number("shuffle", UINT32_MAX)) {
         scenario.shuffle = static_cast<std::uint32_t>(*seed);
+    }
     scenario.manager = readManager(reader);
     scenario.consequences = readConsequences(reader);
     scenario.timeline = readTimeline(reader);

@@ -8,9 +8,11 @@ namespace {
 std::vector<ObjectPath> poolPaths(const Naming& naming, const ControllerDescription& controller,
                                   const std::vector<std::string>& ids) {
     std::vector<ObjectPath> paths;
-    for (const std::string& id : ids)
-        if (const PoolDescription* pool = findById(controller.pools, id))
+    for (const std::string& id : ids) {
+        if (const PoolDescription* pool = findById(controller.pools, id)) {
             paths.push_back(naming.pool(controller, *pool));
+        }
+    }
     return paths;
 }
 
@@ -25,8 +27,9 @@ void addExtent(ObjectGraph& graph, const Naming& naming, const ControllerDescrip
                {"ExtentStatus", CimValue::uint16Array({drive.extentStatus})}},
               drive.part("extent"));
     graph.link("CIM_MediaPresent", naming.drive(controller, drive), path);
-    for (const ObjectPath& pool : poolPaths(naming, controller, drive.pools))
+    for (const ObjectPath& pool : poolPaths(naming, controller, drive.pools)) {
         graph.link("CIM_ConcreteComponent", pool, path);
+    }
 }
 
 void addFirmware(ObjectGraph& graph, const Naming& naming, const ControllerDescription& controller,
@@ -45,8 +48,9 @@ void addSlot(ObjectGraph& graph, const Naming& naming, const ControllerDescripti
     graph.add("CIM_Slot", slot, {{"Number", CimValue::uint16(*drive.slot)}},
               drive.part("slotObject"));
     graph.link("CIM_PackageInConnector", slot, naming.drivePackage(controller, drive));
-    if (const EnclosureDescription* enclosure = findById(controller.enclosures, drive.enclosure))
+    if (const EnclosureDescription* enclosure = findById(controller.enclosures, drive.enclosure)) {
         graph.link("CIM_Container", naming.enclosure(controller, *enclosure), slot);
+    }
 }
 
 void addPackage(ObjectGraph& graph, const Naming& naming, const ControllerDescription& controller,
@@ -123,8 +127,9 @@ ObjectGraph volumeGraph(const Naming& naming, const ControllerDescription& contr
                   volume.part("setting"));
         graph.link("CIM_ElementSettingData", path, setting);
     }
-    for (const ObjectPath& pool : poolPaths(naming, controller, volume.pools))
+    for (const ObjectPath& pool : poolPaths(naming, controller, volume.pools)) {
         graph.link("CIM_AllocatedFromStoragePool", pool, path);
+    }
     graph.link("CIM_SystemDevice", naming.system(controller), path);
     return graph;
 }

@@ -10,16 +10,18 @@ namespace {
 constexpr std::uint64_t kLongestSeconds = 100'000'000;
 
 void readSeconds(JsonReader& reader, const char* name, std::uint32_t& seconds) {
-    if (const auto number = reader.number(name, kLongestSeconds))
+    if (const auto number = reader.number(name, kLongestSeconds)) {
         seconds = static_cast<std::uint32_t>(*number);
+    }
 }
 
 /// Seconds, with a fraction if need be.
 double readTime(const JsonPlace& place) {
     const double seconds = place.value->is_number() ? place.value->get<double>() : -1;
-    if (seconds < 0 || seconds > kLongestSeconds)
+    if (seconds < 0 || seconds > kLongestSeconds) {
         place.fail("a number of seconds from 0 to " + std::to_string(kLongestSeconds) +
                    " is needed here");
+    }
     return seconds;
 }
 
@@ -59,8 +61,9 @@ Consequences readConsequences(JsonReader& scenario) {
 
 std::vector<TimedCommand> readTimeline(JsonReader& scenario) {
     std::vector<TimedCommand> timeline;
-    for (const JsonPlace& place : scenario.list("timeline"))
+    for (const JsonPlace& place : scenario.list("timeline")) {
         timeline.push_back(readTimedCommand(place));
+    }
     std::stable_sort(
         timeline.begin(), timeline.end(),
         [](const TimedCommand& left, const TimedCommand& right) { return left.at < right.at; });

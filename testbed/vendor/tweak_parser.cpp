@@ -19,8 +19,9 @@ CMPIType guessType(const json& value) {
     if (value.is_number_unsigned()) return CMPI_uint64;
     if (value.is_number_integer()) return CMPI_sint64;
     if (value.is_number()) return CMPI_real64;
-    if (value.is_array() && !value.empty())
+    if (value.is_array() && !value.empty()) {
         return static_cast<CMPIType>(guessType(value.front()) | CMPI_ARRAY);
+    }
     return value.is_array() ? CMPI_stringA : CMPI_string;
 }
 
@@ -75,8 +76,9 @@ CimValue typedValue(const JsonPlace& place, CMPIType type) {
     if ((type & CMPI_ARRAY) == 0) return scalarValue(place, type);
     if (!place.value->is_array()) place.fail("a list is needed here, or an explicit type");
     std::vector<CimValue> elements;
-    for (std::size_t i = 0; i < place.value->size(); ++i)
+    for (std::size_t i = 0; i < place.value->size(); ++i) {
         elements.push_back(scalarValue(place.element(i), elementType(type)));
+    }
     return CimValue::array(elementType(type), std::move(elements));
 }
 
@@ -104,8 +106,9 @@ std::vector<NamedValue> readValues(JsonReader& reader, const char* member, const
     if (!place) return {};
     const JsonReader checked(*place);
     std::vector<NamedValue> values;
-    for (const auto& [name, value] : place->value->items())
+    for (const auto& [name, value] : place->value->items()) {
         values.emplace_back(name, readValue(place->member(name), cimClass, name));
+    }
     return values;
 }
 

@@ -28,10 +28,12 @@ std::vector<ObjectGraph> graphsOf(const Naming& naming, const ControllerDescript
 /// Everything that the scenario describes but the host.
 std::vector<ObjectGraph> allGraphs(const Naming& naming, const Scenario& scenario) {
     std::vector<ObjectGraph> graphs;
-    for (const ControllerDescription& controller : scenario.controllers)
+    for (const ControllerDescription& controller : scenario.controllers) {
         for (ObjectGraph& graph : graphsOf(naming, controller)) graphs.push_back(std::move(graph));
-    for (const ProfileDescription& profile : scenario.profiles)
+    }
+    for (const ProfileDescription& profile : scenario.profiles) {
         graphs.push_back(profileGraph(naming, profile, scenario.controllers));
+    }
     return graphs;
 }
 
@@ -40,8 +42,9 @@ std::vector<ObjectGraph> allGraphs(const Naming& naming, const Scenario& scenari
 void defineVendorClasses(Repository& repository, const Scenario& scenario) {
     // An association between two namespaces is known in both.
     for (const std::string& nameSpace :
-         {std::string(kProfileNamespace), scenario.vendor.nameSpace, std::string(kHostNamespace)})
+         {std::string(kProfileNamespace), scenario.vendor.nameSpace, std::string(kHostNamespace)}) {
         defineClasses(repository, nameSpace, scenario.vendor.classPrefix);
+    }
     defineClassBelow(repository, kHostNamespace, "OMC_UnitaryComputerSystem", "CIM_ComputerSystem");
 }
 
@@ -59,10 +62,12 @@ void buildVendor(Repository& repository, const Scenario& scenario) {
     defineVendorClasses(repository, scenario);
     const Naming naming(scenario.vendor, scenario.host);
     hostGraph(naming, scenario.host).place(repository);
-    for (const ControllerDescription& controller : scenario.controllers)
+    for (const ControllerDescription& controller : scenario.controllers) {
         placeController(repository, naming, controller);
-    for (const ProfileDescription& profile : scenario.profiles)
+    }
+    for (const ProfileDescription& profile : scenario.profiles) {
         profileGraph(naming, profile, scenario.controllers).place(repository);
+    }
     if (scenario.shuffle) repository.shuffleResults(*scenario.shuffle);
 }
 
