@@ -17,8 +17,9 @@ bool isPublic(const std::string& address) {
 std::optional<Credentials> accessOf(const AccessOptions& options) {
     if (options.isUserGiven) {
         if (options.user.empty()) throw std::runtime_error("--user has no name");
-        if (options.user.find(':') != std::string::npos)
+        if (options.user.find(':') != std::string::npos) {
             throw std::runtime_error("--user: a name with a colon cannot be sent");
+        }
         return Credentials{options.user, readPassword(options.passwordFile)};
     }
     if (!isPublic(options.address) || options.insecurePublic) return std::nullopt;

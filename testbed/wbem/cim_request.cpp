@@ -20,8 +20,9 @@ constexpr const char* kNotValid = "request-not-loosely-valid";
 
 /// The version's major number must be the one that is served.
 void requireVersion(const std::string& version, const char* major, const char* cimError) {
-    if (!version.starts_with(std::string(major) + "."))
+    if (!version.starts_with(std::string(major) + ".")) {
         refuse(cimError, "version \"" + version + "\"", 501);
+    }
 }
 
 int hexDigit(char digit) {
@@ -58,8 +59,9 @@ std::string parameterOf(const std::string& header, const std::string& name) {
     std::istringstream parts(header.substr(std::min(header.find(';'), header.size())));
     for (std::string part; std::getline(parts, part, ';');) {
         const std::size_t equals = part.find('=');
-        if (equals != std::string::npos && sameName(trimmed(part.substr(0, equals)), name))
+        if (equals != std::string::npos && sameName(trimmed(part.substr(0, equals)), name)) {
             return trimmed(part.substr(equals + 1));
+        }
     }
     return {};
 }
@@ -67,28 +69,33 @@ std::string parameterOf(const std::string& header, const std::string& name) {
 void checkContent(const HttpRequest& request) {
     const std::string* type = request.header("Content-Type");
     const std::string media = type ? trimmed(type->substr(0, type->find(';'))) : "";
-    if (!sameName(media, "text/xml") && !sameName(media, "application/xml"))
+    if (!sameName(media, "text/xml") && !sameName(media, "application/xml")) {
         throw MessageError(415, "", "Content-Type is not XML");
+    }
     const std::string charset = parameterOf(*type, "charset");
-    if (!charset.empty() && !sameName(charset, "utf-8"))
+    if (!charset.empty() && !sameName(charset, "utf-8")) {
         throw MessageError(415, "", "the charset is not UTF-8");
+    }
     const std::string* coding = request.header("Content-Encoding");
-    if (coding && !sameName(trimmed(*coding), "identity"))
+    if (coding && !sameName(trimmed(*coding), "identity")) {
         throw MessageError(415, "", "no Content-Encoding is understood");
+    }
 }
 
 void checkHttpHeaders(const HttpRequest& request) {
     const std::string* operation = request.header("CIMOperation");
-    if (operation == nullptr || !sameName(*operation, "MethodCall"))
+    if (operation == nullptr || !sameName(*operation, "MethodCall")) {
         refuse("unsupported-operation", "CIMOperation is not MethodCall");
+    }
     const std::string* version = request.header("CIMProtocolVersion");
     if (version != nullptr) requireVersion(*version, "1", "unsupported-protocol-version");
     checkContent(request);
     const auto hosts =
         std::count_if(request.headers.begin(), request.headers.end(),
                       [](const auto& field) { return sameName(field.first, "Host"); });
-    if (hosts > 1 || (hosts == 0 && request.version >= 11))
+    if (hosts > 1 || (hosts == 0 && request.version >= 11)) {
         throw MessageError(400, "", "not exactly one Host");
+    }
 }
 
 [[noreturn]] void refuseParameter(const char* name, const std::string& why) {
@@ -131,8 +138,9 @@ void CimRequest::readMessage(const HttpRequest& request) {
     messageId_ = requiredAttribute(message, "ID");
     requireVersion(requiredAttribute(message, "PROTOCOLVERSION"), "1",
                    "unsupported-protocol-version");
-    if (message.child("MULTIREQ"))
+    if (message.child("MULTIREQ")) {
         refuse("multiple-requests-unsupported", "one request in a message is served", 501);
+    }
     readCall(requiredChild(message, "SIMPLEREQ"));
     compareHeaders(request);
 }
@@ -143,8 +151,9 @@ void CimRequest::readCall(pugi::xml_node simpleRequest) {
     if (isExtrinsic_) {
         call_ = requiredChild(simpleRequest, "METHODCALL");
         const pugi::xml_node path = firstElement(call_);
-        if (!isElement(path, "LOCALCLASSPATH") && !isElement(path, "LOCALINSTANCEPATH"))
+        if (!isElement(path, "LOCALCLASSPATH") && !isElement(path, "LOCALINSTANCEPATH")) {
             throw CimXmlError("METHODCALL: no object path");
+        }
         nameSpace_ = readNamespace(requiredChild(path, "LOCALNAMESPACEPATH"));
     } else {
         nameSpace_ = readNamespace(requiredChild(call_, "LOCALNAMESPACEPATH"));
@@ -154,14 +163,16 @@ void CimRequest::readCall(pugi::xml_node simpleRequest) {
 
 void CimRequest::compareHeaders(const HttpRequest& request) const {
     const std::string* method = request.header("CIMMethod");
-    if (method == nullptr || !sameName(unescaped(*method), method_))
+    if (method == nullptr || !sameName(unescaped(*method), method_)) {
         refuse("header-mismatch", "CIMMethod does not name the method in the message");
+    }
     const std::string* object = request.header("CIMObject");
     // Of a method of an object the whole object path is said; its namespace is enough here.
     const std::string path = object ? unescaped(*object) : "";
     const std::string named = isExtrinsic_ ? path.substr(0, path.find(':')) : path;
-    if (!sameName(named, nameSpace_))
+    if (!sameName(named, nameSpace_)) {
         refuse("header-mismatch", "CIMObject does not name the object in the message");
+    }
 }
 
 void CimRequest::allowParameters(const std::vector<const char*>& names) const {
@@ -169,15 +180,17 @@ void CimRequest::allowParameters(const std::vector<const char*>& names) const {
     for (const pugi::xml_node parameter : call_.children("IPARAMVALUE")) {
         const char* name = parameter.attribute("NAME").value();
         if (std::none_of(names.begin(), names.end(),
-                         [&](const char* known) { return sameName(known, name); }))
+                         [&](const char* known) { return sameName(known, name); })) {
             refuseParameter(name, "is no parameter of " + method_);
+        }
         if (!seen.insert(foldName(name)).second) refuseParameter(name, "comes twice");
     }
 }
 
 pugi::xml_node CimRequest::value(const char* name) const {
-    for (const pugi::xml_node parameter : call_.children("IPARAMVALUE"))
+    for (const pugi::xml_node parameter : call_.children("IPARAMVALUE")) {
         if (sameName(parameter.attribute("NAME").value(), name)) return firstElement(parameter);
+    }
     return {};
 }
 

@@ -23,17 +23,20 @@ bool isBlank(std::string_view text) {
 /// The only element in `node`; there may be no text beside it.
 pugi::xml_node onlyChild(pugi::xml_node node, const char* name) {
     const pugi::xml_node child = requiredChild(node, name);
-    for (const pugi::xml_node other : node.children())
-        if (other != child && (other.type() == pugi::node_element || !isBlank(other.value())))
+    for (const pugi::xml_node other : node.children()) {
+        if (other != child && (other.type() == pugi::node_element || !isBlank(other.value()))) {
             throw CimXmlError(named(node) + ": more than one " + name);
+        }
+    }
     return child;
 }
 
 void requireAttribute(pugi::xml_node node, const char* name, const std::string& wanted) {
     const std::string value = requiredAttribute(node, name);
-    if (!sameName(value, wanted))
+    if (!sameName(value, wanted)) {
         throw CimXmlError(named(node) + ": its " + name + " is \"" + xmlText(value) +
                           "\", not that of the request");
+    }
 }
 
 pugi::xml_node methodResponse(const pugi::xml_document& document, const AskedOperation& asked) {
@@ -54,8 +57,9 @@ void setStatus(unsigned code, Response& response) {
 
 void readError(pugi::xml_node error, Response& response) {
     setStatus(error.attribute("CODE").as_uint(), response);
-    if (const pugi::xml_attribute text = error.attribute("DESCRIPTION"))
+    if (const pugi::xml_attribute text = error.attribute("DESCRIPTION")) {
         response.message = text.value();
+    }
 }
 
 bool isPath(std::string_view name) {
@@ -65,22 +69,25 @@ bool isPath(std::string_view name) {
 
 void readElement(pugi::xml_node node, const AskedOperation& asked, Response& response) {
     const std::string_view name = node.name();
-    if (isPath(name) != asked.namesOnly)
+    if (isPath(name) != asked.namesOnly) {
         throw CimXmlError("IRETURNVALUE: a " + named(node) + ", which was not asked for");
-    if (!isPath(name))
+    }
+    if (!isPath(name)) {
         response.instances.push_back(readNamedInstance(node, asked.nameSpace));
-    else if (name == "OBJECTPATH")
+    } else if (name == "OBJECTPATH") {
         response.paths.push_back(readReference(node, asked.nameSpace));
-    else
+    } else {
         response.paths.push_back(readObjectPath(node, asked.nameSpace));
+    }
 }
 
 void readReturnValue(pugi::xml_node value, const AskedOperation& asked, Response& response) {
     for (const pugi::xml_node node : value.children()) {
-        if (node.type() == pugi::node_element)
+        if (node.type() == pugi::node_element) {
             readElement(node, asked, response);
-        else if (!isBlank(node.value()))
+        } else if (!isBlank(node.value())) {
             throw CimXmlError("IRETURNVALUE: a text instead of elements");
+        }
     }
 }
 

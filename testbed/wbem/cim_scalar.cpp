@@ -94,8 +94,9 @@ CimValue integer(std::string_view text, const TypeName& type) {
         const std::uint64_t bits = number->negative ? 0 - number->magnitude : number->magnitude;
         return CimValue::signedInteger(type.type, static_cast<std::int64_t>(bits));
     }
-    if (number->magnitude > type.largest || (number->negative && number->magnitude != 0))
+    if (number->magnitude > type.largest || (number->negative && number->magnitude != 0)) {
         refuse(text, type.type);
+    }
     return CimValue::unsignedInteger(type.type, number->magnitude);
 }
 
@@ -119,8 +120,9 @@ std::string realText(Real value) {
     std::array<char, 64> buffer{};
     const auto [end, error] = std::to_chars(buffer.data(), buffer.data() + buffer.size(), value);
     std::string text(buffer.data(), end);
-    if (text.find('.') == std::string::npos)
+    if (text.find('.') == std::string::npos) {
         text.insert(std::min(text.find('e'), text.size()), ".0");
+    }
     return text;
 }
 
@@ -132,18 +134,21 @@ std::string xmlTypeName(CMPIType type) {
 }
 
 std::optional<CMPIType> xmlTypeByName(std::string_view name) {
-    for (const TypeName& type : kTypes)
+    for (const TypeName& type : kTypes) {
         if (sameName(type.name, name)) return type.type;
+    }
     return std::nullopt;
 }
 
 std::string scalarText(const CimValue& value) {
     if (const auto* flag = std::get_if<bool>(&value.data)) return *flag ? "TRUE" : "FALSE";
-    if (const auto* real = std::get_if<double>(&value.data))
+    if (const auto* real = std::get_if<double>(&value.data)) {
         return value.type == CMPI_real32 ? realText(static_cast<float>(*real)) : realText(*real);
+    }
     const auto* number = std::get_if<std::uint64_t>(&value.data);
-    if (number && value.type == CMPI_char16)
+    if (number && value.type == CMPI_char16) {
         return xmlText(utf8Character(static_cast<char32_t>(*number)));
+    }
     return xmlText(value.text());
 }
 

@@ -10,8 +10,9 @@ namespace {
 
 /// Header values are one line of printable ASCII.
 std::string headerText(std::string text) {
-    for (char& c : text)
+    for (char& c : text) {
         if (c < 0x20 || c > 0x7e) c = '?';
+    }
     return text;
 }
 
@@ -53,8 +54,9 @@ HttpOutcome CimServer::answer(const HttpRequest& request) const {
     if (request.method == "M-POST") return HttpResponse{501, {}, {}};
     if (request.method != "POST") return HttpResponse{405, {{"Allow", "POST"}}, {}};
     const std::string* authorization = request.header("Authorization");
-    if (credentials_ && (!authorization || !isAuthorized(*authorization, *credentials_)))
+    if (credentials_ && (!authorization || !isAuthorized(*authorization, *credentials_))) {
         return HttpResponse{401, {{"WWW-Authenticate", "Basic realm=\"plexor-testbed\""}}, {}};
+    }
     try {
         return answerCall(request);
     } catch (const MessageError& error) {
@@ -81,8 +83,9 @@ HttpResponse CimServer::answerTo(const CimRequest& call, const std::string& host
     pugi::xml_document document;
     pugi::xml_node response = openResponse(document, call);
     try {
-        if (fault && fault->cimStatus)
+        if (fault && fault->cimStatus) {
             throw providerStatus(static_cast<CMPIrc>(*fault->cimStatus), fault->message);
+        }
         carryOut(call, host, response.append_child("IRETURNVALUE"));
     } catch (const CimStatus& status) {
         response.remove_child("IRETURNVALUE");
@@ -100,8 +103,9 @@ HttpResponse CimServer::answerTo(const CimRequest& call, const std::string& host
 void CimServer::carryOut(const CimRequest& request, const std::string& host,
                          pugi::xml_node result) const {
     const Operation* operation = request.isExtrinsic() ? nullptr : findOperation(request.method());
-    if (operation == nullptr)
+    if (operation == nullptr) {
         throw CimStatus(CMPI_RC_ERR_NOT_SUPPORTED, request.method() + " is not served");
+    }
     manager_.requireNamespace(request.nameSpace());
     request.allowParameters(operation->parameters);
     operation->run({manager_, host}, request, result);

@@ -31,20 +31,22 @@ CMPIType declaredType(pugi::xml_node node) {
 CimValue readArray(pugi::xml_node node, CMPIType type) {
     std::vector<CimValue> elements;
     for (const pugi::xml_node child : node.children()) {
-        if (isElement(child, "VALUE"))
+        if (isElement(child, "VALUE")) {
             elements.push_back(scalarFromText(elementText(child), type));
-        else if (isElement(child, "VALUE.NULL"))
+        } else if (isElement(child, "VALUE.NULL")) {
             elements.push_back(CimValue::null(type));
-        else if (isElement(child, "VALUE.REFERENCE"))
+        } else if (isElement(child, "VALUE.REFERENCE")) {
             elements.push_back(CimValue::reference(readReference(child, "")));
+        }
     }
     return CimValue::array(type, std::move(elements));
 }
 
 CimValue readKeyValue(pugi::xml_node node) {
     const std::string text = elementText(node);
-    if (const pugi::xml_attribute type = node.attribute("TYPE"))
+    if (const pugi::xml_attribute type = node.attribute("TYPE")) {
         if (const auto known = xmlTypeByName(type.value())) return scalarFromText(text, *known);
+    }
     const std::string_view kind = node.attribute("VALUETYPE").as_string("string");
     if (sameName(kind, "boolean")) return scalarFromText(text, CMPI_boolean);
     if (sameName(kind, "numeric")) return numberFromText(text);
@@ -75,21 +77,26 @@ void parseXml(const std::string& text, pugi::xml_document& document) {
     constexpr unsigned kFlags = pugi::parse_default | pugi::parse_ws_pcdata;
     // The parser would take the end of a text for the end of the document.
     if (text.find('\0') != std::string::npos) throw CimXmlError("a NUL character in the message");
-    for (const char mark : {'<', '='})
-        if (std::count(text.begin(), text.end(), mark) > kMostMarks)
+    for (const char mark : {'<', '='}) {
+        if (std::count(text.begin(), text.end(), mark) > kMostMarks) {
             throw CimXmlError("more than " + std::to_string(kMostMarks) + " characters " + mark);
+        }
+    }
     const pugi::xml_parse_result result =
         document.load_buffer(text.data(), text.size(), kFlags, pugi::encoding_utf8);
-    if (!result)
+    if (!result) {
         throw CimXmlError(std::string(result.description()) + " at byte " +
                           std::to_string(result.offset));
+    }
     const auto isRoot = [](pugi::xml_node node) { return node.type() == pugi::node_element; };
-    if (std::count_if(document.begin(), document.end(), isRoot) != 1)
+    if (std::count_if(document.begin(), document.end(), isRoot) != 1) {
         throw CimXmlError("more than one element at the top");
+    }
     DepthLimit limit;
-    if (!document.traverse(limit))
+    if (!document.traverse(limit)) {
         throw CimXmlError("elements nested more than " + std::to_string(kDeepestNesting) +
                           " levels deep");
+    }
 }
 
 bool isElement(pugi::xml_node node, const char* name) {
@@ -102,9 +109,11 @@ pugi::xml_node firstElement(pugi::xml_node node) {
 
 std::string elementText(pugi::xml_node node) {
     std::string text;
-    for (const pugi::xml_node child : node.children())
-        if (child.type() == pugi::node_pcdata || child.type() == pugi::node_cdata)
+    for (const pugi::xml_node child : node.children()) {
+        if (child.type() == pugi::node_pcdata || child.type() == pugi::node_cdata) {
             text += child.value();
+        }
+    }
     return text;
 }
 
@@ -121,8 +130,9 @@ std::string requiredAttribute(pugi::xml_node node, const char* name) {
 }
 
 CimValue readValueIn(pugi::xml_node parent, CMPIType type, bool isArray) {
-    if (const pugi::xml_node reference = parent.child("VALUE.REFERENCE"))
+    if (const pugi::xml_node reference = parent.child("VALUE.REFERENCE")) {
         return CimValue::reference(readReference(reference, ""));
+    }
     pugi::xml_node array = parent.child("VALUE.ARRAY");
     if (!array) array = parent.child("VALUE.REFARRAY");
     if (array) return readArray(array, type);
@@ -143,8 +153,9 @@ NamedValue readProperty(pugi::xml_node node) {
 }
 
 std::string readNamespace(pugi::xml_node node) {
-    if (isElement(node, "NAMESPACEPATH"))
+    if (isElement(node, "NAMESPACEPATH")) {
         return readNamespace(requiredChild(node, "LOCALNAMESPACEPATH"));
+    }
     std::string nameSpace;
     for (const pugi::xml_node part : node.children("NAMESPACE")) {
         if (!nameSpace.empty()) nameSpace += '/';
@@ -168,13 +179,15 @@ ObjectPath readInstanceName(pugi::xml_node node, const std::string& nameSpace) {
 ObjectPath readObjectPath(pugi::xml_node node, const std::string& nameSpace) {
     if (isElement(node, "INSTANCENAME")) return readInstanceName(node, nameSpace);
     if (isElement(node, "CLASSNAME")) return {nameSpace, requiredAttribute(node, "NAME"), {}};
-    if (isElement(node, "INSTANCEPATH") || isElement(node, "LOCALINSTANCEPATH"))
+    if (isElement(node, "INSTANCEPATH") || isElement(node, "LOCALINSTANCEPATH")) {
         return readInstanceName(requiredChild(node, "INSTANCENAME"),
                                 readNamespace(namespacePathIn(node)));
-    if (isElement(node, "CLASSPATH") || isElement(node, "LOCALCLASSPATH"))
+    }
+    if (isElement(node, "CLASSPATH") || isElement(node, "LOCALCLASSPATH")) {
         return {readNamespace(namespacePathIn(node)),
                 requiredAttribute(requiredChild(node, "CLASSNAME"), "NAME"),
                 {}};
+    }
     refuse(node, "is no object path");
 }
 
@@ -200,9 +213,10 @@ Instance readNamedInstance(pugi::xml_node node, const std::string& nameSpace) {
     for (const pugi::xml_node child : node.children()) {
         if (child.type() != pugi::node_element || isElement(child, "INSTANCE")) continue;
         ObjectPath path = readObjectPath(child, nameSpace);
-        if (!sameName(path.className, instance.path.className))
+        if (!sameName(path.className, instance.path.className)) {
             refuse(node, "an instance of " + xmlText(instance.path.className) +
                              " with the name of one of " + xmlText(path.className));
+        }
         instance.path = std::move(path);
         break;
     }

@@ -38,10 +38,11 @@ void writeReference(pugi::xml_node parent, const ObjectPath& path, KeyTypes type
 void writeArray(pugi::xml_node parent, const Elements& elements) {
     pugi::xml_node array = parent.append_child("VALUE.ARRAY");
     for (const CimValue& element : elements) {
-        if (element.isNull)
+        if (element.isNull) {
             array.append_child("VALUE.NULL");
-        else
+        } else {
             addText(array.append_child("VALUE"), scalarText(element));
+        }
     }
 }
 
@@ -106,11 +107,13 @@ void writeClassProperty(pugi::xml_node parent, const PropertyDefinition& propert
     CimValue value = property.defaultValue;
     if (value.isNull) value = CimValue::null(property.type);
     pugi::xml_node node = openProperty(parent, property.name, value);
-    if (!property.referenceClass.empty())
+    if (!property.referenceClass.empty()) {
         addAttribute(node, "REFERENCECLASS", property.referenceClass);
+    }
     if (view.withClassOrigin) addAttribute(node, "CLASSORIGIN", property.originClass);
-    if (!findDefinition(view.definition.properties, property.name))
+    if (!findDefinition(view.definition.properties, property.name)) {
         addAttribute(node, "PROPAGATED", "true");
+    }
     if (view.withQualifiers) {
         if (property.isKey) writeQualifier(node, {"Key", CimValue::boolean(true)});
         writeQualifiers(node, property.qualifiers);
@@ -120,8 +123,9 @@ void writeClassProperty(pugi::xml_node parent, const PropertyDefinition& propert
 
 const char* parameterElement(const ParameterDefinition& parameter) {
     const bool isArray = (parameter.type & CMPI_ARRAY) != 0;
-    if ((parameter.type & ~CMPI_ARRAY) == CMPI_ref)
+    if ((parameter.type & ~CMPI_ARRAY) == CMPI_ref) {
         return isArray ? "PARAMETER.REFARRAY" : "PARAMETER.REFERENCE";
+    }
     return isArray ? "PARAMETER.ARRAY" : "PARAMETER";
 }
 
@@ -129,10 +133,11 @@ void writeParameter(pugi::xml_node parent, const ParameterDefinition& parameter,
                     bool withQualifiers) {
     pugi::xml_node node = parent.append_child(parameterElement(parameter));
     addAttribute(node, "NAME", parameter.name);
-    if ((parameter.type & ~CMPI_ARRAY) != CMPI_ref)
+    if ((parameter.type & ~CMPI_ARRAY) != CMPI_ref) {
         addAttribute(node, "TYPE", xmlTypeName(parameter.type));
-    else if (!parameter.referenceClass.empty())
+    } else if (!parameter.referenceClass.empty()) {
         addAttribute(node, "REFERENCECLASS", parameter.referenceClass);
+    }
     if (withQualifiers) writeQualifiers(node, parameter.qualifiers);
 }
 
@@ -144,11 +149,13 @@ void writeMethod(pugi::xml_node parent, const MethodDefinition& method, const Cl
     const auto& own = view.definition.methods;
     if (std::none_of(own.begin(), own.end(), [&](const MethodDefinition& entry) {
             return sameName(entry.name, method.name);
-        }))
+        })) {
         addAttribute(node, "PROPAGATED", "true");
+    }
     if (view.withQualifiers) writeQualifiers(node, method.qualifiers);
-    for (const ParameterDefinition& parameter : method.parameters)
+    for (const ParameterDefinition& parameter : method.parameters) {
         writeParameter(node, parameter, view.withQualifiers);
+    }
 }
 
 /// Line ends of the carriage return kind survive only as character references.
@@ -156,10 +163,11 @@ struct TextWriter : pugi::xml_writer {
     std::string text;
     void write(const void* data, std::size_t size) override {
         for (const char byte : std::string_view(static_cast<const char*>(data), size)) {
-            if (byte == '\r')
+            if (byte == '\r') {
                 text += "&#13;";
-            else
+            } else {
                 text += byte;
+            }
         }
     }
 };
@@ -168,12 +176,13 @@ struct TextWriter : pugi::xml_writer {
 
 void writeValue(pugi::xml_node parent, const CimValue& value) {
     if (value.isNull) return;
-    if (const auto* elements = std::get_if<Elements>(&value.data))
+    if (const auto* elements = std::get_if<Elements>(&value.data)) {
         writeArray(parent, *elements);
-    else if (const Reference* reference = referenceIn(value))
+    } else if (const Reference* reference = referenceIn(value)) {
         writeReference(parent, **reference, KeyTypes::Told);
-    else
+    } else {
         addText(parent.append_child("VALUE"), scalarText(value));
+    }
 }
 
 pugi::xml_node writeProperty(pugi::xml_node parent, const NamedValue& property) {
@@ -231,8 +240,9 @@ void writeInstance(pugi::xml_node parent, const Instance& instance,
     pugi::xml_node node = parent.append_child("INSTANCE");
     addAttribute(node, "CLASSNAME", instance.path.className);
     if (details.withQualifiers) writeQualifiers(node, details.qualifiers);
-    for (const NamedValue& property : instance.properties)
+    for (const NamedValue& property : instance.properties) {
         writeInstanceProperty(node, property, details);
+    }
 }
 
 void writeNamedInstance(pugi::xml_node parent, const Instance& instance,
@@ -252,15 +262,18 @@ void writeObjectWithPath(pugi::xml_node parent, const Instance& instance, std::s
 void writeClass(pugi::xml_node parent, const ClassView& view) {
     pugi::xml_node node = parent.append_child("CLASS");
     addAttribute(node, "NAME", view.definition.name);
-    if (!view.definition.superclass.empty())
+    if (!view.definition.superclass.empty()) {
         addAttribute(node, "SUPERCLASS", view.definition.superclass);
+    }
     if (view.withQualifiers) {
-        if (view.definition.isAssociation)
+        if (view.definition.isAssociation) {
             writeQualifier(node, {"Association", CimValue::boolean(true)});
+        }
         writeQualifiers(node, view.definition.qualifiers);
     }
-    for (const PropertyDefinition& property : view.properties)
+    for (const PropertyDefinition& property : view.properties) {
         writeClassProperty(node, property, view);
+    }
     for (const MethodDefinition& method : view.methods) writeMethod(node, method, view);
 }
 

@@ -57,12 +57,14 @@ std::string readPassword(const std::string& file) {
     std::ifstream stream(file);
     std::string password;
     std::getline(stream, password);
-    if (!stream && errno != 0)
+    if (!stream && errno != 0) {
         throw std::runtime_error("no password in " + file + ": " +
                                  std::generic_category().message(errno));
+    }
     if (password.ends_with('\r')) password.pop_back();
-    if (password.empty())
+    if (password.empty()) {
         throw std::runtime_error("no password in " + file + ": its first line is empty");
+    }
     return password;
 }
 

@@ -36,8 +36,9 @@ int refusalFor(const RequestParser& parser) {
     const auto coding = request.find(http::field::transfer_encoding);
     const auto expectation = request.find(http::field::expect);
     if (coding != request.end() && !beast::iequals(coding->value(), "chunked")) return 501;
-    if (expectation != request.end() && !beast::iequals(expectation->value(), "100-continue"))
+    if (expectation != request.end() && !beast::iequals(expectation->value(), "100-continue")) {
         return 417;
+    }
     const bool hasBody = parser.chunked() || parser.content_length();
     return !hasBody && request.method_string().ends_with("POST") ? 411 : 0;
 }
@@ -45,8 +46,9 @@ int refusalFor(const RequestParser& parser) {
 HttpRequest requestFrom(http::request<http::string_body> message) {
     HttpRequest request{
         std::string(message.method_string()), std::string(message.target()), {}, {}};
-    for (const auto& field : message)
+    for (const auto& field : message) {
         request.headers.emplace_back(field.name_string(), field.value());
+    }
     request.version = static_cast<int>(message.version());
     request.body = std::move(message.body());
     return request;
@@ -96,8 +98,9 @@ public:
         const Welcome welcome = options_.welcome ? options_.welcome() : Welcome::Serve;
         if (welcome == Welcome::Reset) co_return reset();
         if (welcome == Welcome::Stall) co_await swallow();
-        if constexpr (kIsSecure)
+        if constexpr (kIsSecure) {
             co_await stream_.async_handshake(asio::ssl::stream_base::server, use_awaitable);
+        }
         for (bool keep = true; keep; enter(Phase::Reading, options_.times.idle)) {
             if (buffer_.size() == 0) co_await receive();
             enter(Phase::Reading, options_.times.request);
@@ -227,8 +230,9 @@ private:
         }
         message.body() = std::move(response.body);
         message.prepare_payload();
-        if (mishap.cutAt && *mishap.cutAt < message.body().size())
+        if (mishap.cutAt && *mishap.cutAt < message.body().size()) {
             message.body().resize(*mishap.cutAt);  // the length stays that of the whole
+        }
         co_await http::async_write(stream_, message, use_awaitable);
     }
 
@@ -239,9 +243,10 @@ private:
         message.chunked(true);
         http::response_serializer<http::empty_body> serializer(message);
         co_await http::async_write_header(stream_, serializer, use_awaitable);
-        if (!response.body.empty())
+        if (!response.body.empty()) {
             co_await asio::async_write(stream_, http::make_chunk(asio::buffer(response.body)),
                                        use_awaitable);
+        }
         const http::fields trailers = fieldsOf(response.mishap.trailers);
         co_await asio::async_write(stream_, http::make_chunk_last(trailers), use_awaitable);
     }
@@ -268,8 +273,9 @@ private:
             beast::error_code error;
             timer->expires_after(kStreamPause);
             co_await timer->async_wait(asio::redirect_error(use_awaitable, error));
-            if (!bottom().socket().is_open())
+            if (!bottom().socket().is_open()) {
                 throw beast::system_error(asio::error::operation_aborted);
+            }
         }
     }
 
@@ -300,9 +306,10 @@ private:
 std::unique_ptr<HttpConnection> makeConnection(tcp::socket socket, const HttpServerOptions& options,
                                                const HttpServer::Handler& handler,
                                                HttpWorkers& workers) {
-    if (!options.tls)
+    if (!options.tls) {
         return std::make_unique<Connection<Plain>>(Plain(std::move(socket)), options, handler,
                                                    workers);
+    }
     return std::make_unique<Connection<Secure>>(Secure(std::move(socket), *options.tls), options,
                                                 handler, workers);
 }

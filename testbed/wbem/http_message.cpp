@@ -6,8 +6,9 @@
 namespace testbed {
 
 const std::string* findHeader(const HttpHeaders& headers, std::string_view name) {
-    for (const auto& [known, value] : headers)
+    for (const auto& [known, value] : headers) {
         if (sameName(known, name)) return &value;
+    }
     return nullptr;
 }
 

@@ -84,10 +84,11 @@ void expectHost(SSL* session, const std::string& host, bool verify) {
     const bool isAddress = !error;
     if (!isAddress) SSL_set_tlsext_host_name(session, host.c_str());
     if (!verify) return;
-    if (isAddress)
+    if (isAddress) {
         X509_VERIFY_PARAM_set1_ip_asc(SSL_get0_param(session), host.c_str());
-    else
+    } else {
         SSL_set1_host(session, host.c_str());
+    }
 }
 
 http::request<http::string_body> messageFrom(const PostRequest& request) {
@@ -104,8 +105,9 @@ http::request<http::string_body> messageFrom(const PostRequest& request) {
 PostAnswer answerFrom(http::response<http::string_body> message) {
     PostAnswer answer{
         static_cast<int>(message.result_int()), std::string(message.reason()), {}, {}};
-    for (const auto& field : message)
+    for (const auto& field : message) {
         answer.headers.emplace_back(field.name_string(), field.value());
+    }
     answer.body = std::move(message.body());
     return answer;
 }
@@ -170,9 +172,10 @@ private:
                                         asio::redirect_error(use_awaitable, error));
         if (!error) co_return;
         const long verdict = SSL_get_verify_result(stream.native_handle());
-        if (verdict != X509_V_OK)
+        if (verdict != X509_V_OK) {
             throw WbemError("the server's certificate is not trusted: " +
                             std::string(X509_verify_cert_error_string(verdict)));
+        }
         if (error == beast::error::timeout) throw WbemError(kLate);
         failTls(error);
     }
@@ -206,25 +209,29 @@ private:
     }
 
     [[noreturn]] void failRead(const beast::error_code& error) const {
-        if (error == http::error::body_limit)
+        if (error == http::error::body_limit) {
             throw WbemError("the answer has more than " + std::to_string(bounds_.largestBody) +
                             " bytes");
+        }
         if (error == http::error::end_of_stream) throw WbemError("the server sent no answer");
         if (error == http::error::partial_message) throw WbemError("the answer ends early");
-        if (error.category() == make_error_code(http::error::bad_version).category())
+        if (error.category() == make_error_code(http::error::bad_version).category()) {
             throw WbemError("the answer is no HTTP: " + error.message());
+        }
         fail("the server closed the connection", error);
     }
 
     static void refuseCodings(const ResponseParser& parser) {
         const auto& message = parser.get();
         const auto coding = message.find(http::field::content_encoding);
-        if (coding != message.end() && !beast::iequals(coding->value(), "identity"))
+        if (coding != message.end() && !beast::iequals(coding->value(), "identity")) {
             throw WbemError("the answer is compressed, which was not asked for");
+        }
         const auto transfer = message.find(http::field::transfer_encoding);
         if (transfer != message.end() && !beast::iequals(transfer->value(), "chunked") &&
-            !beast::iequals(transfer->value(), "identity"))
+            !beast::iequals(transfer->value(), "identity")) {
             throw WbemError("the answer comes in a form that was not asked for");
+        }
     }
 
     const PostRequest& request_;

@@ -30,9 +30,10 @@ tcp::acceptor listenOn(asio::io_context& io, const HttpServerOptions& options) {
     if (!error) acceptor.set_option(tcp::acceptor::reuse_address(true), error);
     if (!error) acceptor.bind(endpoint, error);
     if (!error) acceptor.listen(tcp::acceptor::max_listen_connections, error);
-    if (error)
+    if (error) {
         throw std::runtime_error("cannot listen on " + options.address + " port " +
                                  std::to_string(options.port) + ": " + error.message());
+    }
     return acceptor;
 }
 
@@ -62,10 +63,11 @@ public:
     void listen(bool wanted) {
         asio::post(io_, [this, wanted] {
             beast::error_code error;
-            if (!wanted)
+            if (!wanted) {
                 acceptor_.close(error);
-            else if (!acceptor_.is_open())
+            } else if (!acceptor_.is_open()) {
                 acceptor_ = listenOn(io_, options_);
+            }
         });
     }
 
@@ -75,10 +77,11 @@ private:
             beast::error_code error;
             tcp::socket socket =
                 co_await acceptor_.async_accept(asio::redirect_error(use_awaitable, error));
-            if (error)
+            if (error) {
                 co_await recover(error);
-            else if (connections_.size() < options_.connections || makeRoom())
+            } else if (connections_.size() < options_.connections || makeRoom()) {
                 add(std::move(socket));
+            }
         }
     }
 
@@ -100,8 +103,9 @@ private:
         const auto victim =
             std::min_element(connections_.begin(), connections_.end(),
                              [&](const auto* a, const auto* b) { return rank(a) < rank(b); });
-        if (victim == connections_.end() || (*victim)->phase() == HttpConnection::Phase::Working)
+        if (victim == connections_.end() || (*victim)->phase() == HttpConnection::Phase::Working) {
             return false;
+        }
         (*victim)->close();
         connections_.erase(victim);
         return true;

@@ -31,8 +31,9 @@ const InstanceDetails& InstanceView::detailsOf(const Instance& instance) {
     details.withQualifiers = options_.withQualifiers;
     details.withClassOrigin = options_.withClassOrigin;
     details.properties = repository_.allProperties(path.nameSpace, path.className);
-    if (auto definition = repository_.findClass(path.nameSpace, path.className))
+    if (auto definition = repository_.findClass(path.nameSpace, path.className)) {
         details.qualifiers = std::move(definition->qualifiers);
+    }
     return details;
 }
 

@@ -87,8 +87,9 @@ std::vector<Instance> interopInstances(const Repository& repository, const std::
     if (!sameName(nameSpace, kInteropNamespace)) return {};
     std::vector<Instance> found;
     const auto add = [&](Instance instance) {
-        if (repository.isA(nameSpace, instance.path.className, className))
+        if (repository.isA(nameSpace, instance.path.className, className)) {
             found.push_back(std::move(instance));
+        }
     };
     add(managerInstance(system));
     for (const std::string& name : repository.namespaceNames()) {

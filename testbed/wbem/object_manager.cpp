@@ -42,14 +42,16 @@ ObjectManager::ObjectManager(Repository& repository, std::optional<Registration>
 }
 
 void ObjectManager::requireNamespace(const std::string& nameSpace) const {
-    if (!repository_.hasNamespace(nameSpace))
+    if (!repository_.hasNamespace(nameSpace)) {
         throw CimStatus(CMPI_RC_ERR_INVALID_NAMESPACE, "no namespace " + nameSpace);
+    }
 }
 
 void ObjectManager::requireClass(const std::string& nameSpace, const std::string& className) const {
     requireNamespace(nameSpace);
-    if (!repository_.hasClass(nameSpace, className) && !isProviderClass(nameSpace, className))
+    if (!repository_.hasClass(nameSpace, className) && !isProviderClass(nameSpace, className)) {
         throw CimStatus(CMPI_RC_ERR_INVALID_CLASS, "no class " + className + " in " + nameSpace);
+    }
 }
 
 bool ObjectManager::isProviderClass(const std::string& nameSpace,
@@ -63,8 +65,9 @@ std::vector<std::string> ObjectManager::providerClasses(const std::string& nameS
     if (isProviderClass(nameSpace, className)) return {className};
     std::vector<std::string> classes;
     if (!provider_ || !sameName(provider_->nameSpace, nameSpace)) return classes;
-    for (const std::string& registered : provider_->classes)
+    for (const std::string& registered : provider_->classes) {
         if (repository_.isA(nameSpace, registered, className)) classes.push_back(registered);
+    }
     return classes;
 }
 
@@ -78,17 +81,19 @@ std::vector<Instance> ObjectManager::staticInstances(const std::string& nameSpac
 
 std::optional<Instance> ObjectManager::staticInstance(const ObjectPath& path) const {
     if (auto found = repository_.get(path)) return found;
-    for (Instance& instance : staticInstances(path.nameSpace, path.className))
+    for (Instance& instance : staticInstances(path.nameSpace, path.className)) {
         if (instance.path == path) return std::move(instance);
+    }
     return std::nullopt;
 }
 
 void ObjectManager::requireKnown(const char* parameter,
                                  const std::optional<std::string>& className) const {
     // An association may lead into a namespace with classes of its own.
-    if (className && !className->empty() && !repository_.knowsClass(*className))
+    if (className && !className->empty() && !repository_.knowsClass(*className)) {
         throw CimStatus(CMPI_RC_ERR_INVALID_PARAMETER,
                         std::string(parameter) + ": no class " + *className);
+    }
 }
 
 std::vector<ObjectPath> ObjectManager::instanceNames(const std::string& nameSpace,
@@ -99,8 +104,9 @@ std::vector<ObjectPath> ObjectManager::instanceNames(const std::string& nameSpac
         InstanceClient client = provider_->client;
         append(names, checked(client.enumerateInstanceNames(served, nameSpace)).paths);
     }
-    for (Instance& instance : staticInstances(nameSpace, className))
+    for (Instance& instance : staticInstances(nameSpace, className)) {
         names.push_back(std::move(instance.path));
+    }
     return names;
 }
 
@@ -156,9 +162,10 @@ ObjectPath ObjectManager::withKeyName(ObjectPath path) const {
     if (nameless == path.keys.end()) return path;
     auto properties = repository_.allProperties(path.nameSpace, path.className);
     std::erase_if(properties, [](const PropertyDefinition& property) { return !property.isKey; });
-    if (properties.size() != 1)
+    if (properties.size() != 1) {
         throw CimStatus(CMPI_RC_ERR_INVALID_PARAMETER,
                         path.className + " has not exactly one key, and the key has no name");
+    }
     nameless->first = properties.front().name;
     return path;
 }

@@ -42,8 +42,9 @@ const std::vector<Operation>& operations() {
 }  // namespace
 
 const Operation* findOperation(const std::string& name) {
-    for (const Operation& operation : operations())
+    for (const Operation& operation : operations()) {
         if (sameName(operation.name, name)) return &operation;
+    }
     return nullptr;
 }
 

@@ -10,8 +10,9 @@ namespace {
 /// Where the walk begins. Class paths, which ask for association classes, are not served.
 ObjectPath sourceOf(const OperationContext& context, const CimRequest& request) {
     const ObjectPath source = context.manager.withKeyName(request.objectPath("ObjectName"));
-    if (request.isClassPath("ObjectName"))
+    if (request.isClassPath("ObjectName")) {
         throw CimStatus(CMPI_RC_ERR_NOT_SUPPORTED, "associations of classes are not served");
+    }
     return source;
 }
 
@@ -51,8 +52,9 @@ void writeObjects(const OperationContext& context, const CimRequest& request,
 
 void writePaths(const OperationContext& context, const std::vector<Instance>& instances,
                 pugi::xml_node result) {
-    for (const Instance& instance : instances)
+    for (const Instance& instance : instances) {
         writeInstancePath(result.append_child("OBJECTPATH"), instance.path, context.host);
+    }
 }
 
 }  // namespace

@@ -50,8 +50,9 @@ std::vector<ClassDefinition> classesBelow(const OperationContext& context,
     std::vector<ClassDefinition> classes;
     for (const std::string& name : repository.classNames(nameSpace)) {
         auto definition = repository.findClass(nameSpace, name);
-        if (definition && isBelow(repository, nameSpace, *definition, start, deep))
+        if (definition && isBelow(repository, nameSpace, *definition, start, deep)) {
             classes.push_back(std::move(*definition));
+        }
     }
     return classes;
 }
@@ -62,8 +63,9 @@ void getClass(const OperationContext& context, const CimRequest& request, pugi::
     const Repository& repository = context.manager.repository();
     const std::string name = request.className();
     auto definition = repository.findClass(request.nameSpace(), name);
-    if (!definition)
+    if (!definition) {
         throw CimStatus(CMPI_RC_ERR_NOT_FOUND, "no class " + name + " in " + request.nameSpace());
+    }
     ClassView view = viewOf(repository, request, std::move(*definition));
     keepListed(request.propertyList(), view.properties);
     writeClass(result, view);
@@ -71,14 +73,16 @@ void getClass(const OperationContext& context, const CimRequest& request, pugi::
 
 void enumerateClasses(const OperationContext& context, const CimRequest& request,
                       pugi::xml_node result) {
-    for (ClassDefinition& definition : classesBelow(context, request))
+    for (ClassDefinition& definition : classesBelow(context, request)) {
         writeClass(result, viewOf(context.manager.repository(), request, std::move(definition)));
+    }
 }
 
 void enumerateClassNames(const OperationContext& context, const CimRequest& request,
                          pugi::xml_node result) {
-    for (const ClassDefinition& definition : classesBelow(context, request))
+    for (const ClassDefinition& definition : classesBelow(context, request)) {
         writeClassName(result, definition.name);
+    }
 }
 
 }  // namespace testbed

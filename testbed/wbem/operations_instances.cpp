@@ -20,8 +20,9 @@ ViewOptions viewOptions(const CimRequest& request) {
 void enumerateInstanceNames(const OperationContext& context, const CimRequest& request,
                             pugi::xml_node result) {
     for (const ObjectPath& name :
-         context.manager.instanceNames(request.nameSpace(), request.className()))
+         context.manager.instanceNames(request.nameSpace(), request.className())) {
         writeInstanceName(result, name, KeyTypes::Told);
+    }
 }
 
 void enumerateInstances(const OperationContext& context, const CimRequest& request,
@@ -40,8 +41,9 @@ void enumerateInstances(const OperationContext& context, const CimRequest& reque
 void getInstance(const OperationContext& context, const CimRequest& request,
                  pugi::xml_node result) {
     const ObjectPath path = context.manager.withKeyName(request.objectPath("InstanceName"));
-    if (request.isClassPath("InstanceName"))
+    if (request.isClassPath("InstanceName")) {
         throw CimStatus(CMPI_RC_ERR_INVALID_PARAMETER, "InstanceName: names no instance");
+    }
     InstanceView view(context.manager.repository(), viewOptions(request));
     Instance instance = context.manager.instance(path, request.propertyList());
     view.apply(instance);

@@ -21,8 +21,9 @@ Words split(std::string_view text) {
     while (stream >> std::ws && stream.peek() != EOF) {
         std::string name, value;
         std::getline(stream, name, '=');
-        if (stream.eof() || name.find_first_of(" \t\"") != std::string::npos)
+        if (stream.eof() || name.find_first_of(" \t\"") != std::string::npos) {
             throw ServerFaultError("not NAME=VALUE: " + name);
+        }
         const int next = stream.peek();
         if (next != ' ' && next != '\t' && next != EOF) stream >> std::quoted(value);
         if (stream.fail()) throw ServerFaultError(name + ": a quotation mark is missing");
@@ -35,9 +36,10 @@ int numberIn(const std::string& name, const std::string& text, int least, int mo
     int number = 0;
     const char* end = text.data() + text.size();
     const auto [stop, error] = std::from_chars(text.data(), end, number);
-    if (error != std::errc() || stop != end || number < least || number > most)
+    if (error != std::errc() || stop != end || number < least || number > most) {
         throw ServerFaultError(name + ": a number from " + std::to_string(least) + " to " +
                                std::to_string(most) + " expected, not \"" + text + "\"");
+    }
     return number;
 }
 
@@ -46,8 +48,9 @@ ServerFault::Connection connectionNamed(const std::string& word) {
     static const std::map<std::string, Connection> kWords = {
         {"refuse", Connection::Refuse}, {"reset", Connection::Reset}, {"stall", Connection::Stall}};
     const auto known = kWords.find(word);
-    if (known == kWords.end())
+    if (known == kWords.end()) {
         throw ServerFaultError("connection: refuse, reset or stall expected, not \"" + word + "\"");
+    }
     return known->second;
 }
 
@@ -114,8 +117,9 @@ bool hasEffect(const ServerFault& fault) {
 
 /// Header values are one line of printable ASCII.
 std::string headerText(std::string text) {
-    for (char& c : text)
+    for (char& c : text) {
         if (c < 0x20 || c > 0x7e) c = '?';
+    }
     return text;
 }
 
@@ -127,11 +131,14 @@ ServerFault parseServerFault(std::string_view text) {
     for (const auto& [name, value] : words) memberNamed(name).read(fault, name, value);
     if (!hasEffect(fault)) throw ServerFaultError("what is to go wrong is missing");
     if (fault.connection == ServerFault::Connection::None) return fault;
-    for (const auto& [name, value] : words)
-        if (!memberNamed(name).ofConnections)
+    for (const auto& [name, value] : words) {
+        if (!memberNamed(name).ofConnections) {
             throw ServerFaultError(name + " is nothing that a connection has");
-    if (fault.connection == ServerFault::Connection::Refuse && words.contains("times"))
+        }
+    }
+    if (fault.connection == ServerFault::Connection::Refuse && words.contains("times")) {
         throw ServerFaultError("refused connections cannot be counted");
+    }
     return fault;
 }
 
@@ -183,13 +190,15 @@ std::optional<ServerFault> ServerFaults::match(std::string_view operation,
 void befall(const ServerFault& fault, HttpResponse& response) {
     if (fault.httpStatus) {
         response = {*fault.httpStatus, {}, {}};
-        if (response.status == 401)
+        if (response.status == 401) {
             response.headers.emplace_back("WWW-Authenticate", "Basic realm=\"plexor-testbed\"");
+        }
     }
     response.mishap.delay = fault.delay;
     response.mishap.cutAt = fault.cutAt;
-    for (auto& [name, value] : response.headers)
+    for (auto& [name, value] : response.headers) {
         if (fault.contentType && name == "Content-Type") value = headerText(*fault.contentType);
+    }
     if (!fault.trailerStatus || fault.httpStatus) return;
     const auto code = static_cast<CMPIrc>(*fault.trailerStatus);
     response.mishap.trailers = {

@@ -59,8 +59,9 @@ struct OperationCall {
 };
 
 std::string quoted(std::string text) {
-    for (char& c : text)
+    for (char& c : text) {
         if (static_cast<unsigned char>(c) < 0x20 || c == 0x7f) c = ' ';
+    }
     if (text.size() > kLongestQuote) text = text.substr(0, kLongestQuote) + "...";
     return xmlText(text);
 }
@@ -87,10 +88,12 @@ std::string base64(std::string_view bytes) {
     std::string encoded;
     while (!bytes.empty()) {
         std::uint32_t bits = 0;
-        for (std::size_t i = 0; i < 3; i++)
+        for (std::size_t i = 0; i < 3; i++) {
             bits = bits << 8 | (i < bytes.size() ? static_cast<unsigned char>(bytes[i]) : 0U);
-        for (std::size_t i = 0; i < 4; i++)
+        }
+        for (std::size_t i = 0; i < 4; i++) {
             encoded += i <= bytes.size() ? kDigits[bits >> (18 - 6 * i) & 63] : '=';
+        }
         bytes.remove_prefix(std::min<std::size_t>(3, bytes.size()));
     }
     return encoded;
@@ -110,9 +113,11 @@ std::string refusalOf(const PostAnswer& answer) {
     if (!answer.reason.empty()) text += " " + quoted(answer.reason);
     if (answer.status == 401) text += ": user name or password are missing or wrong";
     if (answer.status / 100 == 3) text += ": it is at " + quoted(answer.header("Location"));
-    for (const char* header : kErrorHeaders)
-        if (const std::string& detail = answer.header(header); !detail.empty())
+    for (const char* header : kErrorHeaders) {
+        if (const std::string& detail = answer.header(header); !detail.empty()) {
             text += ", " + std::string(header) + " " + quoted(detail);
+        }
+    }
     return text;
 }
 
@@ -133,8 +138,10 @@ Response statusIn(const PostAnswer& answer) {
 void replaceAll(std::string& text, const std::string& part) {
     constexpr std::string_view kHidden = "***";
     if (part.empty()) return;
-    for (std::size_t at = 0; (at = text.find(part, at)) != std::string::npos; at += kHidden.size())
+    for (std::size_t at = 0; (at = text.find(part, at)) != std::string::npos;
+         at += kHidden.size()) {
         text.replace(at, part.size(), kHidden);
+    }
 }
 
 }  // namespace
@@ -167,8 +174,9 @@ PostAnswer WbemClient::post(const std::string& method, const std::string& nameSp
     if (url_.credentials) request.headers.emplace_back("Authorization", "Basic " + token_);
     PostAnswer answer = httpPost(request, {options_.deadline, options_.largestAnswer - received_});
     received_ += answer.body.size();
-    if (answer.status != 200 || saysError(answer))
+    if (answer.status != 200 || saysError(answer)) {
         throw WbemError(withoutSecrets(refusalOf(answer)));
+    }
     return answer;
 }
 
@@ -215,9 +223,10 @@ Response WbemClient::getInstance(const ObjectPath& path, const PropertyList& pro
     operation.flag("IncludeClassOrigin", false);
     operation.propertyList(properties);
     Response response = call(operation.asked, operation.document);
-    if (response.rc == CMPI_RC_OK && response.instances.size() != 1)
+    if (response.rc == CMPI_RC_OK && response.instances.size() != 1) {
         throw WbemError("the answer has " + std::to_string(response.instances.size()) +
                         " instances instead of one");
+    }
     // A got instance comes without its name.
     for (Instance& instance : response.instances) instance.path = path;
     return response;

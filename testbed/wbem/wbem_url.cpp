@@ -21,8 +21,9 @@ constexpr std::string_view kServersOwnPath = "cimom";
 bool takePrefix(std::string_view& text, std::string_view prefix) {
     const auto equal = [](char a, char b) { return (a >= 'A' && a <= 'Z' ? a + 32 : a) == b; };
     if (text.size() < prefix.size() || !std::equal(prefix.begin(), prefix.end(), text.begin(),
-                                                   [&](char b, char a) { return equal(a, b); }))
+                                                   [&](char b, char a) { return equal(a, b); })) {
         return false;
+    }
     text.remove_prefix(prefix.size());
     return true;
 }
@@ -85,16 +86,18 @@ bool isPrintable(std::string_view text) {
 
 /// The namespace that the part behind the host names; "" for the server's own path and for none.
 std::string namespaceIn(std::string_view path) {
-    if (path.find_first_of("?#") != std::string_view::npos)
+    if (path.find_first_of("?#") != std::string_view::npos) {
         refuse(
             "has a ? or # behind its host; in a user name or password, /, ? and # are written "
             "%2F, %3F and %23");
+    }
     while (path.starts_with('/')) path.remove_prefix(1);
     while (path.ends_with('/')) path.remove_suffix(1);
     if (path == kServersOwnPath) return "";
     const std::string nameSpace = percentDecoded(path);
-    if (nameSpace.find(':') != std::string::npos)
+    if (nameSpace.find(':') != std::string::npos) {
         refuse("names a class behind its namespace, which --class does");
+    }
     if (!isPrintable(nameSpace)) refuse("has a namespace with blanks or control characters");
     return nameSpace;
 }

@@ -54,8 +54,9 @@ std::string utf8Character(char32_t character) {
     int shift = character < 0x800 ? 6 : character < 0x10000 ? 12 : 18;
     const unsigned lead = shift == 6 ? 0xc0 : shift == 12 ? 0xe0 : 0xf0;
     text += static_cast<char>(lead | (character >> shift));
-    for (shift -= 6; shift >= 0; shift -= 6)
+    for (shift -= 6; shift >= 0; shift -= 6) {
         text += static_cast<char>(0x80 | ((character >> shift) & 0x3f));
+    }
     return text;
 }
 

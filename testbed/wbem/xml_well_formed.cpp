@@ -22,8 +22,9 @@ struct Refusal {
 };
 
 void onDeclaration(void* user, const XML_Char*, const XML_Char* encoding, int) {
-    if (encoding && !sameName(encoding, "utf-8"))
+    if (encoding && !sameName(encoding, "utf-8")) {
         static_cast<Refusal*>(user)->say("an encoding other than UTF-8 is declared");
+    }
 }
 
 void onEntity(void* user, const XML_Char*, int, const XML_Char*, int, const XML_Char*,
