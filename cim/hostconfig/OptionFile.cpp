@@ -1,3 +1,4 @@
+// Reading the file within bounds, and making an option of the value that counts.
 #include "OptionFile.h"
 
 #include <fcntl.h>

@@ -1,3 +1,4 @@
+// One setter for each type of property, and the arrays of one element.
 #include "PlexorProviderIfcProperty.h"
 
 #include "PlexorProviderUtilManager.h"

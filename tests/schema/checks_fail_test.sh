@@ -153,6 +153,10 @@ must_complain check_size "41 lines, at most 40: CallScope() {" cim/plexor/Plexor
 must_complain check_size "PlexorProviderUtilLife.cpp: 4" cim/plexor/PlexorProviderUtilLife.cpp \
     "1s/^/$(printf '\\n%.0s' {1..400})/"
 
+# What nobody says in its first line.
+must_complain check_size "PlexorProviderUtilLife.cpp: does not begin with a comment" \
+    cim/plexor/PlexorProviderUtilLife.cpp '/^\/\/ Which life/d'
+
 fresh_copy
 file=cim/plexor/PlexorProviderCfgRecords.cpp
 if ! check_schema || ! check_messages || ! check_size || ! check_locks; then
