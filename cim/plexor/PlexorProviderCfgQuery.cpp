@@ -1,6 +1,6 @@
 // Asks the vendor through the broker, and logs what it asks and what failed. Who else asks the
-// broker: the search for the host's identity (UtilSystem), whose lines are its own, and the walk that
-// asks for the class of a path (CfgDevices), which is not logged.
+// broker: the search for the host's identity (UtilSystem), whose lines are its own, and the walk
+// that asks for the class of a path (CfgDevices), which is not logged.
 #include "PlexorProviderCfg.h"
 
 namespace {
