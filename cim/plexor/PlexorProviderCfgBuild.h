@@ -2,23 +2,29 @@
 // parts, dumps it to the log and publishes it.
 #pragma once
 
-#include <memory>
-
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderCfgKinds.h"
 
-/// A record until it is published; one that is turned away is released as its kind is.
-template <typename Record>
-using RecordOwner = std::unique_ptr<Record, ReleaseFunc_t>;
-
 /// A zero-filled record; null without memory, which is logged in the builder's name.
 template <typename Record>
-RecordOwner<Record> NewDevice(const char* builder, const DeviceKind& kind) {
-    RecordOwner<Record> record(NewRecord<Record>(), kind.release);
+Record* NewDevice(const char* builder, const DeviceKind& kind) {
+    auto* record = NewRecord<Record>();
     if (record == nullptr) {
         syslog(LOG_ERR, "%s, failed to allocate memory for %s\n", builder, kind.recordName);
     }
     return record;
+}
+
+/// Builds a device with `steps`, which take its record and give 0 once they have published it. One
+/// that is turned away is released here as its kind is; not by a destructor, as that logs, and a
+/// thread may be cancelled while it does. -2 without memory, else the steps' code.
+template <typename Record, typename Steps>
+int BuildRecord(const char* builder, const DeviceKind& kind, Steps steps) {
+    auto* record = NewDevice<Record>(builder, kind);
+    if (record == nullptr) return RESULT_NO_MEMORY;
+    const int rc = steps(record);
+    if (rc != RESULT_OK) kind.release(record);
+    return rc;
 }
 
 /// The instance's DeviceID, the caller's; null without one, which is logged with the device's path.
@@ -33,16 +39,6 @@ int AppendRecord(RaidController_t* ctrl, const DeviceKind& kind, void* record)
 /// list's code; the caller's record when it is not 0.
 int PublishRecord(const char* builder, RaidController_t* ctrl, const DeviceKind& kind, void* record)
     PLEXOR_WITHOUT(ctrl->CtrlMutex);
-
-template <typename Record>
-int Publish(const char* builder, RaidController_t* ctrl, const DeviceKind& kind,
-            RecordOwner<Record>& record) {
-    // Given up before anything is logged: a thread may be cancelled there.
-    Record* const published = record.release();
-    const int rc = PublishRecord(builder, ctrl, kind, published);
-    if (rc != RESULT_OK) record.reset(published);
-    return rc;
-}
 
 /// Stamps the kind's update time. Takes CtrlMutex.
 void StampTime(RaidController_t* ctrl, const DeviceKind& kind) PLEXOR_WITHOUT(ctrl->CtrlMutex);

@@ -95,12 +95,29 @@ void DumpController(const RaidController_t* ctrl) {
            ctrl->DriverVersion, ctrl->BundleVersion, ctrl->HealthState, ctrl->OperationalStatus);
 }
 
-/// Appends the controller, with the list's code in `rc`. False after a stop: the list is not this
+/// Appends the controller. 0, the list's code, or -100 after a stop, silently: the list is not this
 /// thread's any more.
-bool Publish(RaidController_t* ctrl, int& rc) {
-    const LifeGuard life;
-    if (!life.Stands()) return false;
-    rc = AddEntryAtListTail(RaidControllerList, ctrl);
+int PublishController(RaidController_t* ctrl) {
+    int rc = RESULT_NOTHING;
+    {
+        const LifeGuard life;
+        if (life.Stands()) rc = AddEntryAtListTail(RaidControllerList, ctrl);
+    }
+    if (rc == RESULT_OK) {
+        syslog(LOG_DEBUG, "%s: controller %p added to the list\n", kBuilder,
+               static_cast<void*>(ctrl));
+    } else if (rc != RESULT_NOTHING) {
+        syslog(LOG_ERR, "%s: failed to add controller to list, rc %d.\n", kBuilder, rc);
+    }
+    return rc;
+}
+
+/// Whether the port controller is one that can be shown.
+bool ReadParts(RaidController_t* ctrl, const CMPIContext* ctx, const CMPIInstance* inst) {
+    if (!ReadPortController(ctrl, inst) || !ReadComputerSystem(ctrl, ctx)) return false;
+    ReadPackage(ctrl, ctx);
+    ReadSoftware(ctrl, ctx);
+    StoreShared(ctrl->ControllerUpdateTime, time(nullptr));
     return true;
 }
 
@@ -113,27 +130,13 @@ int BuildController(const CMPIContext* ctx, const CMPIInstance* inst) {
         return RESULT_NO_MEMORY;
     }
     InitLocksAndLists(ctrl);
-    if (!ReadPortController(ctrl, inst) || !ReadComputerSystem(ctrl, ctx)) {
-        FreeController(ctrl);
-        return RESULT_OK;
+    int rc = RESULT_NOTHING;
+    if (ReadParts(ctrl, ctx, inst)) {
+        DumpController(ctrl);
+        rc = PublishController(ctrl);
     }
-    ReadPackage(ctrl, ctx);
-    ReadSoftware(ctrl, ctx);
-    StoreShared(ctrl->ControllerUpdateTime, time(nullptr));
-    DumpController(ctrl);
-
-    int rc = RESULT_OK;
-    if (!Publish(ctrl, rc)) {
-        FreeController(ctrl);
-        return RESULT_OK;
-    }
-    if (rc != RESULT_OK) {
-        syslog(LOG_ERR, "%s: failed to add controller to list, rc %d.\n", kBuilder, rc);
-        FreeController(ctrl);
-        return rc;
-    }
-    syslog(LOG_DEBUG, "%s: controller %p added to the list\n", kBuilder, static_cast<void*>(ctrl));
-    return RESULT_OK;
+    if (rc != RESULT_OK) FreeController(ctrl);
+    return rc == RESULT_NOTHING ? RESULT_OK : rc;
 }
 
 int BuildControllersOfProfile(const CMPIContext* ctx, const CMPIInstance* profile) {

@@ -85,20 +85,18 @@ CMPIEnumeration* CandidatePools(const DiskDrive_t* disk, const CMPIContext* ctx)
         {kBuilder, ctx, disk->ExtentOp, "CIM_ConcreteComponent", "CIM_StoragePool"});
 }
 
-using DriveOwner = RecordOwner<DiskDrive_t>;
-
 /// Appends the drive and, when that fails, withdraws it from `pool` again. The list's code.
-int Append(RaidController_t* ctrl, DriveOwner& disk, StoragePool_t* pool)
+int Append(RaidController_t* ctrl, DiskDrive_t* disk, StoragePool_t* pool)
     PLEXOR_HOLDS(ctrl->CtrlMutex) {
     void* const list = ctrl->DiskList;
-    const int rc = AppendRecord(ctrl, kDrives, disk.get());
+    const int rc = AppendRecord(ctrl, kDrives, disk);
     if (rc == RESULT_OK) {
-        void* const published = disk.release();
-        syslog(LOG_DEBUG, "%s: disk %p added to the list %p\n", kBuilder, published, list);
+        syslog(LOG_DEBUG, "%s: disk %p added to the list %p\n", kBuilder, static_cast<void*>(disk),
+               list);
         return rc;
     }
     syslog(LOG_ERR, "%s: failed to add disk %p to list %p, rc %d.\n", kBuilder,
-           static_cast<void*>(disk.get()), list, rc);
+           static_cast<void*>(disk), list, rc);
     if (pool == nullptr) return rc;
     syslog(LOG_DEBUG, "%s: remove disk %s from pool %p\n", kBuilder, disk->DeviceID,
            static_cast<void*>(pool));
@@ -109,7 +107,7 @@ int Append(RaidController_t* ctrl, DriveOwner& disk, StoragePool_t* pool)
 /// Takes `candidate` as the drive's pool. When it is cached, joins it and appends the drive under
 /// one hold of CtrlMutex: a reader that finds the member must find its record. True when that
 /// happened, with the list's code in `rc`.
-bool JoinAndAppend(RaidController_t* ctrl, DriveOwner& disk, const CMPIObjectPath* candidate,
+bool JoinAndAppend(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIObjectPath* candidate,
                    int& rc) {
     free(disk->Pool);
     disk->Pool = StringClone(ReadKey(candidate, "InstanceID"));
@@ -125,8 +123,8 @@ bool JoinAndAppend(RaidController_t* ctrl, DriveOwner& disk, const CMPIObjectPat
 
 /// Finds the drive's pool and puts the drive into the controller's list. 0, -1 without a pool, or
 /// the list's code.
-int JoinAndPublish(RaidController_t* ctrl, DriveOwner& disk, const CMPIContext* ctx) {
-    CMPIEnumeration* pools = CandidatePools(disk.get(), ctx);
+int JoinAndPublish(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx) {
+    CMPIEnumeration* pools = CandidatePools(disk, ctx);
     while (const CMPIObjectPath* candidate = NextPath(pools)) {
         if (StopRequested()) break;
         int rc = RESULT_OK;
@@ -156,11 +154,11 @@ bool ReadParts(DiskDrive_t* disk, const CMPIContext* ctx, const CMPIInstance* de
 int Build(RaidController_t* ctrl, const CMPIContext* ctx, const CMPIInstance* devInst,
           const CMPIObjectPath* devOp) {
     if (devOp == nullptr || devInst == nullptr || ctrl == nullptr) return RESULT_BAD_ARGUMENT;
-    auto disk = NewDevice<DiskDrive_t>(kBuilder, kDrives);
-    if (disk == nullptr) return RESULT_NO_MEMORY;
-    if (!ReadParts(disk.get(), ctx, devInst, devOp)) return RESULT_BAD_ARGUMENT;
-    DumpDisk(disk.get());
-    return JoinAndPublish(ctrl, disk, ctx);
+    return BuildRecord<DiskDrive_t>(kBuilder, kDrives, [&](DiskDrive_t* disk) -> int {
+        if (!ReadParts(disk, ctx, devInst, devOp)) return RESULT_BAD_ARGUMENT;
+        DumpDisk(disk);
+        return JoinAndPublish(ctrl, disk, ctx);
+    });
 }
 
 }  // namespace

@@ -63,11 +63,11 @@ void DumpPool(const StoragePool_t* pool) {
 }
 
 int BuildPool(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObjectPath* op) {
-    auto pool = NewDevice<StoragePool_t>(kPoolBuilder, kPools);
-    if (pool == nullptr) return RESULT_NO_MEMORY;
-    if (!ReadPool(pool.get(), inst, op)) return RESULT_BAD_ARGUMENT;
-    DumpPool(pool.get());
-    return Publish(kPoolBuilder, ctrl, kPools, pool);
+    return BuildRecord<StoragePool_t>(kPoolBuilder, kPools, [&](StoragePool_t* pool) -> int {
+        if (!ReadPool(pool, inst, op)) return RESULT_BAD_ARGUMENT;
+        DumpPool(pool);
+        return PublishRecord(kPoolBuilder, ctrl, kPools, pool);
+    });
 }
 
 bool ReadChassis(Chassis_t* chassis, const RaidController_t* ctrl, const CMPIInstance* inst,
@@ -93,11 +93,11 @@ void DumpChassis(const Chassis_t* chassis) {
 }
 
 int BuildChassis(RaidController_t* ctrl, const CMPIInstance* inst, const CMPIObjectPath* op) {
-    auto chassis = NewDevice<Chassis_t>(kChassisBuilder, kEnclosures);
-    if (chassis == nullptr) return RESULT_NO_MEMORY;
-    if (!ReadChassis(chassis.get(), ctrl, inst, op)) return RESULT_BAD_ARGUMENT;
-    DumpChassis(chassis.get());
-    return Publish(kChassisBuilder, ctrl, kEnclosures, chassis);
+    return BuildRecord<Chassis_t>(kChassisBuilder, kEnclosures, [&](Chassis_t* chassis) -> int {
+        if (!ReadChassis(chassis, ctrl, inst, op)) return RESULT_BAD_ARGUMENT;
+        DumpChassis(chassis);
+        return PublishRecord(kChassisBuilder, ctrl, kEnclosures, chassis);
+    });
 }
 
 }  // namespace

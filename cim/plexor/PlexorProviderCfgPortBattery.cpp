@@ -63,11 +63,11 @@ bool ReadParts(const Builder<Record>& builder, Record* record, const CMPIInstanc
 template <typename Record>
 int Build(const Builder<Record>& builder, RaidController_t* ctrl, const CMPIInstance* devInst,
           const CMPIObjectPath* devOp) {
-    auto record = NewDevice<Record>(builder.caller, builder.kind);
-    if (record == nullptr) return RESULT_NO_MEMORY;
-    if (!ReadParts(builder, record.get(), devInst, devOp)) return RESULT_BAD_ARGUMENT;
-    builder.dump(record.get());
-    return Publish(builder.caller, ctrl, builder.kind, record);
+    return BuildRecord<Record>(builder.caller, builder.kind, [&](Record* record) -> int {
+        if (!ReadParts(builder, record, devInst, devOp)) return RESULT_BAD_ARGUMENT;
+        builder.dump(record);
+        return PublishRecord(builder.caller, ctrl, builder.kind, record);
+    });
 }
 
 template <typename Record>

@@ -77,19 +77,23 @@ int PublishWithPool(RaidController_t* ctrl, StorageVolume_t* volume) {
 
 int Build(RaidController_t* ctrl, const CMPIContext* ctx, const CMPIInstance* devInst,
           const CMPIObjectPath* devOp) {
-    auto volume = NewDevice<StorageVolume_t>(kBuilder, kVolumes);
+    auto* volume = NewDevice<StorageVolume_t>(kBuilder, kVolumes);
     if (volume == nullptr) return RESULT_NO_MEMORY;
-    if (!ReadParts(volume.get(), ctx, devInst, devOp)) return RESULT_BAD_ARGUMENT;
-    DumpVolume(volume.get());
-    ReadPool(volume.get(), ctx);
-    // After a stop the pool may not have been asked for.
-    if (volume->FromPool == nullptr && StopRequested()) return RESULT_BAD_ARGUMENT;
+    if (!ReadParts(volume, ctx, devInst, devOp)) {
+        FreeVolume(volume);
+        return RESULT_BAD_ARGUMENT;
+    }
+    DumpVolume(volume);
+    ReadPool(volume, ctx);
+    if (volume->FromPool == nullptr && StopRequested()) {
+        FreeVolume(volume);  // the pool may not have been asked for
+        return RESULT_BAD_ARGUMENT;
+    }
 
-    StorageVolume_t* const block = volume.release();
-    const int rc = PublishWithPool(ctrl, block);
-    // Only the block: what a volume that is turned away here holds stays behind. To release it
-    // would add broker calls and log lines that others do not expect here.
-    if (rc != RESULT_OK) free(block);
+    const int rc = PublishWithPool(ctrl, volume);
+    // Not by BuildRecord, and only the block: what a volume that is turned away here holds stays
+    // behind. To release it would add broker calls and log lines that others do not expect here.
+    if (rc != RESULT_OK) free(volume);
     return rc;
 }
 

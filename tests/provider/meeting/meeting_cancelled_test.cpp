@@ -60,6 +60,22 @@ TEST_F(CancelledTest, AnIdleWorkerLeavesTheOtherAtWork) {
     EXPECT_EQ(CapturedSyslog::countContaining("still busy"), 0u);
 }
 
+TEST_F(CancelledTest, ABuilderMayBeLeftWhileItReleasesWhatItTurnedAway) {
+    load();
+    CapturedSyslog::onLine([](const plexortest::LogLine& line) {
+        if (line.text != "Battery NULL deleted\n") return;
+        pthread_cancel(pthread_self());
+        pthread_testcancel();
+    });
+    auto build = [this] { BuildBatteryInfo(&mi, nullptr, firstController(), nullptr, nullptr); };
+    const pthread_t thread = start(build);
+    void* result = nullptr;
+    EXPECT_EQ(pthread_join(thread, &result), 0);
+    EXPECT_EQ(result, PTHREAD_CANCELED);
+    CapturedSyslog::onLine({});
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+}
+
 TEST_F(CancelledTest, ABusyWorkerIsCountedNoLonger) {
     load();
     static std::atomic<pthread_t> busy;
