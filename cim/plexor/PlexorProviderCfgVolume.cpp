@@ -40,7 +40,7 @@ void DumpVolume(const StorageVolume_t* volume) {
            "\tIsBasedOnUnderlyingRedundancy - %d\n\tDeltaReservation  - %d\n"
            "\tPrimordial        - %d\n\tOperationalStatus - %d\n",
            PathText(LOG_DEBUG, volume->VolumeOp), OrNull(volume->ElementName), volume->DeviceID,
-           OrNull(volume->RaidLevel), volume->NumberOfBlocks, volume->ConsumableBlocks,
+           volume->RaidLevel, volume->NumberOfBlocks, volume->ConsumableBlocks,
            volume->DataRedundancy, volume->PackageRedundancy, volume->NameFormat,
            OrNull(volume->Name), volume->NameNameSpace, volume->IsBasedOnUnderlyingRedundancy,
            volume->DeltaReservation, volume->Primordial, volume->OperationalStatus);

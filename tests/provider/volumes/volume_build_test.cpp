@@ -125,7 +125,7 @@ TEST_F(VolumeBuild, WithoutSettingHasNoRaidLevelAndSaysNothing) {
     ASSERT_EQ(buildVolume(), 0);
     EXPECT_EQ(volume()->RaidLevel, nullptr);
     EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
-    EXPECT_EQ(CapturedSyslog::countContaining("\tRaidLevel         - NULL\n"), 1u);
+    EXPECT_EQ(CapturedSyslog::countContaining("\tRaidLevel         - (null)\n"), 1u);
 }
 
 TEST_F(VolumeBuild, TakesTheFirstOfSeveralSettings) {
