@@ -4,7 +4,7 @@
 
 #include "PlexorProviderLock.h"
 
-const DeviceKind kVolumes = {
+constexpr DeviceKind kVolumes = {
     .noun = "volume",
     .recordName = "StorageVolume_t",
     .action = {ACTION_VOLUME, ACTION_DISK, "CIM_SystemDevice", "CIM_StorageVolume", "DeviceID",
@@ -17,7 +17,7 @@ const DeviceKind kVolumes = {
     .release = FreeVolume,
 };
 
-const DeviceKind kPorts = {
+constexpr DeviceKind kPorts = {
     .noun = "port",
     .recordName = "SASSATAPort_t",
     .action = {ACTION_PORT, ACTION_NONE, "CIM_SystemDevice", "CIM_SASSATAPort", "DeviceID",
@@ -30,7 +30,7 @@ const DeviceKind kPorts = {
     .release = FreePort,
 };
 
-const DeviceKind kDrives = {
+constexpr DeviceKind kDrives = {
     .noun = "disk",
     .recordName = "DiskDrive_t",
     .action = {ACTION_DISK, ACTION_POOL, "CIM_SystemDevice", "CIM_DiskDrive", "DeviceID", GetDiskOp,
@@ -43,7 +43,7 @@ const DeviceKind kDrives = {
     .release = FreeDisk,
 };
 
-const DeviceKind kBatteries = {
+constexpr DeviceKind kBatteries = {
     .noun = "battery",
     .recordName = "Battery_t",
     .action = {ACTION_BATTERY, ACTION_NONE, "CIM_SystemDevice", "CIM_Battery", "DeviceID",
@@ -56,7 +56,7 @@ const DeviceKind kBatteries = {
     .release = FreeBattery,
 };
 
-const DeviceKind kPools = {
+constexpr DeviceKind kPools = {
     .noun = "pool",
     .recordName = "StoragePool_t",
     .action = {ACTION_POOL, ACTION_NONE, "CIM_HostedStoragePool", "CIM_StoragePool", "InstanceID",
@@ -69,7 +69,7 @@ const DeviceKind kPools = {
     .release = FreePool,
 };
 
-const DeviceKind kEnclosures = {
+constexpr DeviceKind kEnclosures = {
     .noun = "chassis",
     .recordName = "Chassis_t",
     .action = {ACTION_CHASSIS, ACTION_NONE, "CIM_SystemPackaging", "CIM_Chassis", "Tag",
@@ -81,6 +81,19 @@ const DeviceKind kEnclosures = {
     .embeddedList = &RaidController_t::__ChassisList,
     .release = FreeChassis,
 };
+
+namespace {
+
+constexpr int CountCodes() {
+    int count = 0;
+    for (const DeviceKind* kind : kDeviceKinds) {
+        if (kind->deviceCode != 0) count++;
+    }
+    return count;
+}
+static_assert(CountCodes() == kDeviceCodes);
+
+}  // namespace
 
 List_t* DevicesOf(const RaidController_t* ctrl, const DeviceKind& kind) {
     ExpectHeld(ctrl->CtrlMutex, __func__);

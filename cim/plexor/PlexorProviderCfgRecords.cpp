@@ -23,7 +23,7 @@ static_assert(offsetof(Battery_t, BatteryOp) == 0);
 static_assert(offsetof(SASSATAPort_t, PortOp) == 0);
 static_assert(offsetof(Chassis_t, ChassisOp) == 0);
 
-// Not the table's order: others match the order in which the records and the locks go.
+// Not the table's order, in which the locks end: both orders are relied on outside.
 constexpr const DeviceKind* kReleaseOrder[] = {&kVolumes, &kDrives,    &kPools,
                                                &kPorts,   &kBatteries, &kEnclosures};
 static_assert(sizeof kReleaseOrder == sizeof kDeviceKinds);
