@@ -4,6 +4,11 @@ target_compile_options(plexor_flags INTERFACE
     -Wall -Wextra -Wpedantic -Wshadow -Wformat=2 -fstack-protector-strong)
 target_link_libraries(plexor_flags INTERFACE Threads::Threads)
 
+# What goes into the provider's library: hidden unless exported on purpose, and no unique symbols, which
+# would keep it mapped (clang makes none).
+add_library(plexor_hidden INTERFACE)
+target_compile_options(plexor_hidden INTERFACE
+    -fvisibility=hidden $<$<CXX_COMPILER_ID:GNU>:-fno-gnu-unique>)
 
 # What is installed runs with rights, and reads what strangers send.
 include(CheckPIESupported)
@@ -28,6 +33,8 @@ endif()
 macro(plexor_options_around)
     if(CMAKE_BUILD_TYPE STREQUAL "Release")
         add_compile_options(-O1)
+    elseif(PLEXOR_SANITIZE)
+        add_compile_options(-O0)
     endif()
     if(PLEXOR_SANITIZE_PROVIDER_ONLY)
         add_compile_options(-fno-sanitize=${PLEXOR_SANITIZE_PROVIDER_ONLY})

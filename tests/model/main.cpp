@@ -15,9 +15,10 @@
 #include "fake_host.h"
 #include "instance_client.h"
 #include "manager_kinds.h"
+#include "sanitizers.h"
 #include "vendor.h"
 
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(PLEXOR_ADDRESS_SANITIZER)
 // A volume that is turned away for want of a pool leaves its texts behind, on purpose.
 extern "C" const char* __lsan_default_suppressions() {
     return "leak:BuildVolumeInfo\n";

@@ -18,19 +18,20 @@
 #include "manager_stop.h"
 #include "polling_interval.h"
 #include "process_view.h"
+#include "sanitizers.h"
 #include "settlement.h"
 #include "vendor.h"
 #include "vendor_comparison.h"
 #include "watch.h"
 
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(PLEXOR_ADDRESS_SANITIZER)
 // A volume that is turned away for want of a pool leaves its texts behind, on purpose.
 extern "C" const char* __lsan_default_suppressions() {
     return "leak:BuildVolumeInfo\n";
 }
 #endif
 
-#if defined(__SANITIZE_THREAD__)
+#if defined(PLEXOR_THREAD_SANITIZER)
 // The sanitizer does not know the join with a deadline and takes joined workers for leaked ones;
 // the test counts the threads itself.
 extern "C" const char* __tsan_default_options() {

@@ -12,6 +12,7 @@
 #include "manager_option.h"
 #include "polling_interval.h"
 #include "process_view.h"
+#include "sanitizers.h"
 #include "scenario_parser.h"
 
 namespace torture {
@@ -22,7 +23,7 @@ constexpr int kWarmUpCycles = 100;
 constexpr std::size_t kGrowthLimitKilobytes = 16 * 1024;
 constexpr int kSkipped = 77;  // what ctest takes for a skipped test
 
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(PLEXOR_ADDRESS_SANITIZER)
 constexpr bool kMemoryIsWatched = false;  // freed memory is kept back
 #else
 constexpr bool kMemoryIsWatched = true;

@@ -82,7 +82,7 @@ TEST_F(WorkersQuiesce, NoItemBeginsInThisLifeNorByItsWorkersInTheNext) {
 
     BeginWork();
     EXPECT_FALSE(StopRequested());
-    EXPECT_TRUE(eventually([this] { return exitLines() == 2; })) << "their life is over";
+    EXPECT_TRUE(eventually([] { return exitLines() == 2; })) << "their life is over";
     EXPECT_EQ(queuedItems(), 1u);
     running_ = false;
     CleanupPlexorThreads();

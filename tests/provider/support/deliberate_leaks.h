@@ -1,7 +1,9 @@
 // Leaks that the provider makes on purpose, hidden from LeakSanitizer and from nothing else.
 #pragma once
 
-#if defined(__SANITIZE_ADDRESS__)
+#include "sanitizers.h"
+
+#if defined(PLEXOR_ADDRESS_SANITIZER)
 #include <sanitizer/lsan_interface.h>
 #endif
 
@@ -11,7 +13,7 @@ namespace plexortest {
 /// leaves something behind, so that every other leak is still found.
 class DeliberateLeaks {
 public:
-#if defined(__SANITIZE_ADDRESS__)
+#if defined(PLEXOR_ADDRESS_SANITIZER)
     DeliberateLeaks() {
         __lsan_disable();
     }
