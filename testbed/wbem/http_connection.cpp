@@ -2,9 +2,18 @@
 #include "http_connection.h"
 
 #include <algorithm>
+#include <boost/asio/co_spawn.hpp>
 #include <boost/asio/post.hpp>
+#include <boost/asio/redirect_error.hpp>
+#include <boost/asio/steady_timer.hpp>
+#include <boost/asio/use_awaitable.hpp>
+#include <boost/beast/core/buffers_to_string.hpp>
+#include <boost/beast/http/chunk_encode.hpp>
+#include <boost/beast/http/parser.hpp>
+#include <boost/beast/http/string_body.hpp>
 
 #include "access.h"
+#include "http_channel.h"
 
 namespace testbed {
 namespace {
@@ -16,6 +25,8 @@ using asio::use_awaitable;
 using asio::ip::tcp;
 using Clock = HttpConnection::Clock;
 using RequestParser = http::request_parser<http::string_body>;
+using Response = http::response<http::string_body>;
+using Outcome = std::function<HttpOutcome()>;
 
 constexpr std::size_t kReadSize = 16 * 1024;
 /// However quiet a stream is, it is asked that often.
@@ -55,8 +66,8 @@ HttpRequest requestFrom(http::request<http::string_body> message) {
 }
 
 /// Status and headers, without those that tell how long the body is.
-http::response<http::string_body> headOf(const HttpResponse& response, bool keep) {
-    http::response<http::string_body> message;
+Response headOf(const HttpResponse& response, bool keep) {
+    Response message;
     message.version(11);
     message.result(static_cast<unsigned>(response.status));
     for (const auto& [name, value] : response.headers) message.insert(name, value);
@@ -76,19 +87,20 @@ std::string namesOf(const HttpHeaders& headers) {
     return names;
 }
 
-using Plain = beast::tcp_stream;
-using Secure = beast::ssl_stream<beast::tcp_stream>;
+/// What the client did ends its connection.
+void require(const beast::error_code& error) {
+    if (error) throw beast::system_error(error);
+}
 
-template <class Stream>
 class Connection : public HttpConnection {
 public:
-    Connection(Stream stream, const HttpServerOptions& options, const HttpServer::Handler& handler,
-               HttpWorkers& workers)
-        : stream_(std::move(stream)),
+    Connection(tcp::socket socket, const HttpServerOptions& options,
+               const HttpServer::Handler& handler, HttpWorkers& workers)
+        : channel_(beast::tcp_stream(std::move(socket)),
+                   2 * std::max(options.limits.head, kReadSize)),
           options_(options),
           handler_(handler),
-          workers_(workers),
-          buffer_(2 * std::max(options.limits.head, kReadSize)) {
+          workers_(workers) {
         enter(Phase::Reading, options_.times.request);
     }
 
@@ -98,11 +110,12 @@ public:
         const Welcome welcome = options_.welcome ? options_.welcome() : Welcome::Serve;
         if (welcome == Welcome::Reset) co_return reset();
         if (welcome == Welcome::Stall) co_await swallow();
-        if constexpr (kIsSecure) {
-            co_await stream_.async_handshake(asio::ssl::stream_base::server, use_awaitable);
+        if (options_.tls) {
+            channel_.secure(*options_.tls);
+            require(co_await channel_.shakeHands(asio::ssl::stream_base::server));
         }
         for (bool keep = true; keep; enter(Phase::Reading, options_.times.idle)) {
-            if (buffer_.size() == 0) co_await receive();
+            if (!channel_.hasReceived()) co_await receive();
             enter(Phase::Reading, options_.times.request);
             RequestParser parser;
             parser.header_limit(static_cast<std::uint32_t>(options_.limits.head));
@@ -118,9 +131,7 @@ public:
     }
 
 private:
-    static constexpr bool kIsSecure = std::is_same_v<Stream, Secure>;
-
-    beast::tcp_stream& bottom() { return beast::get_lowest_layer(stream_); }
+    beast::tcp_stream& bottom() { return channel_.socket(); }
 
     void enter(Phase phase, std::chrono::milliseconds limit) {
         note(phase);
@@ -142,13 +153,13 @@ private:
     asio::awaitable<void> swallow() {
         bottom().expires_after(options_.times.stall);
         for (;;) {
-            buffer_.clear();
-            co_await bottom().async_read_some(buffer_.prepare(kReadSize), use_awaitable);
+            channel_.forgetReceived();
+            require(co_await channel_.receive(kReadSize));
         }
     }
 
     asio::awaitable<void> receive() {
-        buffer_.commit(co_await stream_.async_read_some(buffer_.prepare(kReadSize), use_awaitable));
+        require(co_await channel_.receive(kReadSize));
         refuseLate();
     }
 
@@ -158,7 +169,7 @@ private:
         while (refusal == 0 && !parser.is_header_done()) refusal = co_await readSome(parser);
         if (refusal == 0) refusal = refusalFor(parser);
         const bool waits = refusal == 0 && parser.get().count(http::field::expect) > 0 &&
-                           !parser.is_done() && buffer_.size() == 0;
+                           !parser.is_done() && !channel_.hasReceived();
         if (waits) co_await tellToGoOn();
         while (refusal == 0 && !parser.is_done()) refusal = co_await readSome(parser);
         co_return refusal;
@@ -166,9 +177,7 @@ private:
 
     asio::awaitable<int> readSome(RequestParser& parser) {
         refuseLate();
-        beast::error_code error;
-        co_await http::async_read_some(stream_, buffer_, parser,
-                                       asio::redirect_error(use_awaitable, error));
+        const beast::error_code error = co_await channel_.readSome(parser);
         if (!error) co_return 0;
         const int refusal = refusalFor(error);
         if (refusal == 0) throw beast::system_error(error);
@@ -176,8 +185,7 @@ private:
     }
 
     asio::awaitable<void> tellToGoOn() {
-        constexpr std::string_view kContinue = "HTTP/1.1 100 Continue\r\n\r\n";
-        co_await asio::async_write(stream_, asio::buffer(kContinue), use_awaitable);
+        require(co_await channel_.write("HTTP/1.1 100 Continue\r\n\r\n"));
     }
 
     HttpRequest received(RequestParser& parser) {
@@ -188,8 +196,7 @@ private:
     }
 
     /// Runs `make` on one of the workers.
-    template <class Make>
-    asio::awaitable<HttpOutcome> runOn(asio::thread_pool& workers, const Make& make) {
+    asio::awaitable<HttpOutcome> runOn(asio::thread_pool& workers, const Outcome& make) {
         const auto job = [&make]() -> asio::awaitable<HttpOutcome> {
             try {
                 co_return make();
@@ -205,11 +212,10 @@ private:
         if (!bottom().socket().is_open()) throw beast::system_error(asio::error::operation_aborted);
         enter(Phase::Working, {});
         bottom().expires_never();
-        const auto begin = [&]() -> HttpOutcome { return handler_(request); };
+        const Outcome begin = [&] { return handler_(request); };
         HttpOutcome outcome = co_await runOn(workers_.quick, begin);
         if (const auto* slow = std::get_if<SlowWork>(&outcome)) {
-            const SlowWork rest = *slow;
-            const auto finish = [&]() -> HttpOutcome { return rest(); };
+            const Outcome finish = [rest = *slow] { return rest(); };
             outcome = co_await runOn(workers_.slow, finish);
         }
         co_return std::get<HttpResponse>(std::move(outcome));
@@ -218,7 +224,7 @@ private:
     asio::awaitable<void> respond(HttpResponse response, bool keep) {
         const HttpMishap& mishap = response.mishap;
         if (mishap.delay.count() > 0) {
-            asio::steady_timer timer(stream_.get_executor(), mishap.delay);
+            asio::steady_timer timer(bottom().get_executor(), mishap.delay);
             co_await timer.async_wait(use_awaitable);
         }
         enter(Phase::Writing, options_.times.response);
@@ -228,45 +234,41 @@ private:
             co_await writeWithTrailers(std::move(message), response);
             co_return;
         }
-        message.body() = std::move(response.body);
-        message.prepare_payload();
-        if (mishap.cutAt && *mishap.cutAt < message.body().size()) {
-            message.body().resize(*mishap.cutAt);  // the length stays that of the whole
+        message.content_length(response.body.size());
+        std::string& body = response.body;
+        if (mishap.cutAt && *mishap.cutAt < body.size()) {
+            body.resize(*mishap.cutAt);  // the length stays that of the whole
         }
-        co_await http::async_write(stream_, message, use_awaitable);
+        require(co_await channel_.write(headText(message) + body));
     }
 
-    asio::awaitable<void> writeWithTrailers(http::response<http::string_body> head,
-                                            const HttpResponse& response) {
-        http::response<http::empty_body> message(std::move(head.base()));
+    asio::awaitable<void> writeWithTrailers(Response message, const HttpResponse& response) {
         message.set(http::field::trailer, namesOf(response.mishap.trailers));
         message.chunked(true);
-        http::response_serializer<http::empty_body> serializer(message);
-        co_await http::async_write_header(stream_, serializer, use_awaitable);
+        require(co_await channel_.write(headText(message)));
         if (!response.body.empty()) {
-            co_await asio::async_write(stream_, http::make_chunk(asio::buffer(response.body)),
-                                       use_awaitable);
+            const auto chunk = http::make_chunk(asio::buffer(response.body));
+            require(co_await channel_.write(beast::buffers_to_string(chunk)));
         }
         const http::fields trailers = fieldsOf(response.mishap.trailers);
-        co_await asio::async_write(stream_, http::make_chunk_last(trailers), use_awaitable);
+        const auto end = http::make_chunk_last(trailers);
+        require(co_await channel_.write(beast::buffers_to_string(end)));
     }
 
     /// Sends what the stream has until the client goes. The connection ends with it, so that the
     /// body needs no length.
-    asio::awaitable<void> follow(http::response<http::string_body> head, HttpStream& source) {
-        const auto timer = std::make_shared<asio::steady_timer>(stream_.get_executor());
-        source.onNews([executor = stream_.get_executor(), weak = std::weak_ptr(timer)] {
+    asio::awaitable<void> follow(Response message, HttpStream& source) {
+        const auto timer = std::make_shared<asio::steady_timer>(bottom().get_executor());
+        source.onNews([executor = bottom().get_executor(), weak = std::weak_ptr(timer)] {
             asio::post(executor, [weak] {
                 if (const auto waiting = weak.lock()) waiting->cancel();
             });
         });
-        http::response<http::empty_body> message(std::move(head.base()));
-        http::response_serializer<http::empty_body> serializer(message);
-        co_await http::async_write_header(stream_, serializer, use_awaitable);
+        require(co_await channel_.write(headText(message)));
         for (;;) {
             enter(Phase::Streaming, options_.times.response);
             while (const HttpStream::Text text = source.next()) {
-                co_await asio::async_write(stream_, asio::buffer(*text), use_awaitable);
+                require(co_await channel_.write(*text));
                 enter(Phase::Streaming, options_.times.response);
             }
             bottom().expires_never();
@@ -282,22 +284,21 @@ private:
     /// Closing while the client still sends would reset the connection and lose the response.
     asio::awaitable<void> drain() {
         enter(Phase::Draining, options_.times.drain);
-        if constexpr (kIsSecure) {
-            co_await stream_.async_shutdown(use_awaitable);
+        if (options_.tls) {
+            require(co_await channel_.shutDownTls());
             co_return;
         }
         bottom().socket().shutdown(tcp::socket::shutdown_send);
         for (;;) {
-            buffer_.clear();
+            channel_.forgetReceived();
             co_await receive();
         }
     }
 
-    Stream stream_;
+    HttpChannel channel_;
     const HttpServerOptions& options_;
     const HttpServer::Handler& handler_;
     HttpWorkers& workers_;
-    beast::flat_buffer buffer_;
     Clock::time_point deadline_;
 };
 
@@ -306,12 +307,7 @@ private:
 std::unique_ptr<HttpConnection> makeConnection(tcp::socket socket, const HttpServerOptions& options,
                                                const HttpServer::Handler& handler,
                                                HttpWorkers& workers) {
-    if (!options.tls) {
-        return std::make_unique<Connection<Plain>>(Plain(std::move(socket)), options, handler,
-                                                   workers);
-    }
-    return std::make_unique<Connection<Secure>>(Secure(std::move(socket), *options.tls), options,
-                                                handler, workers);
+    return std::make_unique<Connection>(std::move(socket), options, handler, workers);
 }
 
 }  // namespace testbed

@@ -11,14 +11,14 @@
 #include <boost/asio/ssl.hpp>
 #include <boost/asio/use_awaitable.hpp>
 #include <boost/asio/use_future.hpp>
-#include <boost/beast/core/flat_buffer.hpp>
-#include <boost/beast/core/tcp_stream.hpp>
-#include <boost/beast/http.hpp>
-#include <boost/beast/ssl.hpp>
+#include <boost/beast/http/parser.hpp>
+#include <boost/beast/http/string_body.hpp>
 #include <cerrno>
 #include <fstream>
 #include <system_error>
 #include <utility>
+
+#include "http_channel.h"
 
 namespace testbed {
 namespace {
@@ -31,7 +31,6 @@ using asio::use_awaitable;
 using asio::ip::tcp;
 using Clock = std::chrono::steady_clock;
 using ResponseParser = http::response_parser<http::string_body>;
-using TlsStream = beast::ssl_stream<beast::tcp_stream&>;
 
 constexpr const char* kLate = "no answer in time";
 constexpr std::uint32_t kLargestHead = 64 * 1024;
@@ -91,15 +90,14 @@ void expectHost(SSL* session, const std::string& host, bool verify) {
     }
 }
 
-http::request<http::string_body> messageFrom(const PostRequest& request) {
+http::request_header<> headOf(const PostRequest& request) {
     http::request<http::string_body> message(http::verb::post, request.path, 11);
     message.set(http::field::host, request.authority);
     message.keep_alive(false);
     message.set(http::field::te, "trailers");  // a status may follow the body
     for (const auto& [name, value] : request.headers) message.insert(name, value);
-    message.body() = request.body;
-    message.prepare_payload();
-    return message;
+    message.content_length(request.body.size());
+    return std::move(message.base());
 }
 
 PostAnswer answerFrom(http::response<http::string_body> message) {
@@ -125,14 +123,14 @@ public:
 
 private:
     asio::awaitable<PostAnswer> exchange() {
-        co_await connect();
-        stream_->expires_at(bounds_.deadline);
-        if (!request_.tls) co_return co_await ask(*stream_);
+        HttpChannel channel(co_await connect(), kBufferSize);
+        channel.socket().expires_at(bounds_.deadline);
+        if (!request_.tls) co_return co_await ask(channel);
         ssl::context context = contextFor(*request_.tls);
-        TlsStream secure(*stream_, context);
-        expectHost(secure.native_handle(), request_.host, request_.tls->verify);
-        co_await shakeHands(secure);
-        co_return co_await ask(secure);
+        SSL* session = channel.secure(context).native_handle();
+        expectHost(session, request_.host, request_.tls->verify);
+        co_await shakeHands(channel, session);
+        co_return co_await ask(channel);
     }
 
     tcp::resolver::results_type addresses() {
@@ -144,16 +142,16 @@ private:
     }
 
     /// Tries the host's addresses one after the other.
-    asio::awaitable<void> connect() {
+    asio::awaitable<beast::tcp_stream> connect() {
         const auto found = addresses();
         std::size_t left = found.size();
         beast::error_code error;
         for (const auto& address : found) {
-            stream_.emplace(io_);
-            stream_->expires_at(deadlineWith(--left));
-            co_await stream_->async_connect(address.endpoint(),
-                                            asio::redirect_error(use_awaitable, error));
-            if (!error) co_return;
+            beast::tcp_stream stream(io_);
+            stream.expires_at(deadlineWith(--left));
+            co_await stream.async_connect(address.endpoint(),
+                                          asio::redirect_error(use_awaitable, error));
+            if (!error) co_return stream;
         }
         if (error == beast::error::timeout) error = asio::error::timed_out;
         throw WbemError("no connection: " + error.message());
@@ -166,12 +164,10 @@ private:
                                                       : now + (bounds_.deadline - now) / 2;
     }
 
-    asio::awaitable<void> shakeHands(TlsStream& stream) {
-        beast::error_code error;
-        co_await stream.async_handshake(ssl::stream_base::client,
-                                        asio::redirect_error(use_awaitable, error));
+    static asio::awaitable<void> shakeHands(HttpChannel& channel, SSL* session) {
+        const beast::error_code error = co_await channel.shakeHands(ssl::stream_base::client);
         if (!error) co_return;
-        const long verdict = SSL_get_verify_result(stream.native_handle());
+        const long verdict = SSL_get_verify_result(session);
         if (verdict != X509_V_OK) {
             throw WbemError("the server's certificate is not trusted: " +
                             std::string(X509_verify_cert_error_string(verdict)));
@@ -180,31 +176,25 @@ private:
         failTls(error);
     }
 
-    template <class Stream>
-    asio::awaitable<PostAnswer> ask(Stream& stream) {
-        const http::request<http::string_body> message = messageFrom(request_);
-        beast::error_code error;
-        co_await http::async_write(stream, message, asio::redirect_error(use_awaitable, error));
+    asio::awaitable<PostAnswer> ask(HttpChannel& channel) {
+        const auto error = co_await channel.write(headText(headOf(request_)) + request_.body);
         if (error) fail("the server takes no request", error);
         std::optional<ResponseParser> parser;
         do {
             parser.emplace();
             parser->header_limit(kLargestHead);
             parser->body_limit(bounds_.largestBody);
-            while (!parser->is_header_done()) co_await readSome(stream, *parser);
+            while (!parser->is_header_done()) co_await readSome(channel, *parser);
         } while (parser->get().result_int() / 100 == 1);  // the real one follows
         refuseCodings(*parser);
-        while (!parser->is_done()) co_await readSome(stream, *parser);
+        while (!parser->is_done()) co_await readSome(channel, *parser);
         co_return answerFrom(parser->release());
     }
 
-    template <class Stream>
-    asio::awaitable<void> readSome(Stream& stream, ResponseParser& parser) {
+    asio::awaitable<void> readSome(HttpChannel& channel, ResponseParser& parser) {
         // The stream's own deadline does not stop a peer whose bytes are always there already.
         if (Clock::now() >= bounds_.deadline) throw WbemError(kLate);
-        beast::error_code error;
-        co_await http::async_read_some(stream, buffer_, parser,
-                                       asio::redirect_error(use_awaitable, error));
+        const beast::error_code error = co_await channel.readSome(parser);
         if (error) failRead(error);
     }
 
@@ -237,8 +227,6 @@ private:
     const PostRequest& request_;
     const PostBounds& bounds_;
     asio::io_context io_{1};
-    std::optional<beast::tcp_stream> stream_;
-    beast::flat_buffer buffer_{kBufferSize};
 };
 
 }  // namespace

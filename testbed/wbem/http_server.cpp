@@ -2,9 +2,13 @@
 #include "http_server.h"
 
 #include <algorithm>
+#include <boost/asio/co_spawn.hpp>
 #include <boost/asio/detached.hpp>
 #include <boost/asio/io_context.hpp>
 #include <boost/asio/post.hpp>
+#include <boost/asio/redirect_error.hpp>
+#include <boost/asio/steady_timer.hpp>
+#include <boost/asio/use_awaitable.hpp>
 #include <list>
 #include <stdexcept>
 #include <thread>
@@ -16,14 +20,13 @@ namespace testbed {
 namespace {
 
 namespace asio = boost::asio;
-namespace beast = boost::beast;
 using asio::use_awaitable;
 using asio::ip::tcp;
 
 constexpr std::chrono::milliseconds kPause{200};
 
 tcp::acceptor listenOn(asio::io_context& io, const HttpServerOptions& options) {
-    beast::error_code error;
+    boost::system::error_code error;
     const tcp::endpoint endpoint(asio::ip::make_address(options.address, error), options.port);
     tcp::acceptor acceptor(io);
     if (!error) acceptor.open(endpoint.protocol(), error);
@@ -62,7 +65,7 @@ public:
 
     void listen(bool wanted) {
         asio::post(io_, [this, wanted] {
-            beast::error_code error;
+            boost::system::error_code error;
             if (!wanted) {
                 acceptor_.close(error);
             } else if (!acceptor_.is_open()) {
@@ -74,7 +77,7 @@ public:
 private:
     asio::awaitable<void> accept() {
         for (;;) {
-            beast::error_code error;
+            boost::system::error_code error;
             tcp::socket socket =
                 co_await acceptor_.async_accept(asio::redirect_error(use_awaitable, error));
             if (error) {
@@ -87,7 +90,7 @@ private:
 
     /// Out of descriptors: a client is given up for the next one. Else, and while nothing is to be
     /// accepted, there is a pause.
-    asio::awaitable<void> recover(beast::error_code error) {
+    asio::awaitable<void> recover(boost::system::error_code error) {
         const bool exhausted = error == asio::error::no_descriptors ||
                                error == boost::system::errc::too_many_files_open_in_system;
         if (exhausted && makeRoom()) co_return;
