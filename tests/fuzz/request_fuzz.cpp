@@ -10,7 +10,7 @@
 namespace {
 
 /// A vendor with one of each kind, so that every operation has something to find.
-constexpr const char* kArray = R"({"controllers": [{"id": "C0",
+constexpr const char* kServedArray = R"({"controllers": [{"id": "C0",
     "pools": [{"id": "p0"}],
     "drives": [{"id": "d0", "pool": "p0"}],
     "volumes": [{"id": "v0", "pool": "p0"}],
@@ -19,7 +19,7 @@ constexpr const char* kArray = R"({"controllers": [{"id": "C0",
 
 class Server {
 public:
-    Server() { testbed::buildVendor(repository_, testbed::parseScenario(kArray, "array")); }
+    Server() { testbed::buildVendor(repository_, testbed::parseScenario(kServedArray, "array")); }
 
     testbed::HttpResponse answer(const testbed::HttpRequest& request) const {
         testbed::HttpOutcome outcome = server_.answer(request);
