@@ -37,7 +37,8 @@ public:
                                      : input.number<std::uint16_t>();
         // An address that nobody may read, unless it is a text's, which has a value.
         answer_.value.uint64 = input.number<std::uint64_t>();
-        const bool hasValue = (answer_.state & ~CMPI_keyValue) == 0;
+        constexpr int kNoValue = CMPI_nullValue | CMPI_badValue | CMPI_notFound;
+        const bool hasValue = (answer_.state & kNoValue) == 0;
         const bool isThere = input.flag();
         if (answer_.type == CMPI_string && hasValue) {
             answer_.value.string = isThere ? &string_ : nullptr;
