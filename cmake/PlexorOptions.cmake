@@ -13,6 +13,7 @@ option(PLEXOR_CHECK_LOCKS "Tell on standard error of a call without the locks th
 set(PLEXOR_SANITIZE_PROVIDER_ONLY "" CACHE STRING
     "Those of PLEXOR_SANITIZE that the test bed, the tests and the benchmarks go without")
 option(PLEXOR_COVERAGE "Instrument for coverage" OFF)
+option(PLEXOR_FUZZ "Instrument for libFuzzer, and link the harnesses of tests/fuzz with it (clang)" OFF)
 
 # The two builds must not be taken for one another, so their packages have names of their own. What
 # `cmake --install` installs is the configured one; packages are made of both.

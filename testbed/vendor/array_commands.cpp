@@ -127,9 +127,10 @@ json& controllerIn(json& document, const Words& words, std::size_t i) {
     return elementIn(document, "controllers", "controller", text(words, i, "the controller"));
 }
 
+/// Of several pools none.
 std::string poolOf(const json& drive) {
     const auto pool = drive.find("pool");
-    return pool != drive.end() && pool->is_string() ? pool->get<std::string>() : "";
+    return pool != drive.end() && !pool->is_array() ? textIn(drive, "pool") : "";
 }
 
 /// The pool in which the drive had its place, as the pools remember it or as the drive says.
@@ -148,7 +149,7 @@ void replaceDrive(json& controller, json& drive) {
     const std::string id = idOf(drive);
     drive.erase("before");
     for (const json& other : controller["drives"]) {
-        if (other.value("spareFor", "") != id) continue;
+        if (textIn(other, "spareFor") != id) continue;
         movePool(drive, poolOf(other));
         return setState(drive, "copy back");
     }

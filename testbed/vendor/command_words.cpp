@@ -87,6 +87,15 @@ private:
     std::size_t at_ = 0;
 };
 
+/// What is in a document can be written; JSON has only texts in UTF-8.
+void requireUtf8(const std::string& command) {
+    try {
+        json(command).dump();
+    } catch (const json::type_error&) {
+        refuseCommand("it is not in UTF-8");
+    }
+}
+
 }  // namespace
 
 void refuseCommand(const std::string& what) {
@@ -99,6 +108,7 @@ std::string quotedWord(const std::string& text) {
 }
 
 std::vector<CommandWord> commandWords(const std::string& command) {
+    requireUtf8(command);
     WordReader reader(command);
     std::vector<CommandWord> words;
     for (CommandWord word; reader.next(word);) words.push_back(std::move(word));

@@ -25,7 +25,7 @@ FaultRule readFault(const JsonPlace& place) {
     rule.name = reader.optionalText("name");
     rule.pathContains = reader.optionalText("pathContains");
     rule.skip = static_cast<int>(reader.number("skip", INT32_MAX).value_or(0));
-    rule.times = static_cast<int>(reader.signedNumber("times", -1));
+    rule.times = reader.integer("times", -1);
     rule.rc = static_cast<CMPIrc>(reader.number("rc", INT32_MAX).value_or(CMPI_RC_OK));
     rule.message = reader.optionalText("message");
     rule.nullResult = reader.flag("nullResult");

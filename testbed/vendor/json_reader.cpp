@@ -2,6 +2,7 @@
 #include "json_reader.h"
 
 #include <charconv>
+#include <climits>
 
 namespace testbed {
 
@@ -16,12 +17,16 @@ bool isNumber(const std::string& text) {
 
 }  // namespace
 
+std::string textIn(const json& object, const char* name) {
+    const auto member = object.find(name);
+    if (member == object.end()) return "";
+    return member->is_string() ? member->get<std::string>() : member->dump();
+}
+
 std::string idOf(const json& element) {
     if (!element.is_object()) return "";
     for (const char* name : {"id", "number", "tag"}) {
-        const auto member = element.find(name);
-        if (member == element.end()) continue;
-        return member->is_string() ? member->get<std::string>() : member->dump();
+        if (element.contains(name)) return textIn(element, name);
     }
     return "";
 }
@@ -111,11 +116,18 @@ std::uint16_t JsonReader::number16(const std::string& name, std::uint16_t absent
     return static_cast<std::uint16_t>(number(name, UINT16_MAX).value_or(absent));
 }
 
-std::int64_t JsonReader::signedNumber(const std::string& name, std::int64_t absent) {
+int JsonReader::integer(const std::string& name, int absent) {
     const auto member = take(name);
     if (!member) return absent;
-    if (!member->value->is_number_integer()) member->fail("a whole number is needed here");
-    return member->value->get<std::int64_t>();
+    const json& value = *member->value;
+    const bool fits = value.is_number_unsigned()
+                          ? value.get<std::uint64_t>() <= INT_MAX
+                          : value.is_number_integer() && value.get<std::int64_t>() >= INT_MIN;
+    if (!fits) {
+        member->fail("a whole number from " + std::to_string(INT_MIN) + " to " +
+                     std::to_string(INT_MAX) + " is needed here");
+    }
+    return value.get<int>();
 }
 
 std::vector<std::string> JsonReader::texts(const std::string& name) {

@@ -26,6 +26,9 @@ struct PlacedError : ScenarioError {
 /// their id.
 enum class ElementNames { Numbers, Ids };
 
+/// A member that is a text or a number in the place of one, as its text; "" without it.
+std::string textIn(const nlohmann::json& object, const char* name);
+
 /// The id of a list's element as the scenario has it: text or number; "" without one.
 std::string idOf(const nlohmann::json& element);
 
@@ -64,7 +67,8 @@ public:
     std::optional<std::uint64_t> number(const std::string& name,
                                         std::uint64_t maximum = UINT64_MAX);
     std::uint16_t number16(const std::string& name, std::uint16_t absent);
-    std::int64_t signedNumber(const std::string& name, std::int64_t absent);
+    /// A whole number that an int holds.
+    int integer(const std::string& name, int absent);
     /// A text, or a list of texts.
     std::vector<std::string> texts(const std::string& name);
     /// A number of a value map, given as itself or as its word.

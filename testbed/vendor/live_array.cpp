@@ -7,6 +7,7 @@
 #include <fstream>
 
 #include "array_commands.h"
+#include "json_reader.h"
 #include "scenario_parser.h"
 #include "vendor.h"
 
@@ -90,6 +91,9 @@ void LiveArray::apply(const std::string& command) {
     json document = document_;
     changeArray(document, command);
     if (document == document_) return;
+    // A command may add a repeated element; what follows looks for each of them by its id.
+    limitRepetitions({&document, "command", "", ElementNames::Ids});
+    expandRepetitions(document);
     Aftermath aftermath;
     if (scenario_.consequences.enabled) aftermath = followChange(document, scenario_, "command");
     adopt(std::move(document));

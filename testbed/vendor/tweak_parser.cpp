@@ -44,8 +44,13 @@ int bitsOf(CMPIType type) {
 CimValue signedValue(const JsonPlace& place, CMPIType type) {
     const std::int64_t limit = std::numeric_limits<std::int64_t>::max() >> (64 - bitsOf(type));
     if (!place.value->is_number_integer()) place.fail("a whole number is needed here");
+    // The largest ones that JSON has would be negative here.
+    const bool isTooLarge =
+        place.value->is_number_unsigned() && place.value->get<std::uint64_t>() > INT64_MAX;
     const std::int64_t number = place.value->get<std::int64_t>();
-    if (number > limit || number < -limit - 1) place.fail("the number does not fit its type");
+    if (isTooLarge || number > limit || number < -limit - 1) {
+        place.fail("the number does not fit its type");
+    }
     return CimValue::signedInteger(type, number);
 }
 

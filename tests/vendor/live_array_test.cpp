@@ -102,6 +102,38 @@ TEST_F(LiveArrayTest, RefusedCommandsChangeNothingAndSayWhy) {
     EXPECT_EQ(drive("d0"), "2/2 G");
 }
 
+// Each of these ended the program, at once or when the array was saved.
+TEST_F(LiveArrayTest, ATextThatIsNotInUtf8IsRefusedWithItsCommand) {
+    EXPECT_EQ(refusal("add battery C0 id=\xff= state=learning"), "command: it is not in UTF-8");
+    EXPECT_EQ(refusal("set controller C0 model=\xff"), "command: it is not in UTF-8");
+    array_->save(file_);
+    EXPECT_EQ(refusal("set controller C0 model=\xc3\xa9"), "");
+    array_->save(file_);
+}
+
+TEST_F(LiveArrayTest, ADriveIsReplacedBesideASpareForANumber) {
+    array_->apply("set drive C0 large spareFor=7");
+    array_->apply("replace drive C0 d0");
+    EXPECT_EQ(refusal("add drive C0 id=1 pool=Primordial"), "");
+    EXPECT_EQ(refusal("replace drive C0 1"), "");
+}
+
+TEST_F(LiveArrayTest, RepeatedDrivesThatACommandAddsFillTheLostOnesPlace) {
+    for (const char* spare : {"small", "large", "fit"}) {
+        array_->apply(std::string("remove drive C0 ") + spare);
+    }
+    array_->apply("fail drive C0 d0");
+    array_->apply("add drive C0 id=x{n} count=2 pool=G capacityGB=100");
+    const auto& drives = controller().drives;
+    ASSERT_EQ(drives.size(), 6u);
+    EXPECT_EQ(drives[4].id, "x0");
+    EXPECT_EQ(drives[4].spareFor, "d0");
+    EXPECT_EQ(drives[5].id, "x1");
+    EXPECT_EQ(refusal("add drive C0 id=y{n} count=100001"),
+              "command: controllers[C0].drives[y{n}].count: a whole number from 0 to 100000 is "
+              "needed here");
+}
+
 TEST_F(LiveArrayTest, ANewStateIsNotOverruledByOldNumbers) {
     array_->apply("set drive C0 d0 operationalStatus=99");
     EXPECT_EQ(drive("d0"), "99/2 G");

@@ -161,8 +161,25 @@ TEST(ScenarioError, OverridesMustFitTheirType) {
     EXPECT_EQ(errorWith(R"({"type": "uint16"})"), place + ": \"value\" is missing");
     EXPECT_EQ(errorWith(R"({"type": "sint8", "value": -129})"),
               place + ".value: the number does not fit its type");
+    // Was taken for -1.
+    EXPECT_EQ(errorWith(R"({"type": "sint64", "value": 18446744073709551615})"),
+              place + ".value: the number does not fit its type");
     EXPECT_EQ(errorWith(R"({"type": "uint16[]", "value": 1})"),
               place + ".value: a list is needed here, or an explicit type");
+}
+
+// They were taken for what is left of them in an int.
+TEST(ScenarioError, TimesThatNoIntHoldsAreRefused) {
+    const auto errorWith = [](const std::string& times) {
+        return scenarioError(R"({"faults": [{"call": "associators", "times": )" + times + "}]}");
+    };
+    for (const char* times :
+         {"2147483648", "-2147483649", "18446744073709551615", "1.0", "\"1\""}) {
+        EXPECT_EQ(errorWith(times),
+                  "x.json: faults[0].times: a whole number from -2147483648 to 2147483647 is "
+                  "needed here")
+            << times;
+    }
 }
 
 TEST(ScenarioError, FaultsAndLatencyAreChecked) {

@@ -1,0 +1,69 @@
+// Live commands, one a line, to an array of a few devices, and the time that they take. What the
+// array becomes must be a scenario that can be written and read.
+#include <string>
+
+#include "fuzz_target.h"
+#include "input_file.h"
+#include "live_array.h"
+#include "scenario_parser.h"
+
+namespace {
+
+/// Each command describes the vendor's objects before and after it: there are few of them.
+constexpr const char* kLiveArray = R"({"controllers": [{"id": "C0",
+    "pools": [{"id": "free", "primordial": true}, {"id": "DG", "members": ["a", "b"]}],
+    "enclosures": [{"number": 8}],
+    "drives": [{"id": "a", "pool": "DG", "enclosure": 8, "slot": 1}, {"id": "b", "pool": "DG"},
+               {"id": "s", "state": "hot spare"}],
+    "volumes": [{"id": "v", "pool": "DG", "raid": "RAID1"}],
+    "ports": [{"id": "0"}], "batteries": [{"id": "0"}]}],
+    "timeline": [{"at": 30, "command": "fail drive C0 a"}]})";
+constexpr int kMostCommands = 12;
+
+/// One for all inputs: most of an array's cost is that of its classes, which no command changes.
+class Session {
+public:
+    /// Everything but the time is as in the beginning.
+    void begin() { array_.reset(); }
+    void carryOut(const std::string& line) {
+        try {
+            array_.apply(line);
+        } catch (const testbed::ScenarioError& error) {
+            fuzz::require(*error.what() != '\0', "a refusal has a text");
+        }
+    }
+    void pass(double seconds) { array_.advance(now_ += seconds); }
+    void saveAndRead() const {
+        array_.save(saved_.name());
+        testbed::readScenario(saved_.name());
+    }
+
+private:
+    /// The name of a file with the array.
+    static std::string arrayIn(const fuzz::InputFile& file) {
+        file.write(kLiveArray);
+        return file.name();
+    }
+
+    const fuzz::InputFile file_;
+    const fuzz::InputFile saved_;
+    testbed::Repository repository_;
+    testbed::Broker broker_{repository_};
+    testbed::LiveArray array_{broker_, arrayIn(file_)};
+    double now_ = 0;
+};
+
+}  // namespace
+
+PLEXOR_FUZZ_HARNESS(commands) {
+    static Session session;
+    session.begin();
+    for (int i = 0; i < kMostCommands && !bytes.empty(); i++) {
+        const std::string line(bytes.substr(0, bytes.find('\n')));
+        bytes.remove_prefix(std::min(line.size() + 1, bytes.size()));
+        // A hundred thousand things by one command would only take long.
+        if (line.find("count") == std::string::npos || line.size() < 40) session.carryOut(line);
+        session.pass(25);
+    }
+    session.saveAndRead();
+}
