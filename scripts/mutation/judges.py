@@ -1,4 +1,4 @@
-"""Who may notice a mutant: the provider's tests, clang's look at the locks, the thread sanitizer."""
+"""Who may notice a mutant: the provider's tests, clang's look at the locks, the sanitizers."""
 
 import heapq
 import json
@@ -61,7 +61,7 @@ class Program:
 
     def __init__(self, path, limited):
         self.path = path
-        self.limited = limited  # the thread sanitizer needs all addresses
+        self.limited = limited  # the sanitizers need all addresses
 
     def _limits(self):
         resource.setrlimit(resource.RLIMIT_CORE, (0, 0))
@@ -117,8 +117,9 @@ class Program:
     def _failure(process, output):
         output.seek(0)
         text = output.read().decode(errors="replace")
-        if "WARNING: ThreadSanitizer" in text:
-            return Outcome(True, "thread sanitizer")
+        found = re.search(r"(\w+Sanitizer: [\w -]+)", text)
+        if found is not None:
+            return Outcome(True, found[1].strip())
         found = re.search(r"^\[  FAILED  \] ([^\s,]+)", text, re.MULTILINE)
         if found is not None:
             return Outcome(True, f"test {found[1]}", found[1])
@@ -224,9 +225,9 @@ def clang_refuses(tree, mutant):
     return subprocess.run(command, capture_output=True).returncode != 0
 
 
-def sanitizer_refuses(tree, mutant, limit=900):
-    """What the tests under the thread sanitizer say of the mutant in the copy; None for nothing."""
-    if not (tree.compiles(mutant, "tsan") and tree.links("tsan")):
-        raise TreeError(f"{mutant.title()}\ndoes not build with the thread sanitizer")
-    outcome = Program(tree.program("tsan"), limited=False).run([None], limit)
-    return outcome.why if outcome.failed else None
+def sanitizer_refuses(tree, mutant, preset, limit=900):
+    """What the tests under a sanitizer say of the mutant in the copy; None for nothing."""
+    if not (tree.compiles(mutant, preset) and tree.links(preset)):
+        raise TreeError(f"{mutant.title()}\ndoes not build as {preset}")
+    outcome = Program(tree.program(preset), limited=False).run([None], limit)
+    return f"{preset}: {outcome.why}" if outcome.failed else None

@@ -24,14 +24,14 @@ class Verdict:
 class Worker:
     """One copy of the tree with its judges."""
 
-    def __init__(self, checkout, folder, build_jobs, tsan):
+    def __init__(self, checkout, folder, build_jobs, sanitizers):
         self.tree = Tree(checkout, folder, build_jobs)
         self.tree.update()
         self.tree.configure("release")
         self.tests = Tests(self.tree.program("release"))
-        self.tsan = tsan
-        if tsan:
-            self.tree.configure("tsan")
+        self.sanitizers = sanitizers
+        for preset in sanitizers:
+            self.tree.configure(preset)
 
     def judge(self, mutant):
         with self.tree.with_mutant(mutant):
@@ -50,13 +50,15 @@ class Worker:
                 return Verdict(mutant, NOT_COMPILED, [])
             why = self.tests.judge(mutant.file)
             by += [why] if why else []
-        if threads and self.tsan and not by:
-            why = sanitizer_refuses(self.tree, mutant)
-            by += [why] if why else []
+        for preset in self.sanitizers:
+            if not by and (preset != "tsan" or threads):
+                why = sanitizer_refuses(self.tree, mutant, preset)
+                by += [why] if why else []
         if by:
             return Verdict(mutant, KILLED, by)
         # Whether an access is atomic shows in what the processor does now and then, if at all.
-        return Verdict(mutant, FOR_SANITIZER if threads and not self.tsan else SURVIVED, [])
+        left = threads and "tsan" not in self.sanitizers
+        return Verdict(mutant, FOR_SANITIZER if left else SURVIVED, [])
 
 
 class Report:
