@@ -15,8 +15,9 @@ from pathlib import Path
 from mutation.tree import SOURCES, TreeError
 
 QUICK_SECONDS = 0.1  # tests that take longer come last, several at a time
+OTHERS_SECONDS = 60  # what a program with a few quick tests gets
 SLOW_AT_ONCE = 4  # they wait more than they compute
-MEMORY = 6 << 30  # a mutant may allocate for ever
+MEMORY = 4 << 30  # in use: a mutant may allocate for ever, and checkers reserve addresses without end
 OUTPUT = 64 << 20
 
 # Folders of tests/provider in which a source's own tests are, by the beginning of its name.
@@ -59,15 +60,13 @@ def near_folders(file):
 class Program:
     """The test program of a build."""
 
-    def __init__(self, path, limited):
+    def __init__(self, path):
         self.path = path
-        self.limited = limited  # the sanitizers need all addresses
 
-    def _limits(self):
+    @staticmethod
+    def _limits():
         resource.setrlimit(resource.RLIMIT_CORE, (0, 0))
         resource.setrlimit(resource.RLIMIT_FSIZE, (OUTPUT, OUTPUT))
-        if self.limited:
-            resource.setrlimit(resource.RLIMIT_AS, (MEMORY, MEMORY))
 
     def start(self, tests, output, *flags):
         """Starts those tests, or all; (process, file with the filter)."""
@@ -110,6 +109,8 @@ class Program:
             else:
                 if time.monotonic() > deadline:
                     return Outcome(True, "hangs")
+                if any(memory_of(entry[0]) > MEMORY for entry in left):
+                    return Outcome(True, "takes all memory")
                 time.sleep(0.02)
         return Outcome(False)
 
@@ -128,6 +129,15 @@ class Program:
         return Outcome(True, f"exit status {process.returncode}")
 
 
+def memory_of(process):
+    """What a process has in use; nothing when it has just ended."""
+    try:
+        pages = int(Path(f"/proc/{process.pid}/statm").read_text().split()[1])
+    except (OSError, IndexError):
+        return 0
+    return pages * resource.getpagesize()
+
+
 def end(process):
     if process.poll() is None:
         os.killpg(process.pid, signal.SIGKILL)
@@ -137,8 +147,9 @@ def end(process):
 class Tests:
     """The release build's tests as judge: the mutant's own ones first, those that wait last."""
 
-    def __init__(self, program):
-        self.program = Program(program, limited=True)
+    def __init__(self, program, others):
+        self.program = Program(program)
+        self.others = [Program(path) for path in others]
         self.tests = self._measure()
         self.times = {test.name: test for test in self.tests}
 
@@ -147,13 +158,13 @@ class Tests:
         with tempfile.TemporaryDirectory() as folder, tempfile.TemporaryFile() as output:
             report = Path(folder) / "report.json"
             process, flagfile = self.program.start(None, output, f"--gtest_output=json:{report}")
-            process.wait()
+            status = process.wait()
             flagfile.close()
-            if not report.is_file():
+            tests, failed = self._read(report)
+            if status != 0 and not failed:  # it has not run to its end, or leaks
                 output.seek(0)
-                raise TreeError("the tests do not run without a mutant:\n" +
+                raise TreeError("the test program fails without a mutant:\n" +
                                 output.read().decode(errors="replace")[-4000:])
-            tests, failed = self._read(json.loads(report.read_text()))
         for test in failed:
             # One that a busy machine made fail does not do so alone.
             if self.program.run([[test]], self._limit([[test]])).failed:
@@ -164,7 +175,8 @@ class Tests:
     def _read(report):
         """All tests, and those of them that failed."""
         tests, failed = [], []
-        for suite in report["testsuites"]:
+        suites = json.loads(report.read_text())["testsuites"] if report.is_file() else []
+        for suite in suites:
             for entry in suite["testsuite"]:
                 test = Test(f"{entry['classname']}.{entry['name']}",
                             Path(entry["file"]).parent.name, float(entry["time"].rstrip("s")))
@@ -190,6 +202,10 @@ class Tests:
                 continue
             outcome = self.program.run(groups, self._limit(groups))
             if outcome.failed and self._again(outcome, groups):
+                return outcome.why
+        for program in self.others:
+            outcome = program.run([None], OTHERS_SECONDS)
+            if outcome.failed:
                 return outcome.why
         return None
 
@@ -229,5 +245,5 @@ def sanitizer_refuses(tree, mutant, preset, limit=900):
     """What the tests under a sanitizer say of the mutant in the copy; None for nothing."""
     if not (tree.compiles(mutant, preset) and tree.links(preset)):
         raise TreeError(f"{mutant.title()}\ndoes not build as {preset}")
-    outcome = Program(tree.program(preset), limited=False).run([None], limit)
+    outcome = Program(tree.program(preset)).run([None], limit)
     return f"{preset}: {outcome.why}" if outcome.failed else None

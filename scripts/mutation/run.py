@@ -6,7 +6,7 @@ import threading
 from dataclasses import asdict, dataclass
 
 from mutation.judges import Tests, clang_refuses, sanitizer_refuses
-from mutation.tree import Tree
+from mutation.tree import PROGRAMS, Tree
 
 KILLED, SURVIVED, EQUIVALENT, SAME_CODE, NOT_COMPILED, FOR_SANITIZER = (
     "killed", "survived", "equivalent", "same code", "not compiled", "for the sanitizer")
@@ -21,6 +21,12 @@ class Verdict:
     by: list
 
 
+def programs_of(tree):
+    """The release build's test program with most of the tests, and the others."""
+    first, *others = (tree.program("release", name) for name in PROGRAMS)
+    return first, others
+
+
 class Worker:
     """One copy of the tree with its judges."""
 
@@ -28,7 +34,7 @@ class Worker:
         self.tree = Tree(checkout, folder, build_jobs)
         self.tree.update()
         self.tree.configure("release")
-        self.tests = Tests(self.tree.program("release"))
+        self.tests = Tests(*programs_of(self.tree))
         self.sanitizers = sanitizers
         for preset in sanitizers:
             self.tree.configure(preset)

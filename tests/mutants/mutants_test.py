@@ -46,6 +46,7 @@ TEST(Thing, IsBelow) {
 }
 TEST(Thing, Coded) { EXPECT_EQ(Coded(1), 7); }
 """,
+    "other_test.cpp": "int main() { return 0; }\n",
     "CMakePresets.json": json.dumps({
         "version": 5,
         "configurePresets": [{
@@ -61,6 +62,7 @@ find_package(GTest REQUIRED)
 add_subdirectory(cim/plexor)
 add_executable(provider-tests thing_test.cpp)
 target_link_libraries(provider-tests PRIVATE plexor_objects GTest::gtest_main)
+add_executable(render-chassis-tests other_test.cpp)
 """,
     "tests/mutants/equivalent.json": json.dumps([{
         "reason": "nobody asks for it",
