@@ -31,6 +31,24 @@ TEST_F(MeetingCallsTest, TheReleaseWaitsForARequest) {
     EXPECT_EQ(controllers(), 0u);
 }
 
+TEST_F(MeetingCallsTest, TheReleaseWaitsForAGet) {
+    load();
+    testbed::InstanceClient client(broker, &mi);
+    const auto drives = client.enumerateInstanceNames("Tovexa_PlexorStorageExtent").paths;
+    ASSERT_EQ(drives.size(), 1u);
+    Gate gate;
+    const GateOpener opener(gate);
+    faults().add(waitingAt(Entry::NewInstance, gate));
+    auto get = std::async(std::launch::async,
+                          [&] { return client.getInstance(drives[0]).instances.size(); });
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    auto cleanup = cleanupThatWaits(true);
+    EXPECT_EQ(CapturedSyslog::countContaining(" deleted\n"), 0u);
+    gate.open();
+    EXPECT_EQ(get.get(), 1u) << "complete";
+    EXPECT_EQ(cleanup.get(), CMPI_RC_OK);
+}
+
 TEST_F(MeetingCallsTest, ARequestThatBeginsDuringACleanupFindsNothing) {
     load();
     std::size_t seen = 99;

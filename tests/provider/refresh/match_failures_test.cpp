@@ -117,6 +117,23 @@ TEST_F(MatchFailures, NoMemoryForTheRecordsGivesTheResultsUp) {
     expectLast("CrossoutDuplicatedEntries EXITED, rc -2, remove 0, add 3\n");
 }
 
+TEST_F(MatchFailures, NoMemoryForWhatIsLookedUpGivesEverythingUp) {
+    cache("P0");
+    for (const std::size_t n : {3, 4}) {
+        CMPIEnumeration* const fresh = resultsOf({"P0", "P1"});
+        {
+            const auto fault = FailAllocation::nth(n);
+            EXPECT_EQ(match(fresh), -2);
+            EXPECT_EQ(fault.failures(), 1u);
+        }
+        expectNothingHandedBack();
+        EXPECT_EQ(
+            timesLogged(LOG_ERR, "CrossoutDuplicatedEntries, failed to allocate memory for enum\n"),
+            1u);
+        expectLast("CrossoutDuplicatedEntries EXITED, rc -2, remove 0, add 0\n");
+    }
+}
+
 TEST_F(MatchFailures, EveryAllocationMayFail) {
     cache("P0");
     for (int n = 1;; n++) {

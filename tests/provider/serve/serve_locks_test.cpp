@@ -8,6 +8,7 @@
 #include <string>
 
 #include "serve_fixture.h"
+#include "vendor_fixture.h"
 
 namespace plexortest {
 namespace {
@@ -23,12 +24,6 @@ constexpr Entry kInstanceSteps[] = {Entry::NewObjectPath,       Entry::PathAddKe
                                     Entry::NewInstance,         Entry::InstanceSetPropertyFilter,
                                     Entry::InstanceSetProperty, Entry::NewArray,
                                     Entry::ArraySetElementAt,   Entry::ResultReturnInstance};
-
-bool isFree(pthread_mutex_t& mutex) {
-    if (pthread_mutex_trylock(&mutex) != 0) return false;
-    pthread_mutex_unlock(&mutex);
-    return true;
-}
 
 class ServeLocks : public ServeTest {
 protected:

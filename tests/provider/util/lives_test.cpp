@@ -1,4 +1,6 @@
 // A second initialisation in the same mapping, also beside a worker that the first left behind.
+#include <chrono>
+#include <future>
 #include <optional>
 #include <thread>
 
@@ -120,6 +122,62 @@ TEST_F(LivesTest, TheSecondIsCompleteBesideAStuckWorkerOfTheFirst) {
     EXPECT_TRUE(plexortest::eventually(
         [&] { return CapturedSyslog::countContaining(" exiting...\n") == exits + 1; }));
     EXPECT_EQ(drives().instances.size(), 1u);
+}
+
+/// What a life stores or starts is there before its stop begins, or not at all.
+class LifeStopTest : public plexortest::EntryTest {
+protected:
+    /// Asks for the stop on a thread of its own, and notes whether that thread has to wait. Only
+    /// the first time.
+    void stopMeanwhile() {
+        if (stop_.valid()) return;
+        stop_ = std::async(std::launch::async, RequestStop);
+        waited_ = stop_.wait_for(std::chrono::milliseconds(50)) == std::future_status::timeout;
+    }
+    void stopWhileAListGrows() {
+        CapturedSyslog::onLine([this](const plexortest::LogLine& line) {
+            if (line.text.starts_with("Adding data ")) stopMeanwhile();
+        });
+    }
+    bool stopHadToWait() {
+        EXPECT_TRUE(stop_.valid()) << "nobody has stopped";
+        if (stop_.valid()) stop_.wait();
+        return waited_;
+    }
+
+private:
+    std::future<void> stop_;
+    bool waited_ = false;
+};
+
+TEST_F(LifeStopTest, WaitsUntilAControllerIsInTheList) {
+    const testbed::ObjectPath profile = vendor.profile();
+    vendor.controller("C0", profile);
+    Array_t profiles = {};
+    profiles.Array[profiles.Count++] = broker.makeInstance(repository.get(profile).value());
+    stopWhileAListGrows();
+    BuildControllerInfo(&mi, ctx(), &profiles);
+    EXPECT_TRUE(stopHadToWait());
+    EXPECT_EQ(controllers(), 1u);
+}
+
+TEST_F(LifeStopTest, WaitsUntilTheHostsNamesAreStored) {
+    vendor.host();
+    testbed::FaultRule rule;
+    rule.entry = Entry::InstanceGetProperty;
+    rule.hook = [this] { stopMeanwhile(); };
+    faults().add(rule);
+    EXPECT_EQ(InitSystemInfo(&mi, ctx()), 0);
+    EXPECT_TRUE(stopHadToWait());
+    EXPECT_STREQ(GetSystemClassName(), "OMC_UnitaryComputerSystem");
+}
+
+TEST_F(LifeStopTest, WaitsUntilAnItemIsQueued) {
+    // Only what a member of a life queues is refused when it is over.
+    const LifeMember member;
+    stopWhileAListGrows();
+    EXPECT_EQ(QueueItem(plexortest::zeroed<Thread_Args_t>()), 0);
+    EXPECT_TRUE(stopHadToWait());
 }
 
 }  // namespace
