@@ -13,7 +13,7 @@ namespace testbed {
 struct WbemClientOptions {
     Deadline deadline = Deadline::max();                ///< for everything that the client does
     std::size_t largestAnswer = std::size_t{16} << 20;  ///< bytes of all answers together
-    TlsOptions tls;
+    TlsOptions tls = {};
 };
 
 struct AskedOperation;
