@@ -186,31 +186,36 @@ void Scheduler::makeReady(State state, const void* object) {
     }
 }
 
-int Scheduler::lock(pthread_mutex_t* mutex) {
-    pause();
+int Scheduler::take(pthread_mutex_t* mutex) {
     while (owners_.contains(mutex)) block(State::WantsLock, mutex, std::nullopt);
     owners_[mutex] = self().number;
     return real::pthread_mutex_lock(mutex);
 }
 
-int Scheduler::unlock(pthread_mutex_t* mutex) {
+int Scheduler::giveBack(pthread_mutex_t* mutex) {
     const int rc = real::pthread_mutex_unlock(mutex);
     owners_.erase(mutex);
     makeReady(State::WantsLock, mutex);
+    return rc;
+}
+
+int Scheduler::lock(pthread_mutex_t* mutex) {
+    pause();
+    return take(mutex);
+}
+
+int Scheduler::unlock(pthread_mutex_t* mutex) {
+    const int rc = giveBack(mutex);
     pause();
     return rc;
 }
 
 int Scheduler::wait(pthread_cond_t* condition, pthread_mutex_t* mutex,
                     std::optional<Nanoseconds> deadline) {
-    real::pthread_mutex_unlock(mutex);
-    owners_.erase(mutex);
-    makeReady(State::WantsLock, mutex);
+    giveBack(mutex);
     block(State::Waits, condition, deadline);
     const bool timedOut = self().timedOut;
-    while (owners_.contains(mutex)) block(State::WantsLock, mutex, std::nullopt);
-    owners_[mutex] = self().number;
-    real::pthread_mutex_lock(mutex);
+    take(mutex);
     return timedOut ? ETIMEDOUT : 0;
 }
 

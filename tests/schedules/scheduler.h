@@ -107,6 +107,8 @@ private:
     Thread* choose();
     Thread* nextInTime();
     void passTo(Thread& next);
+    int take(pthread_mutex_t* mutex);
+    int giveBack(pthread_mutex_t* mutex);
     void block(State state, const void* object, std::optional<Nanoseconds> deadline);
     void makeReady(State state, const void* object);
     /// Gives the thread's turn away for ever.

@@ -31,8 +31,9 @@ World::World() : broker_(repository_) {
 
 void World::callFactory() {
     const testbed::Broker::CallScope scope(broker_);
-    mi_ = PlexorProvider_Create_InstanceMI(broker_.handle(), scope.context(), nullptr);
-    require(mi_ != nullptr, "the factory gives nothing");
+    const CMPIInstanceMI* provider =
+        PlexorProvider_Create_InstanceMI(broker_.handle(), scope.context(), nullptr);
+    require(provider != nullptr, "the factory gives nothing");
 }
 
 CMPIrc World::cleanUp(bool terminating) {

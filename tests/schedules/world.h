@@ -54,7 +54,6 @@ public:
 private:
     testbed::Repository repository_;
     testbed::Broker broker_;
-    CMPIInstanceMI* mi_ = &provider_;
     CMPIInstanceMI provider_ = {nullptr, &instMIFT__};
     std::set<std::string> drives_, volumes_, controllers_;
     std::size_t acceptedClones_ = 0;
