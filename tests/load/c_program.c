@@ -101,6 +101,13 @@ static int threads(void) {
     return entries_of("/proc/self/task");
 }
 
+/* A thread that was joined may still be listed for a moment: the join returns before the kernel has
+ * taken it off. The provider is unmapped by then, so one that still ran would end the program. */
+static void wait_for_a_single_thread(int cycle) {
+    for (int i = 0; i < 240000 && threads() != 1; i++) pause_briefly();
+    if (threads() != 1) fail("cycle %d: %d threads are left", cycle + 1, threads());
+}
+
 /* Without the one that counts. */
 static int descriptors(void) {
     return entries_of("/proc/self/fd") - 1;
@@ -261,7 +268,7 @@ int main(int argc, char** argv) {
         run_cycle(&settings, cycle);
         if (cycle == warm_up) settled = resident_kib();
         if (cycle == 0) files = descriptors();
-        if (threads() != 1) fail("cycle %d: %d threads are left", cycle + 1, threads());
+        wait_for_a_single_thread(cycle);
         if (descriptors() != files) fail("cycle %d: a descriptor is left", cycle + 1);
     }
     const long growth = resident_kib() - settled;
