@@ -188,6 +188,9 @@ TEST_F(MatchFailures, NoMemoryForMoreResultsThanTheArrayHad) {
         EXPECT_EQ(fault.failures(), 1u);
     }
     expectNothingHandedBack();
+    EXPECT_EQ(
+        timesLogged(LOG_ERR, "CrossoutDuplicatedEntries, failed to allocate memory for enum\n"),
+        1u);
 }
 
 TEST_F(MatchFailures, FewerResultsThanTheArrayHad) {
