@@ -1,7 +1,7 @@
 // A schema as standards bodies publish it, read whole.
 #include "standard_classes.h"
 
-#include <chrono>
+#include <ctime>
 
 #include "mof_error.h"
 #include "mof_reader.h"
@@ -37,13 +37,14 @@ protected:
 TEST_F(StandardClasses, OfAPublishedSchemasSizeAreReadInASecond) {
     const SyntheticSchema schema = writeSyntheticSchema(directory_.path(), 1450);
     ASSERT_GT(schema.bytes, 6'000'000U);
-    const auto begin = std::chrono::steady_clock::now();
+    const std::clock_t begin = std::clock();
     defineStandardClasses(repository_, kSpace, schema.file);
-    const std::chrono::duration<double> taken = std::chrono::steady_clock::now() - begin;
-    std::printf("%zu classes, %zu files, %.1f MB: %.2f s\n", schema.classes, schema.files,
-                static_cast<double>(schema.bytes) / 1e6, taken.count());
-    // A second is what an idle machine needs at most; the others have their cores busy.
-    EXPECT_LT(taken.count(), 20);
+    const double taken = static_cast<double>(std::clock() - begin) / CLOCKS_PER_SEC;
+    std::printf("%zu classes, %zu files, %.1f MB: %.2f CPU s\n", schema.classes, schema.files,
+                static_cast<double>(schema.bytes) / 1e6, taken);
+    // A second is what an idle machine needs at most; others share their caches, or check
+    // addresses.
+    EXPECT_LT(taken, 20);
     std::size_t properties = 0, methods = 0, parameters = 0;
     for (const std::string& name : repository_.classNames(kSpace)) {
         const ClassDefinition definition = *repository_.findClass(kSpace, name);

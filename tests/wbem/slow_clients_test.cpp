@@ -57,7 +57,7 @@ TEST_F(SlowClients, DoNotKeepOthersWaiting) {
     for (int i = 0; i < 20; i++) {
         const auto begin = Clock::now();
         EXPECT_TRUE(isAlive());
-        EXPECT_LT(Clock::now() - begin, std::chrono::seconds(3));
+        EXPECT_LT(Clock::now() - begin, std::chrono::seconds(20));
         std::this_thread::sleep_for(std::chrono::milliseconds(250));
     }
 }
