@@ -17,7 +17,7 @@ schedules::Nanoseconds toNanoseconds(const timespec& time) {
     return time.tv_sec * schedules::kSecond + time.tv_nsec;
 }
 
-void logged(int priority, const char* format, va_list arguments) {
+[[gnu::format(printf, 2, 0)]] void logged(int priority, const char* format, va_list arguments) {
     if (LOG_PRI(priority) <= LOG_ERR) schedules::noteErrorLine(format, arguments);
     if (Scheduler* scheduler = Scheduler::current()) scheduler->pause();
 }

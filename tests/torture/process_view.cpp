@@ -7,8 +7,6 @@
 
 namespace torture {
 
-using Clock = std::chrono::steady_clock;
-
 std::size_t threadCount() {
     const std::filesystem::directory_iterator tasks("/proc/self/task");
     return static_cast<std::size_t>(std::distance(begin(tasks), end(tasks)));
@@ -21,6 +19,7 @@ std::size_t threadCountAtRest() {
 }
 
 bool waitForThreadCount(std::size_t count, std::chrono::milliseconds limit) {
+    using Clock = std::chrono::steady_clock;
     const auto deadline = Clock::now() + limit;
     // A thread that was joined may still be listed for a moment.
     while (threadCount() != count) {
