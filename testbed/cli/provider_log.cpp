@@ -42,7 +42,8 @@ extern "C" void syslog(int priority, const char* format, ...) {
     va_end(args);
 }
 
-extern "C" void __syslog_chk(int priority, int, const char* format, ...) {
+extern "C" [[gnu::format(printf, 3, 4)]] void __syslog_chk(int priority, int, const char* format,
+                                                           ...) {
     va_list args;
     va_start(args, format);
     testbed::deliver(priority, format, args);
