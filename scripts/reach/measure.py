@@ -8,10 +8,10 @@ from pathlib import Path
 from reach.judge import DEMANDS
 from reach.places import Reach
 
-# Each runs the programs and libraries of the build, which write what they have counted at their end.
+# What they count is written at their end, as is that of the tool and of libraries that they use.
 PROGRAMS = ("provider-tests", "render-chassis-tests", "faults-test", "testbed-tests", "vendor-tests",
             "schema-tests", "wbem-tests", "page-tests", "ask-tests", "scenario-tests")
-# Tests that are scripts, or need arguments, by their names for ctest, with what they need.
+# Tests that are scripts, or need arguments, by their names for ctest; and what they need.
 OTHER_TESTS = r"^(steering\..*|scenario-schema|load\.c_program.*)$"
 OTHER_TARGETS = ("plexor-testbed", "PlexorProvider", "PlexorProviderStandard", "plexor-desk", "c-program")
 # Where the product's code is; each of them may have some of it that the others have not.
@@ -25,9 +25,13 @@ class MeasureError(Exception):
 
 
 def run(command, **options):
-    done = subprocess.run([str(part) for part in command], text=True, capture_output=True, **options)
+    command = [str(part) for part in command]
+    try:
+        done = subprocess.run(command, text=True, capture_output=True, **options)
+    except (OSError, subprocess.TimeoutExpired) as error:
+        raise MeasureError(str(error)) from error
     if done.returncode != 0:
-        raise MeasureError(f"{' '.join(map(str, command))}: status {done.returncode}\n"
+        raise MeasureError(f"{' '.join(command)}: status {done.returncode}\n"
                            f"{done.stdout[-8000:]}{done.stderr[-4000:]}")
     return done.stdout
 
@@ -47,6 +51,7 @@ class Build:
         return {**os.environ, "LLVM_PROFILE_FILE": str(folder / "%m.profraw")}
 
     def make(self):
+        run([self._root / "scripts" / "install-deps", "build", "test", "coverage"])
         # CMake runs some test programs while it builds, to ask for the names of their tests.
         environment = self._environment(self._tree / "asked")
         run(["cmake", "--preset", "coverage"], cwd=self._root, env=environment)
