@@ -31,8 +31,8 @@ if(PLEXOR_FUZZ)
     add_compile_definitions(_GLIBCXX_ASSERTIONS)
 endif()
 if(PLEXOR_COVERAGE)
-    add_compile_options(--coverage -O0)
-    add_link_options(--coverage)
+    add_compile_options(-fprofile-instr-generate -fcoverage-mapping -fprofile-update=atomic)
+    add_link_options(-fprofile-instr-generate)
 endif()
 
 # For the directories around the provider, whose code is not what is measured or busy: what the compiler

@@ -1,5 +1,6 @@
 // Queries that fail, memory that runs out, answers that are nonsense: what it costs in controllers.
 #include "controller_fixture.h"
+#include "stop_at_line.h"
 
 namespace plexortest {
 namespace {
@@ -180,6 +181,18 @@ TEST_F(ControllerFailures, ShortageEmptiesTheListOfAllProfiles) {
             EXPECT_THAT(query, testing::Not(testing::HasSubstr("profile-3")));
         }
     }
+}
+
+TEST_F(ControllerFailures, ShortageDuringAStopLeavesTheListToTheCleanup) {
+    addTwo();
+    {
+        const auto fault = FailAllocation::nth(kAllocations + 1);
+        const StopAtLine stop(
+            "BuildControllerInfo, failed to allocate memory for RaidController_t");
+        EXPECT_EQ(build(), -2);
+    }
+    EXPECT_THAT(cached(), ElementsAre("C0"));
+    EXPECT_EQ(CapturedSyslog::countContaining("deleted"), 0u);
 }
 
 TEST_F(ControllerFailures, EveryAllocationInTurn) {

@@ -1,5 +1,6 @@
 // Which version of a controller's software goes into which field.
 #include "controller_fixture.h"
+#include "stop_at_line.h"
 
 namespace plexortest {
 namespace {
@@ -136,6 +137,17 @@ TEST_F(ControllerSoftware, CopiesThatAreNotKeptAreFreed) {
     for (int i = 0; i < 5; i++) vendor.software(card.system, 99, "any-" + std::to_string(i));
     // The leak checker has the last word.
     EXPECT_EQ(versions(), "FW-4 absent absent absent");
+}
+
+TEST_F(ControllerSoftware, AStopEndsTheReadingAtTheRunningVersion) {
+    vendor.software(card.system, 10, "FW");
+    vendor.software(card.system, 11, "BIOS");
+    {
+        const StopAtLine stop(traceOf(10, "FW"));
+        EXPECT_EQ(build(), 0);
+    }
+    EXPECT_TRUE(logged(LOG_DEBUG, traceOf(10, "FW")));
+    EXPECT_EQ(CapturedSyslog::countContaining(", swClass "), 1u);
 }
 
 }  // namespace

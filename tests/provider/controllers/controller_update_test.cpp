@@ -2,6 +2,7 @@
 #include <thread>
 
 #include "controller_fixture.h"
+#include "watched_calls.h"
 
 namespace plexortest {
 namespace {
@@ -45,6 +46,16 @@ TEST_F(ControllerUpdate, MovesTheTimeAlone) {
         EXPECT_EQ(time, 0);
     }
     EXPECT_THAT(books().calls(), IsEmpty());
+}
+
+TEST_F(ControllerUpdate, ThatIsDeclinedMovesNothing) {
+    const time_t built = ctrl->ControllerUpdateTime;
+    ctrl->UpdateEnabled = 3;
+    VirtualClock::set(kStart + 77);
+    const UpdatesDeclined declined;
+    EXPECT_EQ(update(), 0);
+    EXPECT_EQ(UpdatesDeclined::questions(), (std::vector<UpdatesDeclined::Question>{{built, 3}}));
+    EXPECT_EQ(ctrl->ControllerUpdateTime, built);
 }
 
 TEST_F(ControllerUpdate, DeviceAndInstanceAreIgnored) {

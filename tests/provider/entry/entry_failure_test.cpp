@@ -4,6 +4,7 @@
 
 #include "entry_fixture.h"
 #include "refresh_fixture.h"
+#include "stop_at_line.h"
 
 namespace {
 
@@ -230,6 +231,20 @@ TEST_F(EntryFailureTest, FullQueueFailsNothing) {
     EXPECT_EQ(controllers(), 1u);
     // Items without a function are not freed by the workers: take them out again.
     while (void* item = GetItem(&__FIFO)) free(item);
+}
+
+TEST_F(EntryFailureTest, AStopWhenNoProfileIsFoundLeavesTheIdentityToTheCleanup) {
+    vendor.host();
+    {
+        const plexortest::StopAtLine stop(
+            "No instance of Host Hard RAID Controller is found, rc 0\n");
+        callFactory();
+    }
+    EXPECT_NE(__SystemName, nullptr);
+    EXPECT_EQ(initialized(), 1) << "so is the mark";
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+    EXPECT_EQ(__SystemName, nullptr);
+    EXPECT_EQ(initialized(), 0);
 }
 
 }  // namespace

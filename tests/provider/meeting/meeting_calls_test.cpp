@@ -242,4 +242,50 @@ TEST_F(MeetingCallsTest, EverythingAtOnce) {
               << " cleanups, " << books().liveClones() << " clones given up" << std::endl;
 }
 
+TEST_F(MeetingCallsTest, ACleanupFromWithinTheSearchGivesTheSearchUp) {
+    testbed::FaultRule asked;
+    asked.entry = Entry::EnumerateInstances;
+    asked.className = "CIM_RegisteredProfile";
+    asked.times = 1;
+    asked.hook = [this] {
+        const plexortest::HurriedWaits watched;
+        EXPECT_EQ(PlexorProviderCleanup(&mi, ctx(), 1).rc, CMPI_RC_OK);
+        EXPECT_TRUE(plexortest::HurriedWaits::otherWaits().empty()) << "it would wait for itself";
+    };
+    faults().add(asked);
+    const plexortest::GivenUpInventory givenUp;
+    callFactory();
+    EXPECT_EQ(initialized(), 0);
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR),
+              std::vector<std::string>{"PlexorProviderCleanup: a factory call is still busy, the "
+                                       "inventory stays in memory\n"});
+
+    CapturedSyslog::clear();
+    load();
+    EXPECT_EQ(requestDrives().get(), 1u);
+}
+
+TEST_F(MeetingCallsTest, AFactoryCallThatHasNotComeToItsTurnIsGivenUp) {
+    Gate gate;
+    const GateOpener opener(gate);
+    CapturedSyslog::onLine([&gate](const plexortest::LogLine& line) {
+        if (line.text == "PlexorInit: ENTER...\n") gate.pass();
+    });
+    auto late = callFactoryElsewhere();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    {
+        const plexortest::HurriedWaits hurry;
+        EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+    }
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR),
+              std::vector<std::string>{"PlexorProviderCleanup: a factory call is still busy, the "
+                                       "inventory stays in memory\n"});
+    gate.open();
+    EXPECT_NE(late.get(), nullptr);
+    EXPECT_EQ(initialized(), 0) << "its life has ended";
+    CapturedSyslog::onLine(nullptr);
+    load();
+    EXPECT_EQ(controllers(), 1u);
+}
+
 }  // namespace

@@ -145,4 +145,27 @@ TEST_F(CancelledTest, AnInitialisationCanBeTriedAgain) {
     EXPECT_EQ(requestDrives().get(), 1u);
 }
 
+TEST_F(CancelledTest, AnInitialisationOfAnEndedLifeLeavesTheInventoryToItsCleanup) {
+    CapturedSyslog::onLine([](const plexortest::LogLine& line) {
+        if (line.text != "BuildControllerInfo, EXIT(0).\n") return;
+        RequestStop();
+        pthread_cancel(pthread_self());
+        pthread_testcancel();
+    });
+    auto factory = [this] {
+        const testbed::Broker::CallScope scope(broker);
+        PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr);
+    };
+    const pthread_t thread = start(factory);
+    void* result = nullptr;
+    EXPECT_EQ(pthread_join(thread, &result), 0);
+    EXPECT_EQ(result, PTHREAD_CANCELED);
+    CapturedSyslog::onLine(nullptr);
+    EXPECT_EQ(initialized(), 1);
+    EXPECT_EQ(controllers(), 1u);
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+    EXPECT_EQ(initialized(), 0);
+    EXPECT_EQ(controllers(), 0u);
+}
+
 }  // namespace

@@ -150,5 +150,14 @@ TEST_F(PoolMembership, OnlyMemberCanBeReplaced) {
     EXPECT_EQ(members(), (Names{"D1", "D2"}));
 }
 
+TEST_F(PoolMembership, APoolWithoutAListHasNoMembers) {
+    pool->Drives = nullptr;
+    AddDiskToPool(pool, "D0");
+    RemoveDiskFromPool(pool, "D0");
+    EXPECT_EQ(pool->_Drives.Size, 0u);
+    EXPECT_EQ(CapturedSyslog::countContaining("Removing data "), 0u);
+    pool->Drives = &pool->_Drives;
+}
+
 }  // namespace
 }  // namespace plexortest

@@ -37,6 +37,22 @@ protected:
     }
 };
 
+TEST_F(RecordLookup, FindsNothingWhereThereIsNoList) {
+    ctrl->PoolList = ctrl->DiskList = ctrl->ChassisList = nullptr;
+    EXPECT_EQ(FindStoragePoolByID(ctrl, "P0"), nullptr);
+    EXPECT_EQ(FindDiskByDeviceID(ctrl, "D0"), nullptr);
+    EXPECT_EQ(FindChassisByTag(ctrl, "E0"), nullptr);
+    const std::string nowhere = formatted("%p\n", static_cast<void*>(nullptr));
+    EXPECT_EQ(
+        CapturedSyslog::linesAt(LOG_INFO),
+        (std::vector<std::string>{"FindStoragePoolByID: can not find pool P0 in list " + nowhere,
+                                  "FindDiskByDeviceID: can not find disk D0 in list " + nowhere,
+                                  "FindChassisByTag: can not find chassis E0 in list " + nowhere}));
+    ctrl->PoolList = &ctrl->__PoolList;
+    ctrl->DiskList = &ctrl->__DiskList;
+    ctrl->ChassisList = &ctrl->__ChassisList;
+}
+
 TEST_F(PoolLookup, StopsAtTheFirstMatch) {
     StoragePool_t* other = attach(ctrl, newPool("P0"));
     StoragePool_t* pool = attach(ctrl, newPool("P1"));

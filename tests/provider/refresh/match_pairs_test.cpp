@@ -27,6 +27,16 @@ TEST_F(MatchPairs, GoneStayingAndNewDevicesAreToldApart) {
     EXPECT_EQ(keyOf(ops_[1].Instance), "P2");
 }
 
+TEST_F(MatchPairs, NoMoreRecordsAreTakenThanTheListCounts) {
+    cache("P0");
+    cache("P1");
+    list_.Size = 1;
+    ASSERT_EQ(match(resultsOf({"P0"})), 0);
+    EXPECT_EQ(flags(), "1");
+    EXPECT_EQ(CapturedSyslog::countContaining(" added to dataArr["), 1u);
+    list_.Size = 2;
+}
+
 TEST_F(MatchPairs, ResultsInAnotherOrderFindTheirRecords) {
     cache("P0");
     cache("P1");

@@ -1,33 +1,13 @@
 // Where work that is under way looks for a stop: each look ends what it stands in front of. The
 // stop is asked for in the middle of the work, by the same thread.
 #include "reconcile_fixture.h"
+#include "stop_at_line.h"
 #include "worker_harness.h"
 
 namespace plexortest {
 namespace {
 
 using testbed::FaultRule;
-
-/// Asks for the stop when the n-th line with that beginning is logged.
-class StopAtLine {
-public:
-    explicit StopAtLine(const std::string& beginning, int number = 1) {
-        CapturedSyslog::onLine([this, beginning, number](const LogLine& line) {
-            if (line.text.starts_with(beginning) && ++seen_ == number) {
-                EXPECT_TRUE(quiesceWorkers());
-            }
-        });
-    }
-    ~StopAtLine() {
-        CapturedSyslog::onLine(nullptr);
-        EXPECT_TRUE(StopRequested()) << "the line never came";
-    }
-    StopAtLine(const StopAtLine&) = delete;
-    StopAtLine& operator=(const StopAtLine&) = delete;
-
-private:
-    int seen_ = 0;
-};
 
 class StopChecks : public ReconcileTest {
 protected:
@@ -200,6 +180,70 @@ TEST_F(StopChecks, TheInventoryEndsWithTheRunningController) {
     EXPECT_EQ(second->ControllerUpdateTime, 0);
     EXPECT_EQ(associatorQueries(),
               (Ids{"CIM_HostedStoragePool>CIM_StoragePool", "CIM_SystemPackaging>CIM_Chassis"}));
+}
+
+TEST_F(StopChecks, AnInventoryThatBeginsAfterTheStopAsksNothing) {
+    addOneOfEach();
+    ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
+    EXPECT_TRUE(quiesceWorkers());
+    books().clearCalls();
+    DoBuildDeviceInfoAsync(ctx(), GetItem(&__FIFO));
+    EXPECT_EQ(associatorQueries(), Ids{});
+    EXPECT_EQ(linesWith("BuildPoolInfo, ENTER"), 0u);
+    EXPECT_EQ(ctrl->ControllerUpdateTime, 0) << "not even as if it had been asked";
+    EXPECT_EQ(CapturedSyslog::count("DoBuildDeviceInfoAsync done."), 1u);
+}
+
+TEST_F(StopChecks, AnInventoryThatOutlivesItsLifeLeavesTheNextOnesGateClosed) {
+    const LifeMember member;
+    ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);
+    auto* const item = static_cast<Thread_Args_t*>(GetItem(&__FIFO));
+    EXPECT_TRUE(quiesceWorkers());
+    BeginWork();
+    DoBuildDeviceInfoAsync(ctx(), item);
+    EXPECT_EQ(threadActivityDone(), 0u);
+    EXPECT_FALSE(InventoryDone());
+}
+
+TEST_F(StopChecks, NeitherAClassNorAnObjectIsAskedForAfterTheStop) {
+    const CMPIObjectPath* path = broker.makePath(system_);
+    bool failed = false;
+    ASSERT_NE(QueryInstances("ACaller", ctx(), path), nullptr);
+    ASSERT_NE(QueryInstance("ACaller", ctx(), path, &failed), nullptr);
+    EXPECT_TRUE(quiesceWorkers());
+    startOver();
+    EXPECT_EQ(QueryInstances("ACaller", ctx(), path), nullptr);
+    EXPECT_EQ(QueryInstance("ACaller", ctx(), path, &failed), nullptr);
+    EXPECT_EQ(queries(), Texts{});
+    EXPECT_FALSE(failed) << "nobody has been asked";
+}
+
+TEST_F(StopChecks, TheReadingOfIdentitiesEndsAtTheRunningOne) {
+    for (int i = 0; i < 50; i++) addPort("P" + std::to_string(i));
+    process(102);
+    setAllUpdateTimes(0);
+    clearLog();
+    int read = 0;
+    FaultRule third =
+        watch(Entry::PathGetKey, [&read] { EXPECT_TRUE(++read != 3 || quiesceWorkers()); });
+    third.name = "DeviceID";
+    faults().add(third);
+    process(102);
+    EXPECT_EQ(read, 3);
+    EXPECT_EQ(ports().size(), 50u);
+    EXPECT_TRUE(
+        loggedOnce(LOG_DEBUG, "CrossoutDuplicatedEntries EXITED, rc -100, remove 0, add 0\n"));
+}
+
+TEST_F(StopChecks, ADriveWhosePoolIsNoLongerAskedForIsTurnedAwayInSilence) {
+    const Path drive = addDrive("D0", addPool("pool0"));
+    FaultRule candidates = watch(Entry::AssociatorNames, [] { EXPECT_TRUE(quiesceWorkers()); });
+    candidates.assocClass = "CIM_ConcreteComponent";
+    faults().add(candidates);
+    EXPECT_EQ(BuildDiskInfo(&mi, ctx(), ctrl, instanceAt(drive), broker.makePath(drive)), -1);
+    EXPECT_TRUE(StopRequested());
+    EXPECT_EQ(ctrl->DiskList->Size, 0u);
+    EXPECT_EQ(linesWith("No pool associated with disk "), 0u) << "nobody knows";
 }
 
 }  // namespace

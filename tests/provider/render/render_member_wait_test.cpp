@@ -79,5 +79,20 @@ TEST_F(RenderMemberWait, NamesOfVolumesNeedNoMembers) {
     EXPECT_EQ(0u, lookupsOf("late", "can not find"));
 }
 
+TEST_F(RenderMemberWait, AMemberIsWaitedForUntilTheLifeOfTheRequestEnds) {
+    missed = 0;
+    CapturedSyslog::onLine([this](const LogLine& line) {
+        if (line.text.starts_with("FindDiskByDeviceID: can not find disk late ") && ++missed == 5) {
+            RequestStop();
+        }
+        if (missed > 1000) std::abort();
+    });
+    const LifeMember member;
+    EXPECT_EQ("RAID5 Volume 1 Logical Volume 1 on controller C0, Drives(d1, - OPTIMAL",
+              valueOf(rowsOf(FillVolumeInstance, ctrl, volume), "ElementName"));
+    EXPECT_EQ(5, missed);
+    EXPECT_EQ(0u, lookupsOf("d3", "found")) << "nor are the others looked for";
+}
+
 }  // namespace
 }  // namespace plexortest

@@ -44,6 +44,15 @@ TEST_F(ListPop, LastOneLeavesNoHeadAndNoTail) {
     EXPECT_EQ(list.Size, 0u);
 }
 
+TEST_F(ListPop, WithNowhereToPutItTheFrontStays) {
+    fill({&a, &b});
+    EXPECT_EQ(RemoveEntryFromList(&list, nullptr), -1);
+    expectList({&a, &b});
+    EXPECT_TRUE(
+        logged(LOG_DEBUG, formatted("Removing data %p from list %p\n", static_cast<void*>(nullptr),
+                                    static_cast<void*>(&list))));
+}
+
 TEST_F(ListPop, EmptyListGivesNull) {
     void* item = &b;
     EXPECT_EQ(RemoveEntryFromList(&list, &item), 0);

@@ -1,4 +1,8 @@
 // A second initialisation in the same mapping, also beside a worker that the first left behind.
+#include <dlfcn.h>
+#include <pthread.h>
+
+#include <atomic>
 #include <chrono>
 #include <future>
 #include <optional>
@@ -8,6 +12,20 @@
 #include "entry_fixture.h"
 #include "real_waits.h"
 #include "worker_harness.h"
+
+namespace {
+
+std::atomic<int> nobodyDetached = 0;  // how often it was tried with a word that names no thread
+
+}  // namespace
+
+// In front of the C library's, of which some do not survive that.
+extern "C" int pthread_detach(pthread_t thread) noexcept {
+    static const auto real =
+        reinterpret_cast<int (*)(pthread_t)>(dlsym(RTLD_NEXT, "pthread_detach"));
+    if (thread == 0) ++nobodyDetached;
+    return real(thread);
+}
 
 namespace {
 
@@ -41,7 +59,10 @@ protected:
         rule.entry = Entry::Associators;
         rule.resultClass = "CIM_Battery";
         rule.times = 1;
-        rule.hook = [this] { gate_.pass(); };
+        rule.hook = [this] {
+            stuck_ = pthread_self();
+            gate_.pass();
+        };
         faults().add(rule);
     }
     /// Makes a worker of this life hang in a refresh of the batteries, then ends the life.
@@ -57,6 +78,7 @@ protected:
     static std::size_t times(const std::string& line) { return CapturedSyslog::count(line); }
 
     Gate gate_;
+    std::atomic<pthread_t> stuck_ = 0;  // the worker that hangs in the walk over the batteries
     std::optional<plexortest::GivenUpInventory> givenUp_;
 };
 
@@ -121,6 +143,20 @@ TEST_F(LivesTest, TheSecondIsCompleteBesideAStuckWorkerOfTheFirst) {
     gate_.open();
     EXPECT_TRUE(plexortest::eventually(
         [&] { return CapturedSyslog::countContaining(" exiting...\n") == exits + 1; }));
+    EXPECT_EQ(drives().instances.size(), 1u);
+}
+
+TEST_F(LivesTest, AWorkerWhoseWordWasResetIsNotDetachedByTheNextLife) {
+    callFactory();
+    ASSERT_TRUE(inventoryTaken());
+    settleWorkers();
+    endLifeWithAStuckWorker();
+    PlexorThreads[0] = PlexorThreads[1] = 0;
+    callFactory();
+    ASSERT_TRUE(plexortest::eventually([] { return times("DoBuildDeviceInfoAsync done.") == 2; }));
+    gate_.open();
+    EXPECT_EQ(pthread_join(stuck_, nullptr), 0);
+    EXPECT_EQ(nobodyDetached, 0);
     EXPECT_EQ(drives().instances.size(), 1u);
 }
 

@@ -4,6 +4,8 @@
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderUtilManager.h"
 #include "entry_fixture.h"
+#include "fake_instance.h"
+#include "keys_fake_path.h"
 #include "refresh_fixture.h"
 
 namespace {
@@ -78,6 +80,90 @@ TEST_F(LargeManagerTest, ARefusedStringIsSetAsAnObject) {
     const testbed::Instance controller = first("Tovexa_PlexorController");
     EXPECT_EQ(textOf(controller, "OtherIdentifyingInfo"), "[C0]");
     EXPECT_EQ(textOf(controller, "IdentifyingDescriptions"), "[Serial Number]");
+}
+
+/// A path with one key, of which anything can be answered.
+struct OneKey {
+    CMPIData data = plexortest::dataOf(CMPI_chars, 0);
+    CMPIrc rc = CMPI_RC_OK;
+    plexortest::FakeString name{"Name"};
+    CMPIObjectPathFT table = {};
+    CMPIObjectPath path = {};
+
+    OneKey() {
+        data.value.chars = const_cast<char*>("a value");
+        path.hdl = this;
+        path.ft = &table;
+        table.getKeyCount = [](const CMPIObjectPath*, CMPIStatus*) -> CMPICount { return 1; };
+        table.getKeyAt = [](const CMPIObjectPath* self, CMPICount, CMPIString** keyName,
+                            CMPIStatus* status) {
+            auto* key = static_cast<OneKey*>(const_cast<void*>(self->hdl));
+            *keyName = &key->name;
+            *status = {key->rc, nullptr};
+            return key->data;
+        };
+    }
+    OneKey(const OneKey&) = delete;
+
+    /// What is set in an instance that answers so when it is asked for that property.
+    std::string setIn(CMPIData answered) const {
+        static std::string set;
+        set = "nothing";
+        plexortest::FakeInstance fake(answered);
+        fake.table.setProperty = [](const CMPIInstance*, const char* property,
+                                    const CMPIValue* value, CMPIType) {
+            set = std::string(property) + " " + reinterpret_cast<const char*>(value);
+            return CMPIStatus{CMPI_RC_OK, nullptr};
+        };
+        KeyCopying copying;
+        CompleteKeys(&fake.instance, &path, copying);
+        return set;
+    }
+};
+
+const CMPIData kNullText = plexortest::dataOf(CMPI_string, 0, CMPI_nullValue);
+
+TEST_F(LargeManagerTest, AKeyIsSetOnlyWhereItsNameAndValueCanBeRead) {
+    OneKey key;
+    EXPECT_EQ(key.setIn(kNullText), "Name a value");
+    key.rc = CMPI_RC_ERR_FAILED;
+    EXPECT_EQ(key.setIn(kNullText), "nothing") << "the path does not answer";
+    key.rc = CMPI_RC_OK;
+    key.name.hdl = nullptr;
+    key.name.text = nullptr;
+    EXPECT_EQ(key.setIn(kNullText), "nothing") << "without a name";
+    OneKey number;
+    number.data = plexortest::dataOf(CMPI_uint32, 7);
+    EXPECT_EQ(number.setIn(kNullText), "nothing") << "no text";
+}
+
+TEST_F(LargeManagerTest, APropertyThatTheInstanceDoesNotHaveIsNotMissed) {
+    const auto notThere = static_cast<CMPIValueState>(CMPI_nullValue | CMPI_notFound);
+    EXPECT_EQ(OneKey().setIn(plexortest::dataOf(CMPI_string, 0, notThere)), "nothing");
+    EXPECT_EQ(OneKey().setIn(plexortest::dataOf(CMPI_string, 1)), "nothing") << "it is there";
+}
+
+TEST_F(LargeManagerTest, WithoutAContextOfItsOwnAnItemUsesTheWorkers) {
+    FaultRule none;
+    none.entry = Entry::PrepareAttachThread;
+    none.nullResult = true;
+    faults().add(none);
+    books().clearCalls();
+    ItemSpan span(ctx());
+    EXPECT_EQ(span.Context(), ctx());
+    span.End();
+    EXPECT_EQ(books().count(Entry::AttachThread), 0u);
+    EXPECT_EQ(books().count(Entry::DetachThread), 0u);
+}
+
+TEST_F(LargeManagerTest, WithoutAStringObjectTheElementStaysAsItIs) {
+    FaultRule none;
+    none.entry = Entry::NewString;
+    none.nullResult = true;
+    faults().add(none);
+    const testbed::Instance controller = first("Tovexa_PlexorController");
+    EXPECT_EQ(textOf(controller, "OtherIdentifyingInfo"), "[]");
+    EXPECT_EQ(textOf(controller, "ElementName"), "Controller C0 (Model C0)");
 }
 
 TEST_F(LargeManagerTest, TheBuildForAnotherManagerSaysSoOnce) {

@@ -251,6 +251,43 @@ TEST_F(BrokerObjects, ElementsOfAnotherKindAreNull) {
     EXPECT_EQ(NextPath(numbers), nullptr);
 }
 
+TEST_F(BrokerObjects, ANullPathIsPassedOver) {
+    /// Three elements: a null path, a path, a null path.
+    struct Paths {
+        int given = 0;
+        const CMPIObjectPath* second;
+    };
+    Paths paths{0, broker.makePath(kPath)};
+    CMPIEnumerationFT table = {};
+    table.hasNext = [](const CMPIEnumeration* self, CMPIStatus*) -> CMPIBoolean {
+        return static_cast<const Paths*>(self->hdl)->given < 3;
+    };
+    table.getNext = [](const CMPIEnumeration* self, CMPIStatus*) {
+        auto* of = static_cast<Paths*>(const_cast<void*>(self->hdl));
+        CMPIData data = dataOf(CMPI_ref, 0);
+        if (++of->given == 2) data.value.ref = const_cast<CMPIObjectPath*>(of->second);
+        return data;
+    };
+    const CMPIEnumeration enumeration = {&paths, &table};
+    EXPECT_EQ(NextPath(&enumeration), paths.second);
+    EXPECT_EQ(NextPath(&enumeration), nullptr);
+    EXPECT_EQ(paths.given, 3);
+}
+
+TEST_F(BrokerObjects, AThousandElementsOfAnotherKindInARowEndTheWalk) {
+    const std::vector<ObjectPath> paths(1001, kPath);
+    const std::vector<Instance> instances(1001, instanceAt(kPath));
+    bool failed = false;
+    const CMPIEnumeration* noInstances = broker.makePathEnumeration(paths);
+    EXPECT_EQ(NextInstance(noInstances, &failed), nullptr);
+    EXPECT_TRUE(failed) << "more than an end: what comes behind them is not known";
+    EXPECT_TRUE(HasNext(noInstances)) << "one is left";
+    EXPECT_EQ(NextInstance(broker.makePathEnumeration(paths)), nullptr);
+    const CMPIEnumeration* noPaths = broker.makeInstanceEnumeration(instances);
+    EXPECT_EQ(NextPath(noPaths), nullptr);
+    EXPECT_TRUE(HasNext(noPaths));
+}
+
 TEST_F(BrokerObjects, CurrentBrokerIsTheFactorysLatest) {
     EXPECT_EQ(CurrentBroker(), broker.handle());
 }

@@ -180,5 +180,38 @@ TEST_F(WorkersQuiesce, AnInventoryUnderWayIsGivenUp) {
     EXPECT_EQ(books().liveClones(), 1u) << "the controller's path";
 }
 
+TEST_F(WorkersQuiesce, ALimitThatIsBroughtForwardDuringTheWaitHoldsFromThen) {
+    Gate gate;
+    const GateOpener opener(gate);
+    occupyWorkers(1, gate);
+    static int asked;
+    asked = 0;
+    const auto shrinking = [] {
+        asked++;
+        return Deadline::In(asked == 1 ? 30 : 3);
+    };
+    const HurriedWaits hurry(HurriedWaits::Conditions);
+    EXPECT_FALSE(QuiesceWorkers(shrinking));
+    const auto waits = HurriedWaits::otherWaits();
+    ASSERT_EQ(waits.size(), 2u);
+    EXPECT_GT(waits[0], std::chrono::seconds(29));
+    EXPECT_LE(waits[1], std::chrono::seconds(3));
+    gate.open();
+    EXPECT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
+}
+
+TEST_F(WorkersQuiesce, AnItemOfAnEarlierLifeIsNotWaitedFor) {
+    Gate gate;
+    const GateOpener opener(gate);
+    occupyWorkers(1, gate);
+    BeginWork();
+    const HurriedWaits hurry(HurriedWaits::Conditions);
+    EXPECT_TRUE(quiesceWorkers());
+    EXPECT_TRUE(HurriedWaits::otherWaits().empty());
+    EXPECT_EQ(tasks_.ended(), 0);
+    gate.open();
+    EXPECT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
+}
+
 }  // namespace
 }  // namespace plexortest

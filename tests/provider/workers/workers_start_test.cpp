@@ -1,4 +1,5 @@
 // Starting the workers: the refresh interval, their contexts, what cannot be started.
+#include "stop_at_line.h"
 #include "workers_fixture.h"
 
 namespace plexortest {
@@ -7,7 +8,41 @@ namespace {
 using testbed::Entry;
 using testbed::FaultRule;
 
-class WorkersStart : public WorkersTest {};
+class WorkersStart : public WorkersTest {
+protected:
+    /// Expects that the start, of which nothing was said, has left nothing.
+    void expectNoneStarted() {
+        EXPECT_EQ(books().count(Entry::AttachThread), books().count(Entry::DetachThread));
+        EXPECT_EQ(threadsOf(Entry::AttachThread).count(std::this_thread::get_id()),
+                  threadsOf(Entry::AttachThread).size())
+            << "only here, to end the contexts that nobody uses";
+        EXPECT_EQ(idleLines(), 0u);
+        expectNobodyLeft();
+    }
+};
+
+/// While one lives, a thread that does not ask for a stack of its own gets one that is larger than
+/// the address space: it cannot be created.
+class NoNewThreads {
+public:
+    NoNewThreads() {
+        pthread_getattr_default_np(&before_);
+        pthread_attr_t huge;
+        pthread_attr_init(&huge);
+        EXPECT_EQ(pthread_attr_setstacksize(&huge, std::size_t{1} << 47), 0);
+        EXPECT_EQ(pthread_setattr_default_np(&huge), 0);
+        pthread_attr_destroy(&huge);
+    }
+    ~NoNewThreads() {
+        EXPECT_EQ(pthread_setattr_default_np(&before_), 0);
+        pthread_attr_destroy(&before_);
+    }
+    NoNewThreads(const NoNewThreads&) = delete;
+    NoNewThreads& operator=(const NoNewThreads&) = delete;
+
+private:
+    pthread_attr_t before_;
+};
 
 TEST_F(WorkersStart, TwoWorkersAreStartedAndSaidSo) {
     startWorkers();
@@ -87,6 +122,69 @@ TEST_F(WorkersStart, WithoutMemoryThereIsNoWorker) {
     EXPECT_EQ(tasks_.ended(), 1);
     EXPECT_EQ(books().count(Entry::PrepareAttachThread), 2u);
     EXPECT_EQ(books().count(Entry::DetachThread), 1u) << "the context that nobody uses is ended";
+}
+
+TEST_F(WorkersStart, AThreadThatCannotBeCreatedIsNoWorker) {
+    {
+        const NoNewThreads none;
+        InitPlexorThreads(ctx());
+    }
+    EXPECT_EQ(books().count(Entry::PrepareAttachThread), 2u);
+    EXPECT_EQ(books().count(Entry::DetachThread), 2u) << "the contexts that nobody uses are ended";
+    expectNoneStarted();
+}
+
+TEST_F(WorkersStart, AfterAStopNoneIsStarted) {
+    RequestStop();
+    InitPlexorThreads(ctx());
+    EXPECT_EQ(books().count(Entry::PrepareAttachThread), 2u);
+    EXPECT_EQ(books().count(Entry::DetachThread), 2u);
+    expectNoneStarted();
+}
+
+TEST_F(WorkersStart, AStopDuringTheSearchForTheIntervalIsTheEndOfIt) {
+    const LifeMember member;
+    {
+        const StopAtLine stop("GetSampelInterval: ");
+        InitPlexorThreads(ctx());
+    }
+    EXPECT_EQ(CapturedSyslog::countContaining("Sample interval was set"), 0u);
+    EXPECT_EQ(books().count(Entry::PrepareAttachThread), 0u);
+    expectNoneStarted();
+}
+
+TEST_F(WorkersStart, AStopBehindTheIntervalPreparesNoThread) {
+    const LifeMember member;
+    {
+        const StopAtLine stop("InitPlexorThreads: Sample interval was set to 20 secs\n");
+        InitPlexorThreads(ctx());
+    }
+    EXPECT_EQ(books().count(Entry::PrepareAttachThread), 0u);
+    expectNoneStarted();
+}
+
+TEST_F(WorkersStart, ItsOnlyWorkersQueueIsEmptiedByWhoeverWaits) {
+    FaultRule none;
+    none.entry = Entry::PrepareAttachThread;
+    none.nullResult = true;
+    none.times = 1;
+    faults().add(none);
+    startWorkers(1);
+    EXPECT_FALSE(RunQueuedItemAlone(ctx())) << "nothing is queued";
+    Gate gate;
+    const GateOpener opener(gate);
+    occupyWorkers(1, gate);
+    auto* idle = zeroed<Thread_Args_t>();
+    idle->Arg5 = 4711;
+    ASSERT_EQ(PutItem(&__FIFO, idle), 0);
+    EXPECT_TRUE(RunQueuedItemAlone(ctx())) << "one without a function is done at once";
+    EXPECT_EQ(idle->Arg5, 4711u) << "and not freed";
+    free(idle);
+    tasks_.put([](CMPIContext*, void*) {});
+    EXPECT_TRUE(RunQueuedItemAlone(ctx()));
+    EXPECT_EQ(tasks_.ended(), 1);
+    gate.open();
+    EXPECT_TRUE(eventually([this] { return tasks_.ended() == 2; }));
 }
 
 TEST_F(WorkersStart, StoppingNoWorkerIsHarmless) {

@@ -157,5 +157,20 @@ TEST_F(WorkersStop, BothMarksStaySet) {
     EXPECT_EQ(TerminateThread, 1u);
 }
 
+TEST_F(WorkersStop, WhatAnotherTakesBetweenTheLookAndTheTakingIsNotMissed) {
+    putDeviceItem();
+    void* taken = nullptr;
+    {
+        const HoldWatch atTheLook(__FIFO.Mutex, [&taken] {
+            if (taken == nullptr) RemoveEntryFromList(&__FIFO.List, &taken);
+        });
+        CleanupPlexorThreads();
+    }
+    EXPECT_EQ(queuedItems(), 0u);
+    ASSERT_NE(taken, nullptr);
+    EXPECT_EQ(books().liveClones(), 2u) << "they are whose item it is";
+    ReleaseDeviceItem(static_cast<Thread_Args_t*>(taken));
+}
+
 }  // namespace
 }  // namespace plexortest

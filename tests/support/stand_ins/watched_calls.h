@@ -44,7 +44,7 @@ public:
     static std::vector<const void*> destroyed();
 };
 
-/// Lets NeedUpdate decline. Not seen by the controller's own update, which shares a file with it.
+/// Lets NeedUpdate decline.
 class UpdatesDeclined {
 public:
     UpdatesDeclined();

@@ -1,0 +1,1 @@
+"""What scripts/coverage is made of."""

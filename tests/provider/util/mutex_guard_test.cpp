@@ -1,0 +1,29 @@
+// A scoped lock that could not take its mutex.
+#include <errno.h>
+#include <gtest/gtest.h>
+
+#include "PlexorProviderLock.h"
+
+namespace {
+
+TEST(MutexGuardTest, OneThatCouldNotTakeItsMutexSaysSoAndGivesNothingBack) {
+    pthread_mutexattr_t checking;
+    pthread_mutexattr_init(&checking);
+    pthread_mutexattr_settype(&checking, PTHREAD_MUTEX_ERRORCHECK);
+    pthread_mutex_t mutex;
+    pthread_mutex_init(&mutex, &checking);
+    {
+        const MutexGuard first(mutex);
+        EXPECT_TRUE(first.Locked());
+        {
+            const MutexGuard second(mutex);
+            EXPECT_FALSE(second.Locked());
+        }
+        EXPECT_EQ(pthread_mutex_lock(&mutex), EDEADLK) << "the first still has it";
+    }
+    EXPECT_EQ(pthread_mutex_unlock(&mutex), EPERM) << "nobody has it";
+    pthread_mutex_destroy(&mutex);
+    pthread_mutexattr_destroy(&checking);
+}
+
+}  // namespace
