@@ -39,6 +39,11 @@ void run(int drives, const std::string& library) {
             ("refresh/" + std::to_string(drives) + "/" + name).c_str(),
             [&shelf, wanted = results](benchmark::State& state) { refresh(state, shelf, wanted); })
             ->Unit(benchmark::kMillisecond);
+    benchmark::RegisterBenchmark(("refresh/" + std::to_string(drives) + "/members").c_str(),
+                                 [&shelf](benchmark::State& state) {
+                                     for (auto _ : state) shelf.lookUpMembers();
+                                 })
+        ->Unit(benchmark::kMillisecond);
     benchmark::RunSpecifiedBenchmarks();
 }
 

@@ -1,7 +1,5 @@
 #include "shelf.h"
 
-#include <PlexorProvider.h>
-
 #include <algorithm>
 #include <thread>
 
@@ -58,14 +56,29 @@ void Shelf::arrange(Results results) {
     testbed::buildVendor(session_.repository(), scenario_);
 }
 
-void Shelf::refresh() {
+RaidController_t* Shelf::controller() const {
     const auto* controllers = *library_->symbol<List_t*>("RaidControllerList");
+    return static_cast<RaidController_t*>(controllers->Head->Data);
+}
+
+void Shelf::refresh() {
     const auto process =
         library_->symbol<decltype(ProcessDeviceConfigChange)>("ProcessDeviceConfigChange");
     FastClock::skip(std::chrono::seconds(kNeverSeconds));
     const testbed::Broker::CallScope scope(broker());
-    process(client().mi(), scope.context(), static_cast<RaidController_t*>(controllers->Head->Data),
-            ACTION_DISK);
+    process(client().mi(), scope.context(), controller(), ACTION_DISK);
+}
+
+void Shelf::lookUpMembers() {
+    const auto find = library_->symbol<decltype(FindStoragePoolByID)>("FindStoragePoolByID");
+    const auto add = library_->symbol<decltype(AddDiskToPool)>("AddDiskToPool");
+    RaidController_t* ctrl = controller();
+    pthread_mutex_lock(&ctrl->CtrlMutex);
+    for (const List_Entry_t* entry = ctrl->DiskList->Head; entry != nullptr; entry = entry->Next) {
+        const auto* disk = static_cast<const DiskDrive_t*>(entry->Data);
+        add(find(ctrl, disk->Pool), disk->DeviceID);
+    }
+    pthread_mutex_unlock(&ctrl->CtrlMutex);
 }
 
 }  // namespace bench

@@ -1,6 +1,8 @@
 // A provider with a shelf of drives in its cache, and refreshes of them at a moment of one's own.
 #pragma once
 
+#include <PlexorProvider.h>
+
 #include <memory>
 #include <random>
 #include <string>
@@ -44,8 +46,12 @@ public:
     /// One refresh of the drives and, before it, their pools, on this thread. The provider's texts
     /// and objects are gone when it returns.
     void refresh();
+    /// What a refresh does to find out that each drive is in its pool already.
+    void lookUpMembers();
 
 private:
+    RaidController_t* controller() const;
+
     const testbed::PollingInterval interval_;
     testbed::Scenario scenario_;
     std::vector<testbed::DriveDescription> cached_;  // in the order in which they were found
