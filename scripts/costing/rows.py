@@ -88,8 +88,9 @@ def refresh(found):
     for order in ORDERS + [MEMBERS]:
         numbers = sizes(found, f"refresh/N/{order}")
         for drives in numbers:
-            yield Row(f"refresh, {order}", f"{drives:,}", found[f"refresh/{drives}/{order}"] / 1e6,
-                      unit="ms", digits=1)
+            time = found[f"refresh/{drives}/{order}"] / 1e6
+            yield Row(f"refresh, {order}", f"{drives:,}", time, unit="ms",
+                      digits=max(0, 2 - math.floor(math.log10(time))))
         if len(numbers) < 2:
             continue
         less, more = numbers[-2:]
@@ -124,7 +125,7 @@ def inventory(found):
         room = found[f"{name}/waits-for-room"]
         waits = room + found[f"{name}/waits-for-end"]
         yield Row("inventory: waits for room", f"{drives:,}", room,
-                  math.ceil(drives / FIFO_LIMIT) - 1, "s", 0)
+                  math.ceil(drives / FIFO_LIMIT) - 1, digits=0)
         yield Row("inventory, all but the waits", f"{drives:,}",
                   (found[f"{name}/walk"] - waits) * 1000, None, "ms", 0)
         yield Row("inventory, to the waits", f"{drives:,}", found[f"{name}/walk"] / waits, WALK_RATIO)

@@ -17,16 +17,15 @@ class Form:
     drives: list
     walks: list           # drives of the inventories with a vendor that answers at once
     slow_walks: list      # and in 20 ms
-    repetitions: int      # of requests
+    repetitions: dict     # of requests, up to that many drives
     refreshes: int        # repetitions of refreshes
     rounds: int           # of the crowd
     idle: int             # seconds
 
 
-FULL = Form([24, 240, 1000, 4000], [24, 240, 1000], [24, 100], 41, 7, 15, 30)
-QUICK = Form([24, 240], [24, 240], [24], 21, 5, 3, 10)
+FULL = Form([24, 240, 1000, 4000], [24, 240, 1000], [24, 100], {240: 101, 1000: 41, 4000: 21}, 7, 15, 30)
+QUICK = Form([24, 240], [24, 240], [24], {240: 31}, 5, 3, 10)
 
-MANY = 4000          # from here on a request takes seconds when all repetitions are made
 NANOSECONDS = {"ns": 1, "us": 1e3, "ms": 1e6, "s": 1e9}
 
 
@@ -85,7 +84,7 @@ def own(program, name, directory, *more):
 def serving(form, programs, directory):
     found = {}
     for drives in form.drives:
-        repetitions = form.repetitions if drives < MANY else form.repetitions // 2
+        repetitions = next(number for limit, number in form.repetitions.items() if drives <= limit)
         for log, program, more in (("masked", "serving-cost", []),
                                    ("open", "serving-cost-open", ["--open"])):
             found |= google(programs / program, f"{log}/", drives, repetitions, 0.01, directory, *more)
