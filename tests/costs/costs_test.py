@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""scripts/costs: which measurements it lets pass.
+"""scripts/costs: which measurements it lets pass, and that docs/performance.md shows what was measured.
 
   costs_test.py SOURCE_TREE
 """
@@ -66,6 +66,15 @@ class Verdicts(unittest.TestCase):
     def test_a_file_that_is_missing_is_a_failure_of_another_kind(self):
         with contextlib.redirect_stderr(io.StringIO()):
             self.assertEqual(2, costs.main(["--judge", "/nonexistent/costs.json"]))
+
+
+class Page(unittest.TestCase):
+    def test_the_page_has_the_table_of_the_measurements_beside_it(self):
+        page = (SOURCE / "docs/performance.md").read_text()
+        out = io.StringIO()
+        with contextlib.redirect_stdout(out):
+            costs.main(["--judge", str(SOURCE / "docs/performance.json"), "--markdown"])
+        self.assertIn(out.getvalue(), page)
 
 
 if __name__ == "__main__":
