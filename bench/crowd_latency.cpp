@@ -2,10 +2,11 @@
 //
 //   crowd-latency [--clients N] [--rounds N] [--seconds N] [--pause MS] [--json FILE]
 //
-// Each round has a window for each vendor, so that a change of the machine meets all alike; each
-// client pauses between two of its requests. With the slow vendors a refresh is under way all the
-// time. Names of the measurements: crowd/at-once/p99, and so on; the ratios are to the same round's
-// window with the vendor that answers at once, and the one in the middle of all rounds'.
+// Each round has a window for each vendor, so that a change of the machine meets all alike, and
+// lets the refreshes that have waited come to an end in between; each client pauses between two of
+// its requests. With the slow vendors a refresh is under way all the time. Names of the
+// measurements: crowd/at-once/p99, and so on; the ratios are to the same round's window with the
+// vendor that answers at once, and the one in the middle of all rounds'.
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
@@ -32,6 +33,7 @@ using Clock = std::chrono::steady_clock;
 constexpr seconds kInventoryLimit{60};
 constexpr seconds kGrace{4};  // what the provider lets pass before its first refresh, and more
 constexpr seconds kQueryLimit{20};
+constexpr seconds kSettle{2};  // for the refreshes that have waited, before the next window
 
 struct Mood {
     const char* name;
@@ -85,22 +87,32 @@ void provokeQuery(testbed::InstanceClient client, HeldVendor& vendor) {
     }
 }
 
-/// Windows in turn; p99 of each by mood.
+/// The times of a window with a vendor of that mood.
+std::vector<double> windowOf(testbed::ProviderSession& session, HeldVendor& vendor,
+                             const Mood& mood, const Crowd& crowd) {
+    vendor.answerIn(mood.answerTime);
+    if (mood.answerTime.count() != 0) provokeQuery(session.client(), vendor);
+    std::vector<double> times = window(session.client(), crowd);
+    vendor.release();
+    std::this_thread::sleep_for(kSettle);
+    return times;
+}
+
+/// Windows in turn, another one first in each round.
 void measure(Measurements& found, testbed::ProviderSession& session, HeldVendor& vendor,
              const Crowd& crowd) {
     std::map<std::string, std::vector<double>> medians, rare, ratios;
     std::size_t requests = 0;
     for (int round = 0; round < crowd.rounds; round++) {
-        for (const Mood& mood : kMoods) {
-            vendor.answerIn(mood.answerTime);
-            if (mood.answerTime.count() != 0) provokeQuery(session.client(), vendor);
-            const std::vector<double> times = window(session.client(), crowd);
-            vendor.release();
+        for (std::size_t i = 0; i < std::size(kMoods); i++) {
+            const Mood& mood = kMoods[(static_cast<std::size_t>(round) + i) % std::size(kMoods)];
+            const std::vector<double> times = windowOf(session, vendor, mood, crowd);
             requests += times.size();
             medians[mood.name].push_back(middle(times));
             rare[mood.name].push_back(middle(times, 0.99));
-            ratios[mood.name].push_back(rare[mood.name].back() / rare["at-once"].back());
         }
+        for (const Mood& mood : kMoods)
+            ratios[mood.name].push_back(rare[mood.name].back() / rare["at-once"].back());
     }
     for (const Mood& mood : kMoods) {
         const std::string name = std::string("crowd/") + mood.name;
