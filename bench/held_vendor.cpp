@@ -47,9 +47,17 @@ bool HeldVendor::waitForQuery(std::chrono::milliseconds limit) {
     return changed_.wait_for(lock, limit, [&] { return waiting_ > 0; });
 }
 
+void HeldVendor::answerIn(std::chrono::milliseconds answerTime) {
+    const std::lock_guard lock(mutex_);
+    answerTime_ = answerTime;
+    released_ = answerTime.count() == 0;
+}
+
 void HeldVendor::release() {
     const std::lock_guard lock(mutex_);
     released_ = true;
+    waiting_ = 0;
+    passed_++;
     changed_.notify_all();
 }
 

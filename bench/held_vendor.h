@@ -1,4 +1,4 @@
-// A vendor whose answers take ten seconds, and can be let go earlier.
+// A vendor whose answers take long, and can be let go earlier.
 #pragma once
 
 #include <chrono>
@@ -19,18 +19,20 @@ public:
     int letThrough();
     /// True as soon as a query is waiting, false when none comes in time.
     bool waitForQuery(std::chrono::milliseconds limit);
-    /// Answers everything at once from now on.
+    /// From now on its answers take that time; 0 is at once.
+    void answerIn(std::chrono::milliseconds answerTime);
+    /// Answers everything at once from now on, what waits as well.
     void release();
 
 private:
     void hold();
 
-    std::chrono::milliseconds answerTime_;
     std::mutex mutex_;
     std::condition_variable changed_;
-    int waiting_ = 0;           // guarded by mutex_
-    std::uint64_t passed_ = 0;  // calls of letThrough; guarded by mutex_
-    bool released_ = false;     // guarded by mutex_
+    std::chrono::milliseconds answerTime_;  // guarded by mutex_
+    int waiting_ = 0;                       // guarded by mutex_
+    std::uint64_t passed_ = 0;              // calls of letThrough; guarded by mutex_
+    bool released_ = false;                 // guarded by mutex_; nothing waits
 };
 
 }  // namespace bench

@@ -1,20 +1,21 @@
 // How long the first inventory takes, and how much of it the provider spends waiting: for room in
-// its queue, and for the last device, a second at a time.
+// its queue, and for the last device, a second at a time; and how many of the vendor's answers the
+// thread that asks most of them waits for. From the walk over the devices on.
 //
-//   inventory-cost [--drives N...] [--answer-time MS] [--library FILE]
+//   inventory-cost [--drives N...] [--answer-time MS] [--json FILE] [--library FILE]
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
-#include <atomic>
-#include <cstdarg>
-#include <cstdio>
+#include <algorithm>
 #include <cstdlib>
-#include <cstring>
 #include <iostream>
+#include <map>
 #include <thread>
 
 #include "bench_clients.h"
+#include "counted_log.h"
 #include "drive_shelf.h"
+#include "measurements.h"
 #include "provider_session.h"
 
 namespace bench {
@@ -26,21 +27,10 @@ using Clock = std::chrono::steady_clock;
 constexpr std::chrono::minutes kLimit{10};
 constexpr milliseconds kLook{5};
 
-/// A line of the provider's log, and how often it came.
-struct CountedLine {
-    const char* text;
-    std::atomic<int> count = 0;
-};
+CountedLine walkBegun{"BuildLogicalDeviceInfo, enter...\n"};
 CountedLine queueFull{"BuildLogicalDeviceInfo: FIFO full, waiting...\n"};
 CountedLine notEmpty{"BuildLogicalDeviceInfo: FIFO not empty, waiting...\n"};
 CountedLine walkDone{"BuildLogicalDeviceInfo, DONE...\n"};
-
-[[gnu::format(printf, 1, 0)]] void countLine(const char* format, va_list args) {
-    char text[256];
-    std::vsnprintf(text, sizeof text, format, args);
-    for (CountedLine* line : {&queueFull, &notEmpty, &walkDone})
-        if (std::strcmp(text, line->text) == 0) ++line->count;
-}
 
 void waitFor(const std::function<bool()>& condition) {
     const auto limit = Clock::now() + kLimit;
@@ -50,62 +40,61 @@ void waitFor(const std::function<bool()>& condition) {
     }
 }
 
-double secondsSince(Clock::time_point start) {
-    return std::chrono::duration<double>(Clock::now() - start).count();
+double secondsFromBegin(Clock::time_point end) {
+    return std::chrono::duration<double>(end - walkBegun.when()).count();
 }
 
-void measure(int drives, milliseconds answerTime, const std::string& library) {
-    for (CountedLine* line : {&queueFull, &notEmpty, &walkDone}) line->count = 0;
-    const auto start = Clock::now();
+/// How many of the vendor's answers one thread alone has waited for, at most.
+std::size_t longestWait(const testbed::Books& books) {
+    std::map<std::thread::id, std::size_t> answers;
+    std::size_t most = 0;
+    for (const testbed::CallRecord& call : books.queries())
+        most = std::max(most, ++answers[call.thread]);
+    return most;
+}
+
+void measure(Measurements& found, int drives, milliseconds answerTime, const std::string& library) {
+    for (CountedLine* line : {&walkBegun, &queueFull, &notEmpty, &walkDone}) line->reset();
     testbed::ProviderSession session(driveShelf(drives, answerTime), library, "PlexorProvider");
-    session.broker().books().keepCalls(false);
     testbed::InstanceClient client = session.client();
     waitFor([&] {
         return client.enumerateInstanceNames("Tovexa_PlexorStorageExtent").paths.size() ==
                static_cast<std::size_t>(drives);
     });
-    const double complete = secondsSince(start);
-    waitFor([] { return walkDone.count > 0; });
-    std::printf("%7d %12.2f %12.2f %15d %15d\n", drives, complete, secondsSince(start),
-                queueFull.count.load(), notEmpty.count.load());
-    std::fflush(stdout);
+    const double complete = secondsFromBegin(Clock::now());
+    waitFor([] { return walkDone.count() > 0; });
+    const std::string name =
+        "inventory/" + std::to_string(drives) + "/" + std::to_string(answerTime.count()) + "ms/";
+    found.add(name + "all-there", complete, "s");
+    found.add(name + "walk", secondsFromBegin(walkDone.when()), "s");
+    found.add(name + "waits-for-room", queueFull.count(), "waits");
+    found.add(name + "waits-for-end", notEmpty.count(), "waits");
+    found.add(name + "answers", static_cast<double>(longestWait(session.broker().books())),
+              "answers");
 }
 
 }  // namespace
 }  // namespace bench
 
-// The provider's log is counted, not written. Which name it calls depends on how it was compiled.
-extern "C" void syslog(int, const char* format, ...) {
-    va_list args;
-    va_start(args, format);
-    bench::countLine(format, args);
-    va_end(args);
-}
-extern "C" void __syslog_chk(int, int, const char* format, ...) {
-    va_list args;
-    va_start(args, format);
-    bench::countLine(format, args);
-    va_end(args);
-}
-
 int main(int argc, char** argv) {
     std::vector<int> drives = {10, 20, 40, 100, 240, 1000};
     int answerTime = 0;
-    std::string library = PROVIDER;
+    std::string library = PROVIDER, json;
     CLI::App app("Measures the provider's first inventory");
     app.add_option("--drives", drives, "Numbers of drives")->check(CLI::Range(1, 100000));
     app.add_option("--answer-time", answerTime,
                    "Milliseconds that each of the vendor's answers takes")
         ->check(CLI::Range(0, 10000));
+    app.add_option("--json", json, "File for what was found");
     app.add_option("--library", library, "The provider's library");
     CLI11_PARSE(app, argc, argv);
 
     setlogmask(LOG_UPTO(LOG_ERR));
-    std::printf("%7s %12s %12s %15s %15s\n", "drives", "all there s", "walk ends s",
-                "waits for room", "waits for end");
     try {
+        bench::Measurements found;
         for (const int count : drives)
-            bench::measure(count, std::chrono::milliseconds(answerTime), library);
+            bench::measure(found, count, std::chrono::milliseconds(answerTime), library);
+        found.write(json);
     } catch (const std::exception& error) {
         std::cerr << error.what() << std::endl;
         return EXIT_FAILURE;

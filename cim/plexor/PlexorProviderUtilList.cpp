@@ -1,6 +1,10 @@
 // Lists and the bounded FIFO.
+#include "PlexorProviderUtilList.h"
+
 #include <stdlib.h>
 #include <strings.h>
+
+#include <atomic>
 
 #include "PlexorProviderLock.h"
 #include "PlexorProviderUtil.h"
@@ -8,6 +12,8 @@
 Fifo_t __FIFO = {PTHREAD_MUTEX_INITIALIZER, 20, {nullptr, nullptr, 0}};
 
 namespace {
+
+std::atomic<std::uint64_t> __EntriesRemoved = 0;
 
 List_Entry_t* NewEntry(void* data) {
     auto* entry = static_cast<List_Entry_t*>(calloc(1, sizeof(List_Entry_t)));
@@ -26,10 +32,15 @@ void EntryRemoved(List_t* list, List_Entry_t* entry, void* data) {
     list->Size--;
     syslog(LOG_DEBUG, "Data %p removed from list %p, size %d\n", data, static_cast<void*>(list),
            static_cast<int>(list->Size));
+    __EntriesRemoved++;
     free(entry);
 }
 
 }  // namespace
+
+std::uint64_t EntriesRemoved() {
+    return __EntriesRemoved;
+}
 
 int CMStringCmp(const CMPIString* str1, const char* str2) {
     const char* text = StringText(str1);

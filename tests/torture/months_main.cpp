@@ -2,8 +2,6 @@
 // another order each time, and what the process then has in memory.
 //
 //   months-test [--refreshes N] [--manager KIND] [--library FILE] [--scenario FILE]
-#include <dlfcn.h>
-#include <pthread.h>
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
@@ -13,6 +11,7 @@
 #include <stdexcept>
 #include <thread>
 
+#include "idle_workers.h"
 #include "manager_option.h"
 #include "process_view.h"
 #include "provider_session.h"
@@ -27,42 +26,7 @@ constexpr int kWarmUp = 100;
 
 std::atomic<std::time_t> now = 1'700'000'000;
 
-/// The library's own words, for the moment at which its workers have nothing to do.
-class Workers {
-public:
-    explicit Workers(const std::string& library)
-        : handle_(dlopen(library.c_str(), RTLD_NOW | RTLD_NOLOAD)),
-          mutex_(symbol<pthread_mutex_t>("PlexorThreadMutex")),
-          active_(symbol<unsigned int>("ActiveThreads")),
-          queue_(dlsym(handle_, "__FIFO")),
-          isEmpty_(reinterpret_cast<int (*)(void*)>(dlsym(handle_, "IsFifoEmpty"))) {}
-    ~Workers() { dlclose(handle_); }
-    Workers(const Workers&) = delete;
-    Workers& operator=(const Workers&) = delete;
-
-    bool areIdle() const {
-        pthread_mutex_lock(mutex_);
-        const bool idle = isEmpty_(queue_) != 0 && *active_ == 0;
-        pthread_mutex_unlock(mutex_);
-        return idle;
-    }
-
-private:
-    template <typename Symbol>
-    Symbol* symbol(const char* name) {
-        void* address = handle_ != nullptr ? dlsym(handle_, name) : nullptr;
-        if (address == nullptr) throw std::runtime_error(std::string("the library has no ") + name);
-        return static_cast<Symbol*>(address);
-    }
-
-    void* handle_;
-    pthread_mutex_t* mutex_;
-    unsigned int* active_;
-    void* queue_;
-    int (*isEmpty_)(void*);
-};
-
-void refresh(testbed::ProviderSession& session, const Workers& workers) {
+void refresh(testbed::ProviderSession& session, const IdleWorkers& workers) {
     now += kInterval;
     session.client().enumerateInstanceNames("Tovexa_PlexorStorageExtent");
     while (!workers.areIdle()) std::this_thread::sleep_for(std::chrono::microseconds(200));
@@ -79,7 +43,7 @@ bool run(int refreshes, const std::string& file, const std::string& library,
     if (!session.waitForInventory(std::chrono::minutes(5), "root/cimv2"))
         throw std::runtime_error("the inventory does not arrive");
     now += 10;
-    const Workers workers(library);
+    const IdleWorkers workers(library);
     std::size_t settled = 0;
     for (int i = 1; i <= refreshes; i++) {
         refresh(session, workers);

@@ -1,4 +1,7 @@
 // The drives that a pool lists.
+#include <sys/mman.h>
+#include <unistd.h>
+
 #include "provider_fixture.h"
 
 namespace plexortest {
@@ -48,6 +51,52 @@ TEST_F(PoolMembership, DriveIsListedOnce) {
     AddDiskToPool(pool, "D1");
     EXPECT_EQ(members(), (Names{"D0", "D1"}));
     EXPECT_EQ(CapturedSyslog::countContaining("Adding data"), 0u);
+}
+
+TEST_F(PoolMembership, ADriveIsListedOnceInWhateverOrderItIsAskedFor) {
+    const Names ids = {"D0", "D1", "D2", "D3"};
+    for (const std::string& id : ids) AddDiskToPool(pool, id.c_str());
+    for (const char* id : {"D2", "D3", "D3", "D0", "D2", "D1"}) AddDiskToPool(pool, id);
+    EXPECT_EQ(members(), ids);
+}
+
+/// An entry whose text nobody may look at.
+void forbid(List_Entry_t* entry) {
+    entry->Data = mmap(nullptr, 1, PROT_NONE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+    ASSERT_NE(entry->Data, MAP_FAILED);
+}
+
+TEST_F(PoolMembership, ADriveBehindTheOneFoundLastIsFoundWithoutALookAtThoseBefore) {
+    for (const char* id : {"D0", "D1", "D2", "D3"}) AddDiskToPool(pool, id);
+    AddDiskToPool(pool, "D1");
+    EXPECT_EXIT(
+        {
+            forbid(pool->Drives->Head);
+            for (const char* id : {"D1", "D2", "D3"}) AddDiskToPool(pool, id);
+            _exit(0);
+        },
+        ::testing::ExitedWithCode(0), "");
+}
+
+TEST_F(PoolMembership, TheOneFoundLastMayBeRemoved) {
+    for (const char* id : {"D0", "D1", "D2"}) AddDiskToPool(pool, id);
+    AddDiskToPool(pool, "D1");
+    RemoveDiskFromPool(pool, "D1");
+    AddDiskToPool(pool, "D2");
+    EXPECT_EQ(members(), (Names{"D0", "D2"}));
+    AddDiskToPool(pool, "D1");
+    EXPECT_EQ(members(), (Names{"D0", "D2", "D1"}));
+}
+
+TEST_F(PoolMembership, WhatWasFoundInOnePoolSaysNothingOfAnother) {
+    StoragePool_t* other = attach(attach(newController("C1")), newPool("P1"));
+    for (const char* id : {"D0", "D1"}) AddDiskToPool(pool, id);
+    AddDiskToPool(pool, "D1");
+    AddDiskToPool(other, "D1");
+    AddDiskToPool(other, "D0");
+    AddDiskToPool(pool, "D0");
+    EXPECT_EQ(members(), (Names{"D0", "D1"}));
+    EXPECT_EQ(other->_Drives.Size, 2u);
 }
 
 TEST_F(PoolMembership, LetterCaseCounts) {

@@ -1,0 +1,81 @@
+#!/usr/bin/env python3
+"""scripts/costs: which measurements it lets pass, and that docs/performance.md shows what was measured.
+
+  costs_test.py SOURCE_TREE
+"""
+import contextlib
+import importlib.machinery
+import io
+import json
+import pathlib
+import sys
+import tempfile
+import unittest
+
+sys.dont_write_bytecode = True
+SOURCE = pathlib.Path(sys.argv.pop(1)) if len(sys.argv) > 1 else pathlib.Path(__file__).parents[2]
+sys.path.insert(0, str(SOURCE / "scripts"))
+costs = importlib.machinery.SourceFileLoader("costs", str(SOURCE / "scripts/costs")).load_module()
+
+SERVING = {"masked/names/24/bare": 100.0, "masked/names/24/provider": 110.0}
+COUNTS = {"get/24/calls": 26, "get/240/calls": 26, "get/1000/calls": 26}
+
+
+def judged(measurements, *options):
+    """Exit status and lines of the table for these measurements."""
+    with tempfile.NamedTemporaryFile("w", suffix=".json") as file:
+        json.dump({"measurements": measurements}, file)
+        file.flush()
+        out = io.StringIO()
+        with contextlib.redirect_stdout(out):
+            status = costs.main(["--judge", file.name, *options])
+    return status, out.getvalue().splitlines()
+
+
+class Verdicts(unittest.TestCase):
+    def test_a_ratio_at_its_limit_passes(self):
+        status, lines = judged(SERVING)
+        self.assertEqual(0, status)
+        self.assertEqual("names, log masked, to constants  24      1.10      1.10   ok", lines[1])
+        self.assertEqual("1 rows, 1 with a limit, 0 over it", lines[-1])
+
+    def test_a_ratio_over_its_limit_fails_and_is_marked(self):
+        status, lines = judged(SERVING | {"masked/names/24/provider": 112.0})
+        self.assertEqual(1, status)
+        self.assertEqual("names, log masked, to constants  24      1.12      1.10   OVER", lines[1])
+        self.assertEqual("1 rows, 1 with a limit, 1 over it", lines[-1])
+
+    def test_an_open_log_and_4000_drives_have_no_limit(self):
+        for name in ("open/names/24", "masked/names/4000"):
+            status, lines = judged({f"{name}/bare": 100.0, f"{name}/provider": 500.0})
+            self.assertEqual(0, status)
+            self.assertEqual("1 rows, 0 with a limit, 0 over it", lines[-1])
+
+    def test_one_call_more_for_a_request_is_over_the_limit(self):
+        self.assertEqual(0, judged(COUNTS)[0])
+        self.assertEqual(1, judged({name: 27 for name in COUNTS})[0])
+
+    def test_a_count_that_grows_faster_than_the_drives_is_over_the_limit(self):
+        self.assertEqual(1, judged(COUNTS | {"get/1000/calls": 27})[0])
+
+    def test_time_for_each_drive_that_grows_with_the_drives_is_over_the_limit(self):
+        linear = {"refresh/1000/random": 100e6, "refresh/4000/random": 400e6}
+        self.assertEqual(0, judged(linear)[0])
+        self.assertEqual(1, judged(linear | {"refresh/4000/random": 1600e6})[0])
+
+    def test_a_file_that_is_missing_is_a_failure_of_another_kind(self):
+        with contextlib.redirect_stderr(io.StringIO()):
+            self.assertEqual(2, costs.main(["--judge", "/nonexistent/costs.json"]))
+
+
+class Page(unittest.TestCase):
+    def test_the_page_has_the_table_of_the_measurements_beside_it(self):
+        page = (SOURCE / "docs/performance.md").read_text()
+        out = io.StringIO()
+        with contextlib.redirect_stdout(out):
+            costs.main(["--judge", str(SOURCE / "docs/performance.json"), "--markdown"])
+        self.assertIn(out.getvalue(), page)
+
+
+if __name__ == "__main__":
+    unittest.main()
