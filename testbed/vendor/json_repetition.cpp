@@ -37,7 +37,9 @@ std::uint64_t countElements(const JsonPlace& place) {
     const json& value = *place.value;
     std::uint64_t sum = 0;
     if (value.is_object()) {
-        for (const auto& [name, child] : value.items()) sum += countElements(place.member(name));
+        for (const auto& [name, child] : value.items()) {
+            if (child.is_structured()) sum += countElements(place.member(name));
+        }
     }
     if (value.is_array()) {
         for (std::size_t i = 0; i < value.size(); ++i) {
