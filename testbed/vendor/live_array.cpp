@@ -23,7 +23,7 @@ LiveArray::LiveArray(Broker& broker, const std::string& file)
       scenario_(scenarioOf(document_, file)),
       vendor_(broker.repository(), scenario_) {
     buildVendor(broker_.repository(), scenario_);
-    begin(original_);
+    begin(original_, scenario_);
 }
 
 /// The faults that stay remain as far used up as they are; all that is new is armed behind them.
@@ -60,11 +60,10 @@ void LiveArray::adopt(json document, Scenario next) {
 }
 
 /// The document as it stands, all faults armed anew, and its timeline from now on.
-void LiveArray::begin(json document) {
+void LiveArray::begin(json document, Scenario next) {
     std::vector<std::pair<json, int>> old;
     old.swap(armed_);
     try {
-        Scenario next = scenarioOf(document, "command");
         adopt(std::move(document), std::move(next));
     } catch (const ScenarioError&) {
         armed_ = std::move(old);
@@ -80,12 +79,12 @@ void LiveArray::begin(json document) {
 
 void LiveArray::reload() {
     json document = readScenarioDocument(file_);
-    begin(document);
+    begin(document, scenarioOf(document, "command"));
     original_ = std::move(document);
 }
 
 void LiveArray::reset() {
-    begin(original_);
+    begin(original_, begun_);
 }
 
 void LiveArray::apply(const std::string& command) {

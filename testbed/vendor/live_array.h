@@ -58,7 +58,7 @@ public:
 private:
     /// `next` is what the document describes.
     void adopt(nlohmann::json document, Scenario next);
-    void begin(nlohmann::json document);
+    void begin(nlohmann::json document, Scenario next);
     void armFaults(const nlohmann::json& document, const Scenario& scenario);
     void follow(const Aftermath& aftermath);
 
