@@ -34,7 +34,9 @@ const CimValue* findValue(const std::vector<NamedValue>& values, std::string_vie
 }
 
 void appendFolded(std::string& result, std::string_view name) {
-    for (char character : name) result += foldCharacter(character);
+    const auto end = static_cast<std::ptrdiff_t>(result.size());
+    result += name;
+    std::transform(result.begin() + end, result.end(), result.begin() + end, foldCharacter);
 }
 
 void appendQuoted(std::string& result, std::string_view text) {

@@ -200,6 +200,7 @@ PlacedVendor::Graphs PlacedVendor::describe(const Scenario* before, const Scenar
 
 void PlacedVendor::change(const Scenario& before, const Scenario& after) {
     Graphs next = describe(&before, after);
+    if (next == graphs_) return;
     placeNew(repository_, next, Contents(graphs_));
     withdrawOld(repository_, graphs_, Contents(next));
     graphs_ = std::move(next);
