@@ -27,9 +27,28 @@ elseif(CMAKE_BUILD_TYPE STREQUAL "Release")
 endif()
 if(PLEXOR_FUZZ)
     # What is linked with libFuzzer says so itself; all other code only tells it where it has been.
-    add_compile_options(-fsanitize=fuzzer-no-link)
+    # Optimized, as an execution's time is what counts.
+    add_compile_options(-fsanitize=fuzzer-no-link -O2)
     add_compile_definitions(_GLIBCXX_ASSERTIONS)
 endif()
+# For code that harnesses run but do not aim at: libFuzzer is not told where in it an input has been.
+function(plexor_no_fuzz_guidance)
+    if(PLEXOR_FUZZ)
+        foreach(target IN LISTS ARGN)
+            target_compile_options(${target} PRIVATE
+                -fno-sanitize-coverage=edge,inline-8bit-counters,pc-table,indirect-calls,trace-cmp,stack-depth)
+        endforeach()
+    endif()
+endfunction()
+# For readers of texts: a number that is compared does not stand in an input as it is in memory. The texts
+# that are compared are still told.
+function(plexor_fuzz_guidance_by_texts)
+    if(PLEXOR_FUZZ)
+        foreach(target IN LISTS ARGN)
+            target_compile_options(${target} PRIVATE -fno-sanitize-coverage=trace-cmp)
+        endforeach()
+    endif()
+endfunction()
 if(PLEXOR_COVERAGE)
     add_compile_options(-fprofile-instr-generate -fcoverage-mapping -fprofile-update=atomic)
     add_link_options(-fprofile-instr-generate)

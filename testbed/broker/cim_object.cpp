@@ -33,13 +33,19 @@ const CimValue* findValue(const std::vector<NamedValue>& values, std::string_vie
     return found == values.end() ? nullptr : &found->second;
 }
 
-std::string quoted(const std::string& text, bool escape) {
-    std::string result = "\"";
+void appendFolded(std::string& result, std::string_view name) {
+    const auto end = static_cast<std::ptrdiff_t>(result.size());
+    result += name;
+    std::transform(result.begin() + end, result.end(), result.begin() + end, foldCharacter);
+}
+
+void appendQuoted(std::string& result, std::string_view text) {
+    result += '"';
     for (char character : text) {
-        if (escape && (character == '"' || character == '\\')) result += '\\';
+        if (character == '"' || character == '\\') result += '\\';
         result += character;
     }
-    return result + '"';
+    result += '"';
 }
 
 bool isText(const CimValue& value) {
@@ -47,13 +53,25 @@ bool isText(const CimValue& value) {
 }
 
 /// A key value that is equal for equal content: integers compare by number, whatever their width.
-std::string keyIdentity(const CimValue& value) {
-    if (value.isNull) return "<null>";
-    if (isText(value)) return quoted(value.asString(), true);
-    if (const auto* path = std::get_if<std::shared_ptr<const ObjectPath>>(&value.data)) {
-        return quoted((*path)->identity(), true);
+void appendKeyIdentity(std::string& result, const CimValue& value) {
+    if (value.isNull) {
+        result += "<null>";
+    } else if (isText(value)) {
+        appendQuoted(result, value.asString());
+    } else if (const auto* path = std::get_if<std::shared_ptr<const ObjectPath>>(&value.data)) {
+        appendQuoted(result, (*path)->identity());
+    } else {
+        result += value.text();
     }
-    return value.text();
+}
+
+/// `name=value`, of which a path's identity has one for each key.
+std::string identityOf(const NamedValue& key) {
+    std::string result;
+    appendFolded(result, key.first);
+    result += '=';
+    appendKeyIdentity(result, key.second);
+    return result;
 }
 
 }  // namespace
@@ -64,9 +82,16 @@ bool sameName(std::string_view left, std::string_view right) {
 }
 
 std::string foldName(std::string_view name) {
-    std::string folded(name);
-    std::transform(folded.begin(), folded.end(), folded.begin(), foldCharacter);
+    std::string folded;
+    appendFolded(folded, name);
     return folded;
+}
+
+std::size_t NameHash::operator()(std::string_view name) const {
+    std::size_t hash = 0;
+    for (char character : name)
+        hash = hash * 131 + static_cast<unsigned char>(foldCharacter(character));
+    return hash;
 }
 
 ObjectPath& ObjectPath::key(std::string_view name, CimValue value) {
@@ -88,23 +113,25 @@ std::string ObjectPath::text() const {
     char separator = '.';
     for (const auto& [name, value] : keys) {
         result += separator + name + "=";
-        result += isText(value) ? quoted(value.asString(), false) : value.text();
+        result += isText(value) ? '"' + value.asString() + '"' : value.text();
         separator = ',';
     }
     return result;
 }
 
 std::string ObjectPath::identity() const {
+    std::string result;
+    appendFolded(result, nameSpace);
+    result += ':';
+    appendFolded(result, className);
     std::vector<std::string> parts;
-    for (const auto& [name, value] : keys) {
-        parts.push_back(foldName(name) + "=" + keyIdentity(value));
-    }
+    parts.reserve(keys.size());
+    for (const NamedValue& key : keys) parts.push_back(identityOf(key));
     std::sort(parts.begin(), parts.end());
-
-    std::string result = foldName(nameSpace) + ":" + foldName(className);
     char separator = '.';
     for (const std::string& part : parts) {
-        result += separator + part;
+        result += separator;
+        result += part;
         separator = ',';
     }
     return result;

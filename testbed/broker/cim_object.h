@@ -17,6 +17,18 @@ bool sameName(std::string_view left, std::string_view right);
 /// Lower-case copy, the form in which names are used as map keys.
 std::string foldName(std::string_view name);
 
+/// For containers of names: spellings that differ in letter case are one key.
+struct NameHash {
+    using is_transparent = void;
+    std::size_t operator()(std::string_view name) const;
+};
+struct NameEqual {
+    using is_transparent = void;
+    bool operator()(std::string_view left, std::string_view right) const {
+        return sameName(left, right);
+    }
+};
+
 using NamedValue = std::pair<std::string, CimValue>;
 
 struct ObjectPath {

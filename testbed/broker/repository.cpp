@@ -8,7 +8,11 @@ namespace testbed {
 
 void Repository::addNamespace(std::string_view nameSpace) {
     const std::unique_lock lock(mutex_);
-    spaces_.try_emplace(foldName(nameSpace), Space{std::string(nameSpace), {}, {}});
+    if (space(nameSpace) != nullptr) return;
+    const auto place = std::upper_bound(
+        spaces_.begin(), spaces_.end(), foldName(nameSpace),
+        [](const std::string& name, const Space& known) { return name < foldName(known.name); });
+    spaces_.insert(place, Space{std::string(nameSpace), {}, {}});
 }
 
 bool Repository::hasNamespace(std::string_view nameSpace) const {
@@ -19,22 +23,25 @@ bool Repository::hasNamespace(std::string_view nameSpace) const {
 std::vector<std::string> Repository::namespaceNames() const {
     const std::shared_lock lock(mutex_);
     std::vector<std::string> names;
-    for (const auto& entry : spaces_) names.push_back(entry.second.name);
+    for (const Space& known : spaces_) names.push_back(known.name);
     return names;
 }
 
 const Repository::Space* Repository::space(std::string_view nameSpace) const {
-    const auto found = spaces_.find(foldName(nameSpace));
-    return found == spaces_.end() ? nullptr : &found->second;
+    // There are few of them.
+    const auto found = std::find_if(spaces_.begin(), spaces_.end(), [&](const Space& known) {
+        return sameName(known.name, nameSpace);
+    });
+    return found == spaces_.end() ? nullptr : &*found;
 }
 
 void Repository::defineClass(std::string_view nameSpace, ClassDefinition definition) {
     addNamespace(nameSpace);
     const std::unique_lock lock(mutex_);
-    Space& home = spaces_.at(foldName(nameSpace));
-    const std::string key = foldName(definition.name);
-    if (home.classes.find(key) == home.classes.end()) home.classOrder.push_back(definition.name);
-    home.classes[key] = std::move(definition);
+    Space& home = const_cast<Space&>(*space(nameSpace));
+    const auto [place, isNew] = home.classes.try_emplace(definition.name);
+    if (isNew) home.classOrder.push_back(definition.name);
+    place->second = std::move(definition);
 }
 
 bool Repository::hasClass(std::string_view nameSpace, std::string_view className) const {
@@ -45,9 +52,12 @@ bool Repository::hasClass(std::string_view nameSpace, std::string_view className
 const ClassDefinition* Repository::classLocked(std::string_view nameSpace,
                                                std::string_view className) const {
     const Space* home = space(nameSpace);
-    if (home == nullptr) return nullptr;
-    const auto found = home->classes.find(foldName(className));
-    return found == home->classes.end() ? nullptr : &found->second;
+    return home == nullptr ? nullptr : classIn(*home, className);
+}
+
+const ClassDefinition* Repository::classIn(const Space& home, std::string_view className) {
+    const auto found = home.classes.find(className);
+    return found == home.classes.end() ? nullptr : &found->second;
 }
 
 std::optional<ClassDefinition> Repository::findClass(std::string_view nameSpace,
@@ -141,9 +151,8 @@ std::vector<MethodDefinition> Repository::allMethods(std::string_view nameSpace,
 
 bool Repository::knowsClass(std::string_view className) const {
     const std::shared_lock lock(mutex_);
-    const std::string key = foldName(className);
     return std::any_of(spaces_.begin(), spaces_.end(),
-                       [&](const auto& entry) { return entry.second.classes.count(key) > 0; });
+                       [&](const Space& known) { return classIn(known, className) != nullptr; });
 }
 
 std::vector<std::string> Repository::classNames(std::string_view nameSpace) const {
@@ -160,10 +169,15 @@ bool Repository::isA(std::string_view nameSpace, std::string_view className,
 
 bool Repository::isALocked(std::string_view nameSpace, std::string_view className,
                            std::string_view ancestor) const {
-    const auto lineage = lineageLocked(nameSpace, className);
-    return std::any_of(lineage.begin(), lineage.end(), [&](const ClassDefinition* definition) {
-        return sameName(definition->name, ancestor);
-    });
+    const Space* home = space(nameSpace);
+    if (home == nullptr) return false;
+    const ClassDefinition* definition = classIn(*home, className);
+    // As many steps as there are classes, in a hierarchy that bites its tail.
+    for (std::size_t i = 0; definition != nullptr && i < home->classes.size(); i++) {
+        if (sameName(definition->name, ancestor)) return true;
+        definition = classIn(*home, definition->superclass);
+    }
+    return false;
 }
 
 void Repository::put(Instance instance) {

@@ -149,7 +149,7 @@ public:
 private:
     struct Space {
         std::string name;
-        std::map<std::string, ClassDefinition> classes;  // by folded name
+        std::unordered_map<std::string, ClassDefinition, NameHash, NameEqual> classes;
         std::vector<std::string> classOrder;
     };
     struct Association {
@@ -160,6 +160,8 @@ private:
 
     // The caller of these holds mutex_, shared or exclusive; pointers are good while it does.
     const Space* space(std::string_view nameSpace) const;
+    /// NULL when there is none.
+    static const ClassDefinition* classIn(const Space& home, std::string_view className);
     const ClassDefinition* classLocked(std::string_view nameSpace,
                                        std::string_view className) const;
     /// The class and its ancestors, itself first; empty for an unknown class.
@@ -184,7 +186,7 @@ private:
     void shuffle(std::vector<Instance>& instances) const;
 
     mutable std::shared_mutex mutex_;
-    std::map<std::string, Space> spaces_;              // guarded by mutex_
+    std::vector<Space> spaces_;                        // by folded name; guarded by mutex_
     std::vector<Instance> instances_;                  // guarded by mutex_
     std::map<std::string, std::size_t> index_;         // identity -> position; guarded by mutex_
     std::map<std::size_t, Association> associations_;  // by number; guarded by mutex_

@@ -83,6 +83,9 @@ public:
         }
     }
 
+    /// Whether the document may be another one now.
+    bool hasChangedDocument() const { return changed_; }
+
 private:
     struct BatteryStep {
         std::uint16_t batteryStatus;
@@ -97,7 +100,9 @@ private:
                 {6, "optimal", times_.charge}};
     }
 
+    /// To be changed.
     json& element(const std::string& id, const char* list = "drives") {
+        changed_ = true;
         return *findElement(json_, list, id);
     }
 
@@ -295,31 +300,38 @@ private:
     const Consequences& times_;
     Aftermath& aftermath_;
     std::map<std::string, bool> taken_;
+    bool changed_ = false;
 };
 
-/// One step for every controller that was there before.
-void forControllers(json& document, const Scenario& before, const std::string& name,
-                    Aftermath& aftermath,
-                    std::initializer_list<void (ControllerChange::*)()> steps) {
-    const Scenario after = scenarioOf(document, name);
+using Steps = std::initializer_list<void (ControllerChange::*)()>;
+
+/// Some steps for every controller that was there before.
+void forControllers(json& document, const Scenario& before, Scenario& after,
+                    const std::string& name, Aftermath& aftermath, Steps steps) {
+    bool changed = false;
     for (const ControllerDescription& controller : after.controllers) {
         const ControllerDescription* old = before.findController(controller.id);
         if (!old) continue;
         ControllerChange change(*findElement(document, "controllers", controller.id), *old,
                                 controller, after.consequences, aftermath);
         for (const auto step : steps) (change.*step)();
+        if (change.hasChangedDocument()) changed = true;
     }
+    if (changed) after = scenarioOf(document, name);
 }
 
 }  // namespace
 
-Aftermath followChange(json& document, const Scenario& before, const std::string& name) {
+Aftermath followChange(json& document, const Scenario& before, Scenario& after,
+                       const std::string& name) {
     // Each step goes on from what the one before has made of the document.
     Aftermath aftermath;
-    forControllers(document, before, name, aftermath, {&ControllerChange::followEnclosures});
-    forControllers(document, before, name, aftermath,
-                   {&ControllerChange::followDrives, &ControllerChange::followBatteries});
-    forControllers(document, before, name, aftermath, {&ControllerChange::followVolumes});
+    const auto follow = [&](Steps steps) {
+        forControllers(document, before, after, name, aftermath, steps);
+    };
+    follow({&ControllerChange::followEnclosures});
+    follow({&ControllerChange::followDrives, &ControllerChange::followBatteries});
+    follow({&ControllerChange::followVolumes});
     return aftermath;
 }
 

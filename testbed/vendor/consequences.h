@@ -24,8 +24,10 @@ struct Aftermath {
 ///  - a replaced drive is rebuilt, or has its data copied back from the spare, which then is free;
 ///  - volumes and pools get the state that their drives leave them. A volume that is offline stays
 ///    so until drives that it lost come back.
-/// Later, rebuilding and copying back end, and a battery's learning and charging go on. `name`
-/// stands before errors. Throws ScenarioError for a document that cannot be read.
-Aftermath followChange(nlohmann::json& document, const Scenario& before, const std::string& name);
+/// Later, rebuilding and copying back end, and a battery's learning and charging go on. `after` is
+/// what the document describes, and is so in the end. `name` stands before errors. Throws
+/// ScenarioError for a document that cannot be read.
+Aftermath followChange(nlohmann::json& document, const Scenario& before, Scenario& after,
+                       const std::string& name);
 
 }  // namespace testbed

@@ -1,6 +1,7 @@
 // Taking texts, numbers, flags, codes and lists from an object, and refusing what is left over.
 #include "json_reader.h"
 
+#include <algorithm>
 #include <charconv>
 #include <climits>
 
@@ -13,6 +14,27 @@ namespace {
 /// Digits, as repetitions and commands produce them where a number is meant.
 bool isNumber(const std::string& text) {
     return !text.empty() && text.find_first_not_of("0123456789") == std::string::npos;
+}
+
+std::optional<std::string> textOf(const json& value) {
+    if (value.is_string()) return value.get<std::string>();
+    if (value.is_number_unsigned()) return value.dump();
+    return std::nullopt;
+}
+
+std::optional<std::uint64_t> numberOf(const json& value, std::uint64_t maximum) {
+    std::uint64_t number = 0;
+    bool whole = false;
+    if (value.is_number_unsigned()) {
+        number = value.get<std::uint64_t>();
+        whole = true;
+    } else if (value.is_string()) {
+        const std::string& text = value.get_ref<const std::string&>();
+        const char* end = text.data() + text.size();
+        const auto [rest, error] = std::from_chars(text.data(), end, number);
+        whole = !text.empty() && error == std::errc() && rest == end;
+    }
+    return whole && number <= maximum ? std::optional(number) : std::nullopt;
 }
 
 }  // namespace
@@ -47,25 +69,16 @@ JsonPlace JsonPlace::element(std::size_t index) const {
             kept};
 }
 
+// Most values are what they should be, and their places, which take longer to make than the values
+// to read, are never told.
+
 std::string readText(const JsonPlace& place) {
-    if (place.value->is_string()) return place.value->get<std::string>();
-    if (place.value->is_number_unsigned()) return place.value->dump();
+    if (auto text = textOf(*place.value)) return *std::move(text);
     place.fail("a text is needed here");
 }
 
 std::uint64_t readNumber(const JsonPlace& place, std::uint64_t maximum) {
-    std::uint64_t number = 0;
-    bool whole = false;
-    if (place.value->is_number_unsigned()) {
-        number = place.value->get<std::uint64_t>();
-        whole = true;
-    } else if (place.value->is_string()) {
-        const std::string& text = place.value->get_ref<const std::string&>();
-        const char* end = text.data() + text.size();
-        const auto [rest, error] = std::from_chars(text.data(), end, number);
-        whole = !text.empty() && error == std::errc() && rest == end;
-    }
-    if (whole && number <= maximum) return number;
+    if (const auto number = numberOf(*place.value, maximum)) return *number;
     place.fail("a whole number from 0 to " + std::to_string(maximum) + " is needed here");
 }
 
@@ -77,22 +90,29 @@ bool JsonReader::has(const std::string& name) const {
     return place_.value->contains(name);
 }
 
+const json* JsonReader::find(const std::string& name) {
+    const auto member = place_.value->find(name);
+    if (member == place_.value->end()) return nullptr;
+    known_.push_back(&*member);
+    return known_.back();
+}
+
 std::optional<JsonPlace> JsonReader::take(const std::string& name) {
-    known_.insert(name);
-    if (!has(name)) return std::nullopt;
+    if (find(name) == nullptr) return std::nullopt;
     return place_.member(name);
 }
 
 std::string JsonReader::text(const std::string& name) {
-    const auto member = take(name);
-    if (!member) fail("\"" + name + "\" is missing");
-    return readText(*member);
+    auto text = optionalText(name);
+    if (!text) fail("\"" + name + "\" is missing");
+    return *std::move(text);
 }
 
 std::optional<std::string> JsonReader::optionalText(const std::string& name) {
-    const auto member = take(name);
-    if (!member) return std::nullopt;
-    return readText(*member);
+    const json* member = find(name);
+    if (member == nullptr) return std::nullopt;
+    if (auto text = textOf(*member)) return text;
+    return readText(place_.member(name));
 }
 
 std::string JsonReader::text(const std::string& name, const std::string& absent) {
@@ -100,16 +120,17 @@ std::string JsonReader::text(const std::string& name, const std::string& absent)
 }
 
 bool JsonReader::flag(const std::string& name, bool absent) {
-    const auto member = take(name);
-    if (!member) return absent;
-    if (!member->value->is_boolean()) member->fail("true or false is needed here");
-    return member->value->get<bool>();
+    const json* member = find(name);
+    if (member == nullptr) return absent;
+    if (!member->is_boolean()) place_.member(name).fail("true or false is needed here");
+    return member->get<bool>();
 }
 
 std::optional<std::uint64_t> JsonReader::number(const std::string& name, std::uint64_t maximum) {
-    const auto member = take(name);
-    if (!member) return std::nullopt;
-    return readNumber(*member, maximum);
+    const json* member = find(name);
+    if (member == nullptr) return std::nullopt;
+    if (const auto number = numberOf(*member, maximum)) return number;
+    return readNumber(place_.member(name), maximum);
 }
 
 std::uint16_t JsonReader::number16(const std::string& name, std::uint16_t absent) {
@@ -180,7 +201,8 @@ std::vector<JsonPlace> JsonReader::list(const std::string& name) {
 
 void JsonReader::finish() const {
     for (const auto& [name, value] : place_.value->items()) {
-        if (!known_.contains(name)) place_.fail("unknown member \"" + name + "\"", name);
+        if (std::find(known_.begin(), known_.end(), &value) == known_.end())
+            place_.fail("unknown member \"" + name + "\"", name);
     }
 }
 

@@ -6,7 +6,6 @@
 #include <memory>
 #include <nlohmann/json.hpp>
 #include <optional>
-#include <set>
 #include <string>
 #include <vector>
 
@@ -84,8 +83,11 @@ public:
     const JsonPlace& place() const { return place_; }
 
 private:
+    /// The member, marked as known; NULL when it is absent.
+    const nlohmann::json* find(const std::string& name);
+
     JsonPlace place_;
-    std::set<std::string> known_;
+    std::vector<const nlohmann::json*> known_;
 };
 
 /// Scalars as every reader takes them; they fail at their place.

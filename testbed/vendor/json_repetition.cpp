@@ -1,5 +1,6 @@
 // Writing out elements that stand for many, with their numbers put in, within bounds.
 #include <algorithm>
+#include <string_view>
 
 #include "json_reader.h"
 
@@ -32,18 +33,38 @@ void replaceNumber(json& value, const std::string& number) {
     }
 }
 
+/// A value on the way down a document. Its place is made only for the error that tells it.
+struct Step {
+    const json& value;
+    const JsonPlace& document;
+    const Step* above = nullptr;
+    std::string_view name = {};  ///< in an object
+    std::size_t index = 0;       ///< in a list
+
+    JsonPlace place() const {
+        if (above == nullptr) return document;
+        return above->value.is_object() ? above->place().member(std::string(name))
+                                        : above->place().element(index);
+    }
+    /// How many elements it stands for.
+    std::uint64_t times() const {
+        return isRepeated(value) ? readNumber(place().member("count"), kMostRepetitions) : 1;
+    }
+};
+
 /// The elements of all lists within, at most one more than allowed.
-std::uint64_t countElements(const JsonPlace& place) {
-    const json& value = *place.value;
+std::uint64_t countElements(const Step& step) {
+    const json& value = step.value;
     std::uint64_t sum = 0;
     if (value.is_object()) {
-        for (const auto& [name, child] : value.items()) sum += countElements(place.member(name));
+        for (const auto& [name, child] : value.items()) {
+            if (child.is_structured()) sum += countElements({child, step.document, &step, name});
+        }
     }
     if (value.is_array()) {
         for (std::size_t i = 0; i < value.size(); ++i) {
-            const JsonPlace element = place.element(i);
-            const std::uint64_t times =
-                isRepeated(value[i]) ? readNumber(element.member("count"), kMostRepetitions) : 1;
+            const Step element{value[i], step.document, &step, {}, i};
+            const std::uint64_t times = element.times();
             sum += times * (1 + countElements(element));
         }
     }
@@ -73,14 +94,14 @@ std::vector<JsonPlace> repetitionsOf(const JsonPlace& element) {
 }
 
 void limitRepetitions(const JsonPlace& document) {
-    if (countElements(document) > kMostElements) {
+    if (countElements({*document.value, document}) > kMostElements) {
         document.fail("more than " + std::to_string(kMostElements) + " elements with all counts");
     }
 }
 
 void expandRepetitions(json& document) {
     if (!document.is_structured()) return;
-    if (document.is_array()) {
+    if (document.is_array() && std::any_of(document.begin(), document.end(), isRepeated)) {
         json expanded = json::array();
         for (json& element : document) {
             for (JsonPlace& place : repetitionsOf({&element, "", ""})) {

@@ -20,9 +20,10 @@ LiveArray::LiveArray(Broker& broker, const std::string& file)
       file_(file),
       original_(readScenarioDocument(file)),
       document_(original_),
-      scenario_(scenarioOf(document_, file)) {
+      scenario_(scenarioOf(document_, file)),
+      vendor_(broker.repository(), scenario_) {
     buildVendor(broker_.repository(), scenario_);
-    begin(original_);
+    begin(original_, scenario_);
 }
 
 /// The faults that stay remain as far used up as they are; all that is new is armed behind them.
@@ -45,14 +46,13 @@ void LiveArray::armFaults(const json& document, const Scenario& scenario) {
     armed_ = std::move(staying);
 }
 
-void LiveArray::adopt(json document) {
-    Scenario next = scenarioOf(document, "command");
+void LiveArray::adopt(json document, Scenario next) {
     const bool sameVendor = next.vendor.nameSpace == scenario_.vendor.nameSpace &&
                             next.vendor.classPrefix == scenario_.vendor.classPrefix;
     if (!sameVendor || next.host.id != scenario_.host.id) {
         throw ScenarioError(file_ + ": host and vendor cannot change while the array runs");
     }
-    changeVendor(broker_.repository(), scenario_, next);
+    vendor_.change(scenario_, next);
     armFaults(document, next);
     broker_.faults().setLatency(next.latency.minimum, next.latency.maximum);
     document_ = std::move(document);
@@ -60,11 +60,11 @@ void LiveArray::adopt(json document) {
 }
 
 /// The document as it stands, all faults armed anew, and its timeline from now on.
-void LiveArray::begin(json document) {
+void LiveArray::begin(json document, Scenario next) {
     std::vector<std::pair<json, int>> old;
     old.swap(armed_);
     try {
-        adopt(std::move(document));
+        adopt(std::move(document), std::move(next));
     } catch (const ScenarioError&) {
         armed_ = std::move(old);
         throw;
@@ -79,12 +79,12 @@ void LiveArray::begin(json document) {
 
 void LiveArray::reload() {
     json document = readScenarioDocument(file_);
-    begin(document);
+    begin(document, scenarioOf(document, "command"));
     original_ = std::move(document);
 }
 
 void LiveArray::reset() {
-    begin(original_);
+    begin(original_, begun_);
 }
 
 void LiveArray::apply(const std::string& command) {
@@ -94,9 +94,12 @@ void LiveArray::apply(const std::string& command) {
     // A command may add a repeated element; what follows looks for each of them by its id.
     limitRepetitions({&document, "command", "", ElementNames::Ids});
     expandRepetitions(document);
+    Scenario next = scenarioOf(document, "command");
     Aftermath aftermath;
-    if (scenario_.consequences.enabled) aftermath = followChange(document, scenario_, "command");
-    adopt(std::move(document));
+    if (scenario_.consequences.enabled) {
+        aftermath = followChange(document, scenario_, next, "command");
+    }
+    adopt(std::move(document), std::move(next));
     follow(aftermath);
 }
 

@@ -8,6 +8,7 @@
 
 #include "broker.h"
 #include "consequences.h"
+#include "placed_vendor.h"
 #include "pulled_drives.h"
 #include "scenario.h"
 #include "schedule.h"
@@ -55,8 +56,9 @@ public:
     std::vector<PulledDrive> pulled() const { return pulledDrives(original_, document_); }
 
 private:
-    void adopt(nlohmann::json document);
-    void begin(nlohmann::json document);
+    /// `next` is what the document describes.
+    void adopt(nlohmann::json document, Scenario next);
+    void begin(nlohmann::json document, Scenario next);
     void armFaults(const nlohmann::json& document, const Scenario& scenario);
     void follow(const Aftermath& aftermath);
 
@@ -65,6 +67,7 @@ private:
     nlohmann::json original_;  // as the file was read last
     nlohmann::json document_;
     Scenario scenario_;
+    PlacedVendor vendor_;
     Scenario begun_;                                     // what original_ describes
     std::vector<std::pair<nlohmann::json, int>> armed_;  // faults and their numbers in the broker
     Schedule schedule_;

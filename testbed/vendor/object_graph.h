@@ -43,16 +43,16 @@ public:
     /// Objects and associations disappear.
     void withdraw(Repository& repository) const;
 
-    /// What `before` placed becomes what `after` would place. Only the differences are touched, so
-    /// what stays keeps its place in the order of the vendor's answers.
-    static void exchange(Repository& repository, const std::vector<ObjectGraph>& before,
-                         const std::vector<ObjectGraph>& after);
+    /// One of its objects or associations appears.
+    static void placeObject(Repository& repository, const GraphObject& object);
+    void placeLink(Repository& repository, const GraphLink& link) const;
+    /// One of its associations disappears.
+    void withdrawLink(Repository& repository, const GraphLink& link) const;
 
     const std::vector<GraphObject>& objects() const { return objects_; }
     const std::vector<GraphLink>& links() const { return links_; }
 
 private:
-    void placeLink(Repository& repository, const GraphLink& link) const;
     std::string vendorAssociation(const GraphLink& link) const;
 
     const Naming& naming_;

@@ -27,6 +27,7 @@ struct Tweaks {
     std::vector<NamedValue> keys;        ///< the same for the object path
     std::vector<std::string> omit;       ///< properties left out
     std::vector<std::string> omitKeys;   ///< keys left out of the object path
+    bool operator==(const Tweaks&) const = default;
 };
 
 /// Everything that a scenario describes has an identifier and can be tweaked, and so can the
@@ -38,6 +39,7 @@ struct Described {
 
     /// The tweaks of a part; none for a part that the scenario does not mention.
     const Tweaks& part(const std::string& name) const;
+    bool operator==(const Described&) const = default;
 };
 
 /// The host itself; `id` is its name.
@@ -53,11 +55,13 @@ struct ProfileDescription : Described {
     std::uint16_t organization = 0;
     /// Controllers that conform to it; absent: all of them.
     std::optional<std::vector<std::string>> controllers;
+    bool operator==(const ProfileDescription&) const = default;
 };
 
 struct SoftwareDescription : Described {
     std::vector<std::uint16_t> classifications;
     std::string version;
+    bool operator==(const SoftwareDescription&) const = default;
 };
 
 /// Capacities in bytes.
@@ -67,12 +71,14 @@ struct PoolDescription : Described {
     std::uint64_t total = 0;
     std::uint64_t remaining = 0;
     std::uint16_t operationalStatus = 0;
+    bool operator==(const PoolDescription&) const = default;
 };
 
 /// A drive enclosure; `id` is its number or its tag, as the scenario names it.
 struct EnclosureDescription : Described {
     std::string tag;
     std::uint16_t operationalStatus = 0;
+    bool operator==(const EnclosureDescription&) const = default;
 };
 
 /// Capacities in blocks of 512 bytes.
@@ -93,6 +99,7 @@ struct DriveDescription : Described {
     bool noPackage = false;  ///< no physical package, hence no slot and no enclosure either
     std::string spareFor;    ///< a former hot spare: the drive in whose place it is
     std::string before;      ///< in a lost enclosure: the state to which it returns
+    bool operator==(const DriveDescription&) const = default;
 };
 
 /// Capacities in blocks of 512 bytes.
@@ -112,6 +119,7 @@ struct VolumeDescription : Described {
     std::uint8_t deltaReservation = 0;
     bool basedOnUnderlyingRedundancy = false;
     bool primordial = false;
+    bool operator==(const VolumeDescription&) const = default;
 };
 
 struct PortDescription : Described {
@@ -119,17 +127,20 @@ struct PortDescription : Described {
     std::uint16_t portType = 0;
     std::uint16_t usageRestriction = 0;
     std::uint16_t operationalStatus = 0;
+    bool operator==(const PortDescription&) const = default;
 };
 
 struct BatteryDescription : Described {
     std::uint16_t batteryStatus = 0;
     std::uint16_t operationalStatus = 0;
+    bool operator==(const BatteryDescription&) const = default;
 };
 
 /// A device of the controller that is none of the known kinds, such as a fan.
 struct OtherDescription : Described {
     std::string name;
     std::uint16_t operationalStatus = 0;
+    bool operator==(const OtherDescription&) const = default;
 };
 
 struct ControllerDescription : Described {

@@ -202,17 +202,22 @@ std::string contentOf(const std::string& file) {
     return text.str();
 }
 
-/// The document of a file, which can be read as a scenario; errors tell the line.
-json readableDocument(const std::string& file) {
+struct ScenarioFile {
+    json document;
+    Scenario scenario;
+};
+
+/// Errors tell the line.
+ScenarioFile readFile(const std::string& file) {
     const std::string text = contentOf(file);
-    const json document = parseJson(text, file);
+    json document = parseJson(text, file);
     try {
-        readDocument({&document, file, ""});
+        Scenario scenario = readDocument({&document, file, ""});
+        return {std::move(document), std::move(scenario)};
     } catch (const PlacedError& error) {
         throw ScenarioError(error.what() + (" (line " + std::to_string(lineOf(text, error.place))) +
                             ")");
     }
-    return document;
 }
 
 }  // namespace
@@ -227,13 +232,13 @@ Scenario parseScenario(const std::string& text, const std::string& name) {
 }
 
 json readScenarioDocument(const std::string& file) {
-    json document = readableDocument(file);
+    json document = readFile(file).document;
     expandRepetitions(document);
     return document;
 }
 
 Scenario readScenario(const std::string& file) {
-    return scenarioOf(readScenarioDocument(file), file);
+    return readFile(file).scenario;
 }
 
 }  // namespace testbed

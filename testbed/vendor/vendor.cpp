@@ -1,7 +1,5 @@
-// Building all graphs of a scenario, and replacing those that a change concerns.
+// Placing all graphs of a scenario.
 #include "vendor.h"
-
-#include <map>
 
 #include "class_catalogue.h"
 #include "vendor_graphs.h"
@@ -22,18 +20,6 @@ std::vector<ObjectGraph> graphsOf(const Naming& naming, const ControllerDescript
     append(controller.ports, portGraph);
     append(controller.batteries, batteryGraph);
     append(controller.others, otherGraph);
-    return graphs;
-}
-
-/// Everything that the scenario describes but the host.
-std::vector<ObjectGraph> allGraphs(const Naming& naming, const Scenario& scenario) {
-    std::vector<ObjectGraph> graphs;
-    for (const ControllerDescription& controller : scenario.controllers) {
-        for (ObjectGraph& graph : graphsOf(naming, controller)) graphs.push_back(std::move(graph));
-    }
-    for (const ProfileDescription& profile : scenario.profiles) {
-        graphs.push_back(profileGraph(naming, profile, scenario.controllers));
-    }
     return graphs;
 }
 
@@ -69,13 +55,6 @@ void buildVendor(Repository& repository, const Scenario& scenario) {
         profileGraph(naming, profile, scenario.controllers).place(repository);
     }
     if (scenario.shuffle) repository.shuffleResults(*scenario.shuffle);
-}
-
-void changeVendor(Repository& repository, const Scenario& before, const Scenario& after) {
-    const Naming naming(after.vendor, after.host);
-    const std::vector<ObjectGraph> oldGraphs = allGraphs(naming, before);
-    const std::vector<ObjectGraph> newGraphs = allGraphs(naming, after);
-    ObjectGraph::exchange(repository, oldGraphs, newGraphs);
 }
 
 void applyBehaviour(Broker& broker, const Scenario& scenario) {

@@ -19,10 +19,6 @@ void placeController(Repository& repository, const Naming& naming,
 void withdrawController(Repository& repository, const Naming& naming,
                         const ControllerDescription& controller);
 
-/// Turns the vendor that `before` built into the one that `after` describes, touching only what
-/// differs. Host and vendor (namespace, class prefix) must be the same.
-void changeVendor(Repository& repository, const Scenario& before, const Scenario& after);
-
 /// Gives the broker the scenario's faults and latency.
 void applyBehaviour(Broker& broker, const Scenario& scenario);
 

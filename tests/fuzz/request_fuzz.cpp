@@ -17,9 +17,22 @@ constexpr const char* kServedArray = R"({"controllers": [{"id": "C0",
     "ports": [{"id": "0"}],
     "batteries": [{"id": "0"}]}]})";
 
+constexpr const char* kUsualRequest =
+    "Content-Type: application/xml\nCIMOperation: MethodCall\nCIMMethod: EnumerateClassNames\n"
+    "CIMObject: root/sample\n\n"
+    R"(<CIM CIMVERSION="2.0" DTDVERSION="2.0"><MESSAGE ID="1" PROTOCOLVERSION="1.0"><SIMPLEREQ>)"
+    R"(<IMETHODCALL NAME="EnumerateClassNames"><LOCALNAMESPACEPATH><NAMESPACE NAME="root"/>)"
+    R"(<NAMESPACE NAME="sample"/></LOCALNAMESPACEPATH></IMETHODCALL></SIMPLEREQ></MESSAGE></CIM>)";
+
+testbed::HttpRequest requestIn(std::string_view bytes);
+
 class Server {
 public:
-    Server() { testbed::buildVendor(repository_, testbed::parseScenario(kServedArray, "array")); }
+    /// Once a header that no input had was required, and all were refused unread.
+    Server() {
+        testbed::buildVendor(repository_, testbed::parseScenario(kServedArray, "array"));
+        fuzz::require(answer(requestIn(kUsualRequest)).status == 200, "a usual request is served");
+    }
 
     testbed::HttpResponse answer(const testbed::HttpRequest& request) const {
         testbed::HttpOutcome outcome = server_.answer(request);
@@ -40,8 +53,9 @@ std::string_view takeLine(std::string_view& text) {
     return line;
 }
 
+/// Of HTTP/1.0, whose clients need not name the host.
 testbed::HttpRequest requestIn(std::string_view bytes) {
-    testbed::HttpRequest request{"POST", "/cimom", {}, {}};
+    testbed::HttpRequest request{"POST", "/cimom", {}, {}, 10};
     for (std::string_view line = takeLine(bytes); !line.empty(); line = takeLine(bytes)) {
         const std::size_t colon = std::min(line.find(": "), line.size());
         const std::string_view value = line.substr(std::min(colon + 2, line.size()));

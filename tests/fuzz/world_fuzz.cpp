@@ -1,14 +1,15 @@
 // A vendor as the bytes have it, and a whole life of the provider with it: load, inventory,
 // requests, refreshes while things change and calls fail, unload. Nothing may be left behind.
 //
-// The factory, the workers and the cleanup are the real ones. PLEXOR_FUZZ_MANAGER names the kind of
-// manager.
+// The factory and the cleanup are the real ones; the workers are played, unless PLEXOR_FUZZ_WORKERS
+// is "real": each life is then mostly waiting. PLEXOR_FUZZ_MANAGER names the kind of manager.
 #include <cstdlib>
 
 #include "entry_fixture.h"
 #include "fuzz_target.h"
 #include "input_bytes.h"
 #include "manager_kinds.h"
+#include "played_workers.h"
 
 // A volume that is turned away for want of a pool leaves its texts behind, on purpose.
 extern "C" const char* __lsan_default_suppressions() {
@@ -109,9 +110,20 @@ testbed::BrokerOptions manager() {
     return options;
 }
 
+bool workersArePlayed() {
+    const char* workers = getenv("PLEXOR_FUZZ_WORKERS");
+    return workers == nullptr || std::string_view(workers) != "real";
+}
+
+/// Mostly all of them are there.
+constexpr unsigned kWorkers[] = {2, 2, 2, 2, 2, 1, 1, 0};
+
 class World : public plexortest::EntryTest {
 public:
-    explicit World(InputBytes input) : EntryTest(manager()), input_(input) {}
+    explicit World(InputBytes input) : EntryTest(manager()), input_(input) {
+        const unsigned workers = input_.pick(kWorkers);
+        if (workersArePlayed()) played_.emplace(broker, workers);
+    }
     void TestBody() override {}
 
     void live() {
@@ -249,7 +261,8 @@ private:
         if (input_.flag() && !names.paths.empty()) client.getInstance(input_.pick(names.paths));
     }
 
-    static void settle() {
+    void settle() {
+        if (played_) return played_->work();
         const bool hasWorkers = PlexorThreads[0] != 0 || PlexorThreads[1] != 0;
         fuzz::require(!hasWorkers || plexortest::WorkersMeet::untilIdle(),
                       "the workers come to rest");
@@ -270,6 +283,7 @@ private:
     }
 
     InputBytes input_;
+    std::optional<fuzz::PlayedWorkers> played_;
     std::vector<ObjectPath> objects_;
 };
 

@@ -15,6 +15,7 @@
 #include "fake_host.h"
 #include "instance_client.h"
 #include "manager_kinds.h"
+#include "played_queue.h"
 #include "sanitizers.h"
 #include "vendor.h"
 
@@ -96,15 +97,7 @@ public:
     std::size_t changes() const { return changes_; }
 
 private:
-    /// Plays the workers until the queue is empty.
-    void runQueue() {
-        while (!IsFifoEmpty(&__FIFO)) {
-            testbed::Broker::CallScope scope(broker_);
-            auto* item = static_cast<Thread_Args_t*>(GetItem(&__FIFO));
-            refreshes_++;
-            item->Func(scope.context(), item);
-        }
-    }
+    void runQueue() { refreshes_ += plexortest::playQueue(broker_); }
 
     bool same(const std::string& when) {
         const auto expectedLines = model_.takeLines();
