@@ -2,6 +2,7 @@
 #include <set>
 
 #include "devices_fixture.h"
+#include "sanitizers.h"
 #include "worker_harness.h"
 
 namespace plexortest {
@@ -92,8 +93,8 @@ TEST_F(DevicesWorkers, AWorkerThatIsAloneBuildsThemAll) {
     EXPECT_EQ(CapturedSyslog::countContaining("waiting...\n"), 0u);
 }
 
-#if !defined( \
-    __SANITIZE_ADDRESS__)  // gcc's; it does not follow a thread out of the frames that it leaves
+// An address sanitizer does not follow a thread out of the frames that it leaves.
+#ifndef PLEXOR_ADDRESS_SANITIZER
 TEST_F(DevicesWorkers, AWorkerWhoseOtherHasEndedBuildsThemAll) {
     static std::atomic<bool> left;
     left = false;

@@ -4,6 +4,7 @@
 
 #include "deliberate_leaks.h"
 #include "meeting_fixture.h"
+#include "sanitizers.h"
 
 namespace {
 
@@ -14,7 +15,7 @@ using testbed::Entry;
 
 class CancelledTest : public plexortest::MeetingTest {
 protected:
-#if defined(__SANITIZE_ADDRESS__)  // gcc's; clang does not say this, and follows
+#ifdef PLEXOR_ADDRESS_SANITIZER
     void SetUp() override {
         MeetingTest::SetUp();
         GTEST_SKIP() << "this sanitizer does not follow a thread out of the frames that it leaves";
