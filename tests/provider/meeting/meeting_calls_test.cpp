@@ -3,6 +3,7 @@
 
 #include <atomic>
 #include <iostream>
+#include <optional>
 #include <thread>
 #include <vector>
 
@@ -243,17 +244,18 @@ TEST_F(MeetingCallsTest, EverythingAtOnce) {
 }
 
 TEST_F(MeetingCallsTest, ACleanupFromWithinTheSearchGivesTheSearchUp) {
+    std::optional<plexortest::GivenUpInventory> givenUp;
     testbed::FaultRule asked;
     asked.entry = Entry::EnumerateInstances;
     asked.className = "CIM_RegisteredProfile";
     asked.times = 1;
-    asked.hook = [this] {
+    asked.hook = [this, &givenUp] {
+        givenUp.emplace();
         const plexortest::HurriedWaits watched;
         EXPECT_EQ(PlexorProviderCleanup(&mi, ctx(), 1).rc, CMPI_RC_OK);
         EXPECT_TRUE(plexortest::HurriedWaits::otherWaits().empty()) << "it would wait for itself";
     };
     faults().add(asked);
-    const plexortest::GivenUpInventory givenUp;
     callFactory();
     EXPECT_EQ(initialized(), 0);
     EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR),
