@@ -172,11 +172,6 @@ struct VolumeAllocation {
     std::vector<std::string> complaints;
 };
 
-// Without it GoogleTest prints the bytes, those between the members too.
-void PrintTo(const VolumeAllocation& allocation, std::ostream* out) {
-    *out << allocation.label;
-}
-
 const VolumeAllocation kVolumeAllocations[] = {
     {"Record",
      1,
