@@ -40,6 +40,25 @@ protected:
         EXPECT_EQ(pthread_join(thread, &result), 0);
         EXPECT_EQ(result, PTHREAD_CANCELED);
     }
+    /// Calls the factory on a thread that is cancelled once it has its controller, after `before`.
+    template <typename Before>
+    void cancelFactoryWithItsController(Before before) {
+        CapturedSyslog::onLine([before](const plexortest::LogLine& line) {
+            if (line.text != "BuildControllerInfo, EXIT(0).\n") return;
+            before();
+            pthread_cancel(pthread_self());
+            pthread_testcancel();
+        });
+        auto factory = [this] {
+            const testbed::Broker::CallScope scope(broker);
+            PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr);
+        };
+        const pthread_t thread = start(factory);
+        void* result = nullptr;
+        EXPECT_EQ(pthread_join(thread, &result), 0);
+        EXPECT_EQ(result, PTHREAD_CANCELED);
+        CapturedSyslog::onLine(nullptr);
+    }
     static unsigned int active() {
         const plexortest::WorkersHeld held;
         return ActiveThreads;
@@ -121,21 +140,7 @@ TEST_F(CancelledTest, ACleanupThatWaitsForAnotherOneIsForgotten) {
 
 TEST_F(CancelledTest, AnInitialisationCanBeTriedAgain) {
     std::optional<plexortest::GivenUpInventory> givenUp;
-    CapturedSyslog::onLine([&givenUp](const plexortest::LogLine& line) {
-        if (line.text != "BuildControllerInfo, EXIT(0).\n") return;
-        givenUp.emplace();
-        pthread_cancel(pthread_self());
-        pthread_testcancel();
-    });
-    auto factory = [this] {
-        const testbed::Broker::CallScope scope(broker);
-        PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr);
-    };
-    const pthread_t thread = start(factory);
-    void* result = nullptr;
-    EXPECT_EQ(pthread_join(thread, &result), 0);
-    EXPECT_EQ(result, PTHREAD_CANCELED);
-    CapturedSyslog::onLine(nullptr);
+    cancelFactoryWithItsController([&givenUp] { givenUp.emplace(); });
     EXPECT_EQ(initialized(), 0);
     EXPECT_EQ(controllers(), 0u);
     givenUp.reset();
@@ -147,21 +152,7 @@ TEST_F(CancelledTest, AnInitialisationCanBeTriedAgain) {
 }
 
 TEST_F(CancelledTest, AnInitialisationOfAnEndedLifeLeavesTheInventoryToItsCleanup) {
-    CapturedSyslog::onLine([](const plexortest::LogLine& line) {
-        if (line.text != "BuildControllerInfo, EXIT(0).\n") return;
-        RequestStop();
-        pthread_cancel(pthread_self());
-        pthread_testcancel();
-    });
-    auto factory = [this] {
-        const testbed::Broker::CallScope scope(broker);
-        PlexorProvider_Create_InstanceMI(broker.handle(), scope.context(), nullptr);
-    };
-    const pthread_t thread = start(factory);
-    void* result = nullptr;
-    EXPECT_EQ(pthread_join(thread, &result), 0);
-    EXPECT_EQ(result, PTHREAD_CANCELED);
-    CapturedSyslog::onLine(nullptr);
+    cancelFactoryWithItsController(RequestStop);
     EXPECT_EQ(initialized(), 1);
     EXPECT_EQ(controllers(), 1u);
     EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);

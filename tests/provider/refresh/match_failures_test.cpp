@@ -21,6 +21,12 @@ protected:
         EXPECT_EQ(lines.back().text, line);
         EXPECT_EQ(lines.back().priority, LOG_DEBUG);
     }
+    void expectNoMemoryForResults() {
+        expectNothingHandedBack();
+        EXPECT_EQ(
+            timesLogged(LOG_ERR, "CrossoutDuplicatedEntries, failed to allocate memory for enum\n"),
+            1u);
+    }
     void addRule(Entry entry, int skip = 0) {
         FaultRule rule;
         rule.entry = entry;
@@ -93,10 +99,7 @@ TEST_F(MatchFailures, NoMemoryForTheResults) {
         EXPECT_EQ(match(fresh), -2);
         EXPECT_EQ(fault.failures(), 1u);
     }
-    expectNothingHandedBack();
-    EXPECT_EQ(
-        timesLogged(LOG_ERR, "CrossoutDuplicatedEntries, failed to allocate memory for enum\n"),
-        1u);
+    expectNoMemoryForResults();
     expectLast("CrossoutDuplicatedEntries EXITED, rc -2, remove 0, add 0\n");
 }
 
@@ -126,10 +129,7 @@ TEST_F(MatchFailures, NoMemoryForWhatIsLookedUpGivesEverythingUp) {
             EXPECT_EQ(match(fresh), -2);
             EXPECT_EQ(fault.failures(), 1u);
         }
-        expectNothingHandedBack();
-        EXPECT_EQ(
-            timesLogged(LOG_ERR, "CrossoutDuplicatedEntries, failed to allocate memory for enum\n"),
-            1u);
+        expectNoMemoryForResults();
         expectLast("CrossoutDuplicatedEntries EXITED, rc -2, remove 0, add 0\n");
     }
 }
@@ -187,10 +187,7 @@ TEST_F(MatchFailures, NoMemoryForMoreResultsThanTheArrayHad) {
         EXPECT_EQ(match(fresh), -2);
         EXPECT_EQ(fault.failures(), 1u);
     }
-    expectNothingHandedBack();
-    EXPECT_EQ(
-        timesLogged(LOG_ERR, "CrossoutDuplicatedEntries, failed to allocate memory for enum\n"),
-        1u);
+    expectNoMemoryForResults();
 }
 
 TEST_F(MatchFailures, FewerResultsThanTheArrayHad) {
