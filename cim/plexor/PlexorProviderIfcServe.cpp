@@ -6,6 +6,7 @@
 #include "PlexorProviderIfc.h"
 #include "PlexorProviderIfcTurns.h"
 #include "PlexorProviderLock.h"
+#include "PlexorProviderUtilIndex.h"
 #include "PlexorProviderUtilManager.h"
 
 namespace {
@@ -17,7 +18,7 @@ struct ServedClass {
     const char* keyName;     ///< key that names the instance
     const DeviceKind* kind;  ///< null: the controllers
     void (*fillControllerPath)(CMPIObjectPath* cop, RaidController_t* ctrl);  ///< controllers only
-    const char* (*deviceId)(const void* record);                              ///< devices only
+    IdOf_t deviceId;                                                          ///< devices only
     void (*render)(CMPIInstance* inst, RaidController_t* ctrl, void* record);
 };
 
@@ -181,9 +182,8 @@ int ReturnDevices(const Request& request, RaidController_t* ctrl, const Wanted& 
     const DeviceKind& kind = *request.served->kind;
     int found = 0;
     MutexGuard lock(ctrl->CtrlMutex);
-    const List_Entry_t* entry = DevicesOf(ctrl, kind)->Head;
-    for (; entry != nullptr; entry = entry->Next) {
-        if (!SameId(wanted.deviceId, request.served->deviceId(entry->Data))) continue;
+    EntriesWithId entries(DevicesOf(ctrl, kind), wanted.deviceId, request.served->deviceId);
+    while (const List_Entry_t* entry = entries.Next()) {
         ReturnRecord(request, ctrl, entry->Data);
         found++;
     }

@@ -8,8 +8,9 @@
 
 #include "PlexorProviderLock.h"
 #include "PlexorProviderUtil.h"
+#include "PlexorProviderUtilIndex.h"
 
-Fifo_t __FIFO = {PTHREAD_MUTEX_INITIALIZER, 20, {nullptr, nullptr, 0}};
+Fifo_t __FIFO = {PTHREAD_MUTEX_INITIALIZER, 20, {nullptr, nullptr, 0, nullptr}};
 
 namespace {
 
@@ -23,6 +24,7 @@ List_Entry_t* NewEntry(void* data) {
 
 int EntryAdded(List_t* list, void* data) {
     list->Size++;
+    DropIndex(list);
     syslog(LOG_DEBUG, "Data %p added to the list %p, size %d\n", data, static_cast<void*>(list),
            static_cast<int>(list->Size));
     return RESULT_OK;
@@ -30,6 +32,7 @@ int EntryAdded(List_t* list, void* data) {
 
 void EntryRemoved(List_t* list, List_Entry_t* entry, void* data) {
     list->Size--;
+    DropIndex(list);
     syslog(LOG_DEBUG, "Data %p removed from list %p, size %d\n", data, static_cast<void*>(list),
            static_cast<int>(list->Size));
     __EntriesRemoved++;

@@ -97,6 +97,22 @@ TEST_F(ServeGet, DuplicateDevicesAreAllReturned) {
     }
 }
 
+TEST_F(ServeGet, FindsDevicesAmongVeryManyAndAllDuplicatesOfThem) {
+    RaidController_t* ctrl = attach(newController("C0"));
+    for (const DeviceClass& device : kDeviceClasses) {
+        for (int i = 0; i < 200; i++) device.cache(ctrl, std::to_string(i % 150).c_str());
+        for (const auto& [id, times] : {std::pair("0", 2), {"49", 2}, {"50", 1}, {"149", 1}}) {
+            const Response response = get(devicePath(device, "C0", id));
+            const std::vector<std::string> expected(times, devicePath(device, "C0", id).text());
+            EXPECT_EQ(expected, pathTexts(response.instances));
+            EXPECT_EQ(std::vector<std::string>{refreshRequest("C0", device.action)},
+                      refreshRequests());
+        }
+        expectNotFound(get(devicePath(device, "C0", "150")));
+        expectNotFound(get(devicePath(device, "C0", "")));
+    }
+}
+
 TEST_F(ServeGet, OfAnUnknownDeviceStillAsksForARefresh) {
     RaidController_t* ctrl = attach(newController("C0"));
     attach(newController("C1"));

@@ -1,0 +1,34 @@
+// Finding the entries of a list by an identifier of their records.
+#pragma once
+
+#include <cstdint>
+
+#include "PlexorProvider.h"
+
+/// The identifier of the record that an entry points at; null when it has none. It stays as it is
+/// while the record is in a list.
+typedef const char* (*IdOf_t)(const void* data);
+
+/// The entries whose records have an identifier, in the list's order; with a null one, all entries.
+/// A long list is looked up in its index, which the first look makes and the next change of the
+/// list drops; without memory for one, the list is walked. A list's records are told apart by the
+/// same identifier always. The caller holds the lock that guards the list.
+class EntriesWithId {
+public:
+    EntriesWithId(List_t* list, const char* id, IdOf_t idOf);
+
+    /// The next one; null after the last.
+    const List_Entry_t* Next();
+
+private:
+    const List_Entry_t* Following();
+
+    const char* id_;
+    IdOf_t idOf_;
+    const ListIndex_t* index_;   ///< null: the list is walked
+    std::uint32_t position_;     ///< the next one's in the index; 0: none
+    const List_Entry_t* entry_;  ///< the next one of a walk
+};
+
+/// To be called whenever entries of the list come or go.
+void DropIndex(List_t* list);
