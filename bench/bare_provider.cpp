@@ -5,6 +5,9 @@
 namespace bench {
 namespace {
 
+/// Tells one instance from another.
+constexpr const char* kKey = "DeviceID";
+
 const CMPIValue* asValue(const std::string& text) {
     // CMPI_chars values are passed as the address of the characters.
     return reinterpret_cast<const CMPIValue*>(text.c_str());
@@ -37,6 +40,10 @@ CMPIValue scalar(const testbed::CimValue& value) {
 BareProvider::BareProvider(testbed::Broker& broker, const std::vector<testbed::Instance>& constants)
     : broker_(broker), mi_{this, &table_} {
     for (const testbed::Instance& instance : constants) answers_.push_back(answerOf(instance));
+    for (const Answer& answer : answers_) {
+        for (const Constant& key : answer.keys)
+            if (key.name == kKey) byId_.emplace(key.text, &answer);
+    }
     table_.enumerateInstanceNames = names;
     table_.enumerateInstances = enumerate;
     table_.getInstance = get;
@@ -56,6 +63,12 @@ BareProvider::Answer BareProvider::answerOf(const testbed::Instance& instance) {
         answer.properties.push_back(constantOf(property));
     }
     return answer;
+}
+
+const BareProvider::Answer* BareProvider::find(const CMPIObjectPath* path) const {
+    const CMPIString* key = path->ft->getKey(path, kKey, nullptr).value.string;
+    const auto found = byId_.find(key->ft->getCharPtr(key, nullptr));
+    return found != byId_.end() ? found->second : nullptr;
 }
 
 CMPIObjectPath* BareProvider::makePath(const Answer& answer) const {
@@ -107,8 +120,10 @@ CMPIStatus BareProvider::enumerate(CMPIInstanceMI* mi, const CMPIContext*, const
 }
 
 CMPIStatus BareProvider::get(CMPIInstanceMI* mi, const CMPIContext*, const CMPIResult* result,
-                             const CMPIObjectPath*, const char**) {
-    of(mi).returnInstance(result, of(mi).answers_.front());
+                             const CMPIObjectPath* path, const char**) {
+    const Answer* answer = of(mi).find(path);
+    if (answer == nullptr) return {CMPI_RC_ERR_NOT_FOUND, nullptr};
+    of(mi).returnInstance(result, *answer);
     result->ft->returnDone(result);
     return {CMPI_RC_OK, nullptr};
 }

@@ -4,6 +4,8 @@
 #include <cmpift.h>
 
 #include <string>
+#include <string_view>
+#include <unordered_map>
 #include <vector>
 
 #include "broker.h"
@@ -12,10 +14,12 @@
 namespace bench {
 
 /// Makes the paths and instances of its answers through the broker's tables, as the provider does,
-/// and nothing else: no cache, no locks, no log, no look at the request.
+/// and nothing else: no cache, no locks, no log. Of the request it reads the key of a get, without
+/// which nobody could tell what is asked for.
 class BareProvider {
 public:
-    /// Answers with `constants`; a get with the first of them. The broker must outlive it.
+    /// Answers with `constants`, which have a key DeviceID; a get with one of them. The broker must
+    /// outlive it.
     BareProvider(testbed::Broker& broker, const std::vector<testbed::Instance>& constants);
     BareProvider(const BareProvider&) = delete;
     BareProvider& operator=(const BareProvider&) = delete;
@@ -46,12 +50,14 @@ private:
                                 const CMPIObjectPath*, const char**);
     static CMPIStatus get(CMPIInstanceMI*, const CMPIContext*, const CMPIResult*,
                           const CMPIObjectPath*, const char**);
+    const Answer* find(const CMPIObjectPath* path) const;
     CMPIObjectPath* makePath(const Answer& answer) const;
     void returnInstance(const CMPIResult* result, const Answer& answer) const;
     void setArray(CMPIInstance* instance, const Constant& constant) const;
 
     testbed::Broker& broker_;
     std::vector<Answer> answers_;
+    std::unordered_map<std::string_view, const Answer*> byId_;
     CMPIInstanceMIFT table_ = {};
     CMPIInstanceMI mi_;
 };
