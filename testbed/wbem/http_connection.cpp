@@ -95,7 +95,7 @@ void require(const beast::error_code& error) {
 class Connection : public HttpConnection {
 public:
     Connection(tcp::socket socket, const HttpServerOptions& options,
-               const HttpServer::Handler& handler, HttpWorkers& workers)
+               const HttpServer::Handler& handler, const HttpWorkers& workers)
         : channel_(beast::tcp_stream(std::move(socket)),
                    2 * std::max(options.limits.head, kReadSize)),
           options_(options),
@@ -196,7 +196,8 @@ private:
     }
 
     /// Runs `make` on one of the workers.
-    asio::awaitable<HttpOutcome> runOn(asio::thread_pool& workers, const Outcome& make) {
+    static asio::awaitable<HttpOutcome> runOn(const asio::any_io_executor& workers,
+                                              const Outcome& make) {
         const auto job = [&make]() -> asio::awaitable<HttpOutcome> {
             try {
                 co_return make();
@@ -204,7 +205,7 @@ private:
             }
             co_return HttpResponse{500, {}, {}};
         };
-        co_return co_await asio::co_spawn(workers.get_executor(), job, use_awaitable);
+        co_return co_await asio::co_spawn(workers, job, use_awaitable);
     }
 
     /// Has workers answer the request.
@@ -298,7 +299,7 @@ private:
     HttpChannel channel_;
     const HttpServerOptions& options_;
     const HttpServer::Handler& handler_;
-    HttpWorkers& workers_;
+    const HttpWorkers& workers_;
     Clock::time_point deadline_;
 };
 
@@ -306,7 +307,7 @@ private:
 
 std::unique_ptr<HttpConnection> makeConnection(tcp::socket socket, const HttpServerOptions& options,
                                                const HttpServer::Handler& handler,
-                                               HttpWorkers& workers) {
+                                               const HttpWorkers& workers) {
     return std::make_unique<Connection>(std::move(socket), options, handler, workers);
 }
 

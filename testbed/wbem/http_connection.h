@@ -4,18 +4,15 @@
 // First: this release of Asio forgets to include what it takes from <utility>.
 #include "http_server.h"
 
+#include <boost/asio/any_io_executor.hpp>
 #include <boost/asio/awaitable.hpp>
 #include <boost/asio/ip/tcp.hpp>
-#include <boost/asio/thread_pool.hpp>
 
 namespace testbed {
 
-/// Workers of a server: those for what does not take long, and the others.
+/// Who answers: workers for what does not take long, and others.
 struct HttpWorkers {
-    explicit HttpWorkers(const HttpServerOptions& options)
-        : quick(options.workers), slow(options.slowWorkers) {}
-    boost::asio::thread_pool quick;
-    boost::asio::thread_pool slow;
+    boost::asio::any_io_executor quick, slow;
 };
 
 /// For the I/O thread, but for what it hands to the workers.
@@ -53,6 +50,6 @@ private:
 std::unique_ptr<HttpConnection> makeConnection(boost::asio::ip::tcp::socket socket,
                                                const HttpServerOptions& options,
                                                const HttpServer::Handler& handler,
-                                               HttpWorkers& workers);
+                                               const HttpWorkers& workers);
 
 }  // namespace testbed

@@ -116,14 +116,24 @@ public:
         : request_(request), bounds_(bounds) {}
 
     PostAnswer run() {
-        auto answer = asio::co_spawn(io_, exchange(), asio::use_future);
+        const auto whole = [this]() -> asio::awaitable<PostAnswer> {
+            co_return co_await exchange(co_await connect());
+        };
+        return finish(whole());
+    }
+    PostAnswer runOn(int connected) {
+        return finish(exchange(beast::tcp_stream(tcp::socket(io_, tcp::v4(), connected))));
+    }
+
+private:
+    PostAnswer finish(asio::awaitable<PostAnswer> work) {
+        auto answer = asio::co_spawn(io_, std::move(work), asio::use_future);
         io_.run();
         return answer.get();
     }
 
-private:
-    asio::awaitable<PostAnswer> exchange() {
-        HttpChannel channel(co_await connect(), kBufferSize);
+    asio::awaitable<PostAnswer> exchange(beast::tcp_stream stream) {
+        HttpChannel channel(std::move(stream), kBufferSize);
         channel.socket().expires_at(bounds_.deadline);
         if (!request_.tls) co_return co_await ask(channel);
         ssl::context context = contextFor(*request_.tls);
@@ -238,6 +248,10 @@ std::string PostAnswer::header(std::string_view name) const {
 
 PostAnswer httpPost(const PostRequest& request, const PostBounds& bounds) {
     return Post(request, bounds).run();
+}
+
+PostAnswer httpPostOn(int connected, const PostRequest& request, const PostBounds& bounds) {
+    return Post(request, bounds).runOn(connected);
 }
 
 }  // namespace testbed

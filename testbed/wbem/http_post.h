@@ -50,5 +50,7 @@ struct PostAnswer {
 /// bounded by the deadline. Throws WbemError for a server that cannot be reached or not be trusted,
 /// and for an answer that is no HTTP, ends early, or is beyond the bounds.
 PostAnswer httpPost(const PostRequest& request, const PostBounds& bounds);
+/// The same on a connection that is there already, whose descriptor it closes.
+PostAnswer httpPostOn(int connected, const PostRequest& request, const PostBounds& bounds);
 
 }  // namespace testbed

@@ -8,6 +8,7 @@
 #include <boost/asio/post.hpp>
 #include <boost/asio/redirect_error.hpp>
 #include <boost/asio/steady_timer.hpp>
+#include <boost/asio/thread_pool.hpp>
 #include <boost/asio/use_awaitable.hpp>
 #include <list>
 #include <stdexcept>
@@ -48,7 +49,8 @@ public:
         : options_(options),
           handler_(std::move(handler)),
           acceptor_(listenOn(io_, options)),
-          workers_(options) {
+          quick_(options.workers),
+          slow_(options.slowWorkers) {
         options_.port = acceptor_.local_endpoint().port();
         asio::co_spawn(io_, accept(), asio::detached);
         thread_ = std::thread([this] { io_.run(); });
@@ -57,8 +59,8 @@ public:
     ~Engine() {
         io_.stop();
         thread_.join();
-        for (asio::thread_pool* pool : {&workers_.quick, &workers_.slow}) pool->stop();
-        for (asio::thread_pool* pool : {&workers_.quick, &workers_.slow}) pool->join();
+        for (asio::thread_pool* pool : {&quick_, &slow_}) pool->stop();
+        for (asio::thread_pool* pool : {&quick_, &slow_}) pool->join();
     }
 
     std::uint16_t port() const { return options_.port; }
@@ -134,7 +136,8 @@ private:
     // In this order: what waits for a worker belongs to connections, and these to the context.
     asio::io_context io_{1};
     tcp::acceptor acceptor_;
-    HttpWorkers workers_;
+    asio::thread_pool quick_, slow_;
+    const HttpWorkers workers_{quick_.get_executor(), slow_.get_executor()};
     std::list<HttpConnection*> connections_;  // the I/O thread's; without those given up
     std::thread thread_;
 };
@@ -150,6 +153,17 @@ std::uint16_t HttpServer::port() const {
 
 void HttpServer::listen(bool wanted) {
     engine_->listen(wanted);
+}
+
+void serveHttp(int connected, const HttpServerOptions& options,
+               const HttpServer::Handler& handler) {
+    asio::io_context io{1};
+    const HttpWorkers itself{io.get_executor(), io.get_executor()};
+    const auto connection =
+        makeConnection(tcp::socket(io, tcp::v4(), connected), options, handler, itself);
+    // A client that has gone is the end of the connection, like any other.
+    asio::co_spawn(io, connection->serve(), [](const std::exception_ptr&) {});
+    io.run();
 }
 
 }  // namespace testbed

@@ -73,4 +73,8 @@ private:
     std::unique_ptr<Engine> engine_;
 };
 
+/// Serves one connection, whose descriptor it closes, and has the calling thread do all of it.
+/// Returns when the connection ends.
+void serveHttp(int connected, const HttpServerOptions& options, const HttpServer::Handler& handler);
+
 }  // namespace testbed

@@ -1,8 +1,8 @@
 // What the server reads from a connection: heads, bodies, chunks and trailers, one request after
-// the other. It is the real server, over the loopback interface.
+// the other. The real server's connection, on one thread.
+#include "connection.h"
 #include "fuzz_target.h"
 #include "http_server.h"
-#include "loopback.h"
 
 namespace {
 
@@ -19,9 +19,6 @@ testbed::HttpOutcome echo(const testbed::HttpRequest& request) {
 
 testbed::HttpServerOptions optionsOfServer() {
     testbed::HttpServerOptions options;
-    options.port = 0;
-    options.workers = 1;
-    options.slowWorkers = 1;
     options.limits = {2048, 2048};
     return options;
 }
@@ -29,10 +26,10 @@ testbed::HttpServerOptions optionsOfServer() {
 }  // namespace
 
 PLEXOR_FUZZ_HARNESS(http_request) {
-    static const testbed::HttpServer server(optionsOfServer(), echo);
-    const fuzz::Socket client;
-    client.connectTo(server.port());
+    static const testbed::HttpServerOptions options = optionsOfServer();
+    fuzz::Connection client;
     client.sendLast(bytes);
-    const std::string answer = client.receiveAll();
+    testbed::serveHttp(client.handOver(), options, echo);
+    const std::string answer = client.received();
     fuzz::require(answer.empty() || answer.starts_with("HTTP/1.1 "), "an answer is one of HTTP");
 }
