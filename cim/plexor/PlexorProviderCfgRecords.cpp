@@ -6,7 +6,7 @@
 #include "PlexorProviderCfgKinds.h"
 #include "PlexorProviderLock.h"
 
-static List_t __RaidControllerList = {nullptr, nullptr, 0};
+static List_t __RaidControllerList = {};
 List_t* RaidControllerList = &__RaidControllerList;
 
 namespace {

@@ -88,7 +88,7 @@ public:
         if (impossible_) return;
         const LifeGuard life;
         if (!life.Stands()) return;
-        *RaidControllerList = {nullptr, nullptr, 0};
+        *RaidControllerList = {};
         GiveUpSystemInfo();
         StoreShared(_ProviderInitialized, 0);
     }

@@ -48,7 +48,7 @@ void GiveUpInventory(const char* user) {
     syslog(LOG_ERR, "%s: %s is still busy, the inventory stays in memory\n",
            "PlexorProviderCleanup", user);
     const LifeGuard life;
-    *RaidControllerList = {nullptr, nullptr, 0};
+    *RaidControllerList = {};
     GiveUpSystemInfo();
     KeepLibraryMapped();
 }

@@ -10,7 +10,7 @@
 #include "PlexorProviderUtil.h"
 #include "PlexorProviderUtilIndex.h"
 
-Fifo_t __FIFO = {PTHREAD_MUTEX_INITIALIZER, 20, {nullptr, nullptr, 0, nullptr}};
+Fifo_t __FIFO = {PTHREAD_MUTEX_INITIALIZER, 20, {}};
 
 namespace {
 

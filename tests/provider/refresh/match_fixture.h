@@ -89,7 +89,7 @@ protected:
         return testbed::Broker::toInstance(instance).path.findKey("DeviceID")->asString();
     }
 
-    List_t list_ = {nullptr, nullptr, 0};
+    List_t list_ = {};
     std::deque<Device> records_;
     // What a failure has to clear.
     UpdateInfo_t* devices_ = nullptr;

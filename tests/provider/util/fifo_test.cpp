@@ -30,7 +30,7 @@ protected:
         return false;
     }
 
-    Fifo_t fifo = {PTHREAD_MUTEX_INITIALIZER, 20, {nullptr, nullptr, 0}};
+    Fifo_t fifo = {PTHREAD_MUTEX_INITIALIZER, 20, {}};
     int items[64] = {};
 };
 

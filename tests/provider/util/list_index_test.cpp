@@ -171,6 +171,19 @@ TEST_P(ListIndexMaking, IsGoneWhenTheListIsFreed) {
     EXPECT_EQ(Items{}, found("id0"));
 }
 
+TEST_P(ListIndexMaking, AWrongSizeLeadsNobodyBeyondTheEntriesOrTheIndex) {
+    addOthers(GetParam() + 10);
+    Record* last = record("last");
+    add({last});
+    const unsigned int size = list.Size;
+    list.Size = size + 10;
+    EXPECT_EQ(Items{last}, found("last"));
+    DropIndex(&list);
+    list.Size = size - 10;
+    EXPECT_EQ(1u, found("id0").size());
+    list.Size = size;
+}
+
 INSTANTIATE_TEST_SUITE_P(Sizes, ListIndexMaking,
                          ::testing::Values(1, kMostWithoutIndex, kMostWithoutIndex + 1, 100));
 

@@ -199,7 +199,9 @@ TEST_F(ListRemove, NoRemovalNeedsMemory) {
 
 TEST_F(ListTest, IsEmptyByItsSizeNotByItsHead) {
     List_Entry_t entry = {nullptr, &a};
-    List_t headless = {nullptr, nullptr, 1}, sizeless = {&entry, &entry, 0};
+    List_t headless = {}, sizeless = {};
+    headless.Size = 1;
+    sizeless.Head = sizeless.Tail = &entry;
     EXPECT_EQ(IsListEmpty(&headless), 0);
     EXPECT_EQ(IsListEmpty(&sizeless), 1);
 }
