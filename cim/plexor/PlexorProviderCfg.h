@@ -61,8 +61,8 @@ bool RunQueuedItemAlone(const CMPIContext* ctx) PLEXOR_WITHOUT(PlexorThreadMutex
 /// ThreadActivityDone, ActiveThreads) does not count for it. Takes no lock but the life's.
 void BeginWork();
 
-/// Workers of the present life among ActiveThreads.
-unsigned int ActiveWorkers() PLEXOR_HOLDS(PlexorThreadMutex);
+/// Whether one worker of the present life is active at most, by ActiveThreads.
+bool OneWorkerActiveAtMost() PLEXOR_HOLDS(PlexorThreadMutex);
 
 /// Whether the initial inventory of the present life is done. Takes PlexorThreadMutex.
 bool InventoryDone() PLEXOR_WITHOUT(PlexorThreadMutex);

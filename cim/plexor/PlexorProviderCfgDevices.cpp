@@ -90,7 +90,7 @@ void QueueDevice(const CMPIInstanceMI* mi, const CMPIContext* ctx, RaidControlle
 
 bool WorkDone() {
     MutexGuard lock(PlexorThreadMutex);
-    return IsFifoEmpty(&__FIFO) && ActiveWorkers() <= 1;
+    return IsFifoEmpty(&__FIFO) && OneWorkerActiveAtMost();
 }
 
 /// Waits until the queue is empty and the caller is the only active worker. No time limit, but the

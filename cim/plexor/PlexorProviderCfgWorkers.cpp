@@ -256,10 +256,9 @@ int QueueItem(Thread_Args_t* item) {
     return life.MemberOfEnded() ? RESULT_NOTHING : PutItem(&__FIFO, item);
 }
 
-unsigned int ActiveWorkers() {
+bool OneWorkerActiveAtMost() {
     ExpectHeld(PlexorThreadMutex, __func__);
-    const unsigned int old = ActiveWorker::CountOld();
-    return ActiveThreads > old ? ActiveThreads - old : 0;
+    return ActiveThreads <= ActiveWorker::CountOld() + 1;
 }
 
 bool RunQueuedItemAlone(const CMPIContext* ctx) {

@@ -90,6 +90,29 @@ TEST_F(LateCallsTest, ACleanupOvertakesAFactoryCallThatWaitsForARequest) {
     EXPECT_EQ(CapturedSyslog::countContaining("thread 0 created"), 1u);
 }
 
+TEST_F(LateCallsTest, OneFactoryCallWaitsForAHangingRequestAndNoneAfterIt) {
+    Gate gate;
+    const GateOpener opener(gate);
+    auto request = requestHeldAt(Entry::ResultReturnDone, gate);
+    faults().add(refusal(Entry::EnumerateInstances));
+    {
+        const HurriedWaits watched;
+        callFactory();
+        EXPECT_FALSE(HurriedWaits::otherWaits().empty());
+    }
+    ASSERT_EQ(initialized(), 0) << "no host was found";
+    faults().clear();
+    {
+        const HurriedWaits watched;
+        callFactory();
+        EXPECT_TRUE(HurriedWaits::otherWaits().empty());
+    }
+    ASSERT_NE(initialized(), 0);
+    gate.open();
+    request.get();
+    EXPECT_TRUE(servesOneDrive(*this));
+}
+
 TEST_F(LateCallsTest, AHangingRequestCostsItsOwnLifeOnly) {
     load();
     Gate gate;

@@ -29,6 +29,9 @@ TEST_F(RenderVolumeName, RaidLevelAndElementNameComeFirstWhenKnown) {
     EXPECT_EQ("RAID5 data " + rest, name());
     setText(volume->RaidLevel, "");
     EXPECT_EQ("data " + rest, name());
+    setText(volume->RaidLevel, "5");
+    setText(volume->ElementName, "d");
+    EXPECT_EQ("5 d " + rest, name());
 }
 
 TEST_F(RenderVolumeName, EndsWithTheState) {

@@ -281,11 +281,13 @@ TEST_F(BrokerObjects, AThousandElementsOfAnotherKindInARowEndTheWalk) {
     const CMPIEnumeration* noInstances = broker.makePathEnumeration(paths);
     EXPECT_EQ(NextInstance(noInstances, &failed), nullptr);
     EXPECT_TRUE(failed) << "more than an end: what comes behind them is not known";
-    EXPECT_TRUE(HasNext(noInstances)) << "one is left";
+    EXPECT_NE(NextPath(noInstances), nullptr) << "one is left";
+    EXPECT_FALSE(HasNext(noInstances));
     EXPECT_EQ(NextInstance(broker.makePathEnumeration(paths)), nullptr);
     const CMPIEnumeration* noPaths = broker.makeInstanceEnumeration(instances);
     EXPECT_EQ(NextPath(noPaths), nullptr);
-    EXPECT_TRUE(HasNext(noPaths));
+    EXPECT_NE(NextInstance(noPaths), nullptr);
+    EXPECT_FALSE(HasNext(noPaths));
 }
 
 TEST_F(BrokerObjects, CurrentBrokerIsTheFactorysLatest) {
