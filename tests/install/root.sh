@@ -44,7 +44,7 @@ base_root() {
     local tar=$1/minimal-root.tar release
     if [ -z "$(find "$tar" -mmin -1440 2>/dev/null)" ]; then
         release=$(. /etc/os-release && echo "$VERSION_CODENAME")
-        mirror_sources | mmdebstrap --quiet --mode=root --variant=minbase "$release" "$tar.new" - >&2
+        mirror_sources | mmdebstrap --quiet --mode=root --format=tar --variant=minbase "$release" "$tar.new" - >&2
         mv "$tar.new" "$tar"
     fi
     echo "$tar"
