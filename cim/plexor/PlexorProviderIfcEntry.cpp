@@ -124,7 +124,6 @@ void PlexorInit(const CMPIInstanceMI* mi, const CMPIContext* ctx, FactoryCall& c
     Cancellation cancellation;
     InitializeAttached(mi, ctx);
     cancellation.BecomesImpossible();
-    call.EndTurn();
     syslog(LOG_DEBUG, "%s: EXIT\n", __func__);
 }
 

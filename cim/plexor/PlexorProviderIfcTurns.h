@@ -45,10 +45,10 @@ public:
     /// answers: on the same thread such a call gets no turn, on another one none after 30 seconds.
     /// Nor does a call that a cleanup has overtaken: the manager that makes it is stopping.
     bool TakeTurn();
-    /// Gives the right back, if it has not been taken away. Also done by the destructor.
-    void EndTurn();
 
 private:
+    /// Gives the right back, if it has not been taken away.
+    void EndTurn();
     bool Overtaken() const;
 
     unsigned int generation_;

@@ -59,8 +59,8 @@ public:
 
     CMPIObjectPath* handle() { return this; }
 
-    CMPIData answer = {};              ///< of getKey
-    CMPIrc answerStatus = CMPI_RC_OK;  ///< of getKey
+    CMPIData answer = {};                             ///< of getKey
+    std::optional<CMPIrc> answerStatus = CMPI_RC_OK;  ///< of getKey; none: it tells none
     CMPIrc addKeyStatus = CMPI_RC_OK;  ///< of addKey, which notes the key nevertheless
     std::vector<AddedKey> added;
     mutable std::vector<std::string> asked;  ///< names that getKey was called with
@@ -80,7 +80,8 @@ private:
     }
     static CMPIData getKey(const CMPIObjectPath* path, const char* name, CMPIStatus* status) {
         self(path).asked.emplace_back(name);
-        if (status != nullptr) *status = {self(path).answerStatus, nullptr};
+        const std::optional<CMPIrc> rc = self(path).answerStatus;
+        if (status != nullptr && rc) *status = {*rc, nullptr};
         return self(path).answer;
     }
     static CMPIString* toString(const CMPIObjectPath* path, CMPIStatus* status) {

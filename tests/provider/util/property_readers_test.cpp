@@ -224,6 +224,17 @@ TEST_F(BrokerObjects, NullsAreNotCloned) {
     EXPECT_EQ(CloneInstance(nullptr), nullptr);
 }
 
+TEST_F(BrokerObjects, AKeyNeedsNoStatus) {
+    plexortest::FakeString text("text");
+    plexortest::ScriptedPath path;
+    path.answer.type = CMPI_string;
+    path.answer.value.string = &text;
+    path.answerStatus.reset();
+    EXPECT_STREQ(ReadKey(&path, "K"), "text") << "a manager may tell of failures only";
+    path.answerStatus = CMPI_RC_ERR_FAILED;
+    EXPECT_EQ(ReadKey(&path, "K"), nullptr);
+}
+
 TEST_F(BrokerObjects, FailedClonesAreNull) {
     const CMPIObjectPath* path = broker.makePath(kPath);
     faults().add(refusal(Entry::Clone));

@@ -21,6 +21,13 @@ protected:
     }
 };
 
+/// As the library has it when it is loaded: read before anything runs.
+const unsigned int terminateThreadAtFirst = TerminateThread;
+
+TEST_F(WorkersStart, NobodyIsToldToStopBeforehand) {
+    EXPECT_EQ(terminateThreadAtFirst, 0u);
+}
+
 /// While one lives, a thread that does not ask for a stack of its own gets one that is larger than
 /// the address space: it cannot be created.
 class NoNewThreads {
