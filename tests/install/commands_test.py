@@ -38,6 +38,8 @@ run_line() {
 # A server in the background: goes on when it serves.
 serve_line() {
     echo "+ $1"
+    # Here and now: what the one before has said must not be taken for this one's.
+    : >"$SANDBOX/served"
     eval "exec $1" >"$SANDBOX/served" 2>&1 </dev/null &
     for _ in $(seq 300); do
         grep -q '^serving ' "$SANDBOX/served" && return

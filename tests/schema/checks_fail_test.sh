@@ -140,7 +140,7 @@ must_complain check_locks "requires holding mutex 'PlexorThreadMutex'" \
     cim/plexor/PlexorProviderCfgInventory.cpp \
     '/^bool InventoryDone/,/^}/{/MutexGuard/d}'
 must_complain check_locks "requires holding mutex 'ctrl->CtrlMutex'" \
-    cim/plexor/PlexorProviderIfcServe.cpp 's/^    const List_Entry_t\* entry = DevicesOf/    lock.Unlock();\n&/'
+    cim/plexor/PlexorProviderIfcServe.cpp 's/^    EntriesWithId entries/    lock.Unlock();\n&/'
 must_complain check_locks "cannot call function 'StampTime' while mutex 'ctrl->CtrlMutex' is held" \
     cim/plexor/PlexorProviderCfgDiskUpdate.cpp 's/^        StampTime/        const MutexGuard lock(ctrl->CtrlMutex);\n&/'
 
