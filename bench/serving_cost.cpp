@@ -9,6 +9,7 @@
 // turn, drawn at random, so that a change of the machine meets all alike.
 #include <benchmark/benchmark.h>
 #include <syslog.h>
+#include <time.h>
 
 #include <CLI/CLI.hpp>
 #include <cstdlib>
@@ -25,17 +26,47 @@ namespace {
 using benchmark::State;
 using Paths = std::vector<testbed::ObjectPath>;
 
-/// Asks for one drive after the other. The first answer is not looked at: what was measured before
-/// may have left a heap that is given back just then.
-void serve(State& state, const Operation& operation, testbed::InstanceClient client,
-           const Paths& paths) {
-    operation.ask(client, paths.front());
+using Client = testbed::InstanceClient;
+
+/// The processor's time that the calling thread has had, nanoseconds.
+double ownTime() {
+    timespec now = {};
+    clock_gettime(CLOCK_THREAD_CPUTIME_ID, &now);
+    return static_cast<double>(now.tv_sec) * 1e9 + static_cast<double>(now.tv_nsec);
+}
+
+double timeOf(State& state, const Operation& operation, Client client,
+              const testbed::ObjectPath& path) {
+    const double begin = ownTime();
+    const testbed::Response response = operation.ask(client, path);
+    const double time = ownTime() - begin;
+    if (response.rc != CMPI_RC_OK) state.SkipWithError("the request fails");
+    return time;
+}
+
+/// Asks both for one drive after the other, in turn, so that a machine that becomes slower does so
+/// for both. Each is first every other time: the second one finds what the first has left in the
+/// caches. The first answers are not looked at: what was measured before may have left a heap that
+/// is given back just then.
+void compare(State& state, const Operation& operation, Client provider, Client bare,
+             const Paths& paths) {
+    for (Client client : {provider, bare}) operation.ask(client, paths.front());
     std::size_t next = 0;
+    double providers = 0, bares = 0;
+    bool isProvidersTurn = false;
     for (auto _ : state) {
-        const testbed::Response response = operation.ask(client, paths[next]);
-        if (response.rc != CMPI_RC_OK) state.SkipWithError("the request fails");
+        const auto ask = [&](Client client) {
+            return timeOf(state, operation, client, paths[next]);
+        };
+        isProvidersTurn = !isProvidersTurn;
+        if (isProvidersTurn) providers += ask(provider);
+        bares += ask(bare);
+        if (!isProvidersTurn) providers += ask(provider);
         next = (next + 1) % paths.size();
     }
+    state.counters["ratio"] = providers / bares;
+    state.counters["provider"] = providers / static_cast<double>(state.iterations());
+    state.counters["bare"] = bares / static_cast<double>(state.iterations());
 }
 
 void requireSameAnswers(Shelf& shelf, BareProvider& bare) {
@@ -49,14 +80,11 @@ void requireSameAnswers(Shelf& shelf, BareProvider& bare) {
 void addRequests(Shelf& shelf, BareProvider& bare, const Paths& paths) {
     const std::string drives = std::to_string(paths.size());
     for (const Operation& operation : kOperations) {
-        const auto add = [&](const char* who, testbed::InstanceClient client) {
-            benchmark::RegisterBenchmark((operation.name + ("/" + drives + "/") + who).c_str(),
-                                         [&operation, client, &paths](State& state) {
-                                             serve(state, operation, client, paths);
-                                         });
-        };
-        add("provider", shelf.client());
-        add("bare", bare.client());
+        benchmark::RegisterBenchmark(
+            (operation.name + ("/" + drives)).c_str(),
+            [&operation, provider = shelf.client(), client = bare.client(), &paths](State& state) {
+                compare(state, operation, provider, client, paths);
+            });
     }
 }
 

@@ -74,9 +74,8 @@ def sizes(found, pattern):
 def serving(found):
     for log in ("masked", "open"):
         for operation in OPERATIONS:
-            for drives in sizes(found, f"{log}/{operation}/N/bare"):
-                name = f"{log}/{operation}/{drives}"
-                ratio = found[f"{name}/provider"] / found[f"{name}/bare"]
+            for drives in sizes(found, f"{log}/{operation}/N/ratio"):
+                ratio = found[f"{log}/{operation}/{drives}/ratio"]
                 limited = log == "masked" and drives <= SERVING_DRIVES
                 yield Row(f"{operation}, log {log}, to constants", f"{drives:,}", ratio,
                           SERVING_RATIO if limited else None)

@@ -57,13 +57,25 @@ def machine(directory):
             "load": round(os.getloadavg()[2], 1)}
 
 
+COMPARED = ("ratio", "provider", "bare")  # of one benchmark that asks both in turn; times in nanoseconds
+
+
 def medians(prefix, file):
-    """Of google-benchmark's repetitions: the processor's time of the measuring thread."""
+    """Of google-benchmark's repetitions: the processor's time of the measuring thread, or what a
+    comparison tells instead."""
     content = json.loads(file.read_text())
     content["context"].pop("host_name", None)
     file.write_text(json.dumps(content, indent=1) + "\n")
-    return {prefix + each["run_name"]: each["cpu_time"] * NANOSECONDS[each["time_unit"]]
-            for each in content["benchmarks"] if each.get("aggregate_name") == "median"}
+    found = {}
+    for each in content["benchmarks"]:
+        if each.get("aggregate_name") != "median":
+            continue
+        name = prefix + each["run_name"]
+        if "ratio" in each:
+            found |= {f"{name}/{what}": each[what] for what in COMPARED}
+        else:
+            found[name] = each["cpu_time"] * NANOSECONDS[each["time_unit"]]
+    return found
 
 
 def google(program, prefix, drives, repetitions, seconds, directory, *more):
