@@ -31,7 +31,7 @@ std::uint32_t* ChainOf(const ListIndex_t* index, const char* id) {
 ListIndex_t* NewIndex(std::uint32_t size) {
     std::uint32_t chains = 1;
     while (chains < size) chains *= 2;
-    const size_t each = sizeof(List_Entry_t*) + sizeof(std::uint32_t);
+    const size_t each = sizeof(void*) + sizeof(std::uint32_t);
     auto* index = static_cast<ListIndex_t*>(
         calloc(1, sizeof(ListIndex_t) + size * each + chains * sizeof(std::uint32_t)));
     if (index == nullptr) return nullptr;
