@@ -173,10 +173,6 @@ void ReturnRecord(const Request& request, RaidController_t* ctrl, void* record) 
     request.result->ft->returnInstance(request.result, inst);
 }
 
-bool SameId(const char* wanted, const char* id) {
-    return wanted == nullptr || (id != nullptr && strcmp(wanted, id) == 0);
-}
-
 /// Returns the wanted devices of one controller, then asks for their refresh. How many there were.
 int ReturnDevices(const Request& request, RaidController_t* ctrl, const Wanted& wanted) {
     const DeviceKind& kind = *request.served->kind;

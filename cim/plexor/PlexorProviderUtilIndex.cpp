@@ -14,7 +14,7 @@ struct ListIndex_t {
 
 namespace {
 
-/// Up to here a walk costs less than a hundredth of the answer.
+/// A walk of so few is not worth an allocation.
 constexpr unsigned int kShortList = 32;
 
 std::uint32_t HashOf(const char* id) {
@@ -70,6 +70,10 @@ const ListIndex_t* IndexOf(List_t* list, IdOf_t idOf) {
 
 }  // namespace
 
+bool SameId(const char* wanted, const char* id) {
+    return wanted == nullptr || (id != nullptr && strcmp(wanted, id) == 0);
+}
+
 EntriesWithId::EntriesWithId(List_t* list, const char* id, IdOf_t idOf)
     : id_(id),
       idOf_(idOf),
@@ -92,10 +96,7 @@ const List_Entry_t* EntriesWithId::Following() {
 
 const List_Entry_t* EntriesWithId::Next() {
     const List_Entry_t* entry = Following();
-    for (; entry != nullptr && id_ != nullptr; entry = Following()) {
-        const char* id = idOf_(entry->Data);
-        if (id != nullptr && strcmp(id_, id) == 0) break;
-    }
+    while (entry != nullptr && !SameId(id_, idOf_(entry->Data))) entry = Following();
     return entry;
 }
 

@@ -9,6 +9,9 @@
 /// while the record is in a list.
 typedef const char* (*IdOf_t)(const void* data);
 
+/// Whether an identifier is the wanted one; null wants all.
+bool SameId(const char* wanted, const char* id);
+
 /// The entries whose records have an identifier, in the list's order; with a null one, all entries.
 /// A long list is looked up in its index, which the first look makes and the next change of the
 /// list drops; without memory for one, the list is walked. A list's records are told apart by the

@@ -19,6 +19,16 @@ protected:
         EXPECT_EQ(idleLines(), 0u);
         expectNobodyLeft();
     }
+    /// A stop at that line of the log is the end of the start.
+    void expectTheEndAt(const char* line) {
+        const LifeMember member;
+        {
+            const StopAtLine stop(line);
+            InitPlexorThreads(ctx());
+        }
+        EXPECT_EQ(books().count(Entry::PrepareAttachThread), 0u);
+        expectNoneStarted();
+    }
 };
 
 /// As the library has it when it is loaded: read before anything runs.
@@ -150,24 +160,12 @@ TEST_F(WorkersStart, AfterAStopNoneIsStarted) {
 }
 
 TEST_F(WorkersStart, AStopDuringTheSearchForTheIntervalIsTheEndOfIt) {
-    const LifeMember member;
-    {
-        const StopAtLine stop("GetSampelInterval: ");
-        InitPlexorThreads(ctx());
-    }
+    expectTheEndAt("GetSampelInterval: ");
     EXPECT_EQ(CapturedSyslog::countContaining("Sample interval was set"), 0u);
-    EXPECT_EQ(books().count(Entry::PrepareAttachThread), 0u);
-    expectNoneStarted();
 }
 
 TEST_F(WorkersStart, AStopBehindTheIntervalPreparesNoThread) {
-    const LifeMember member;
-    {
-        const StopAtLine stop("InitPlexorThreads: Sample interval was set to 20 secs\n");
-        InitPlexorThreads(ctx());
-    }
-    EXPECT_EQ(books().count(Entry::PrepareAttachThread), 0u);
-    expectNoneStarted();
+    expectTheEndAt("InitPlexorThreads: Sample interval was set to 20 secs\n");
 }
 
 TEST_F(WorkersStart, ItsOnlyWorkersQueueIsEmptiedByWhoeverWaits) {
