@@ -3,7 +3,7 @@
 
 #include "PlexorProviderCfg.h"
 #include "PlexorProviderCfgKinds.h"
-#include "PlexorProviderUtilList.h"
+#include "PlexorProviderUtilIndex.h"
 
 namespace {
 
@@ -11,34 +11,14 @@ bool SameText(const char* left, const char* right) {
     return left != nullptr && right != nullptr && strcmp(left, right) == 0;
 }
 
-/// The first entry with that text from `entry` on, before `end`; null when there is none.
-List_Entry_t* FindText(List_Entry_t* entry, const List_Entry_t* end, const char* text) {
-    while (entry != end && !SameText(static_cast<char*>(entry->Data), text)) entry = entry->Next;
-    return entry != end ? entry : nullptr;
+/// What a pool's list tells its drives apart by: the copies of their identifiers themselves.
+const char* MemberId(const void* data) {
+    return static_cast<const char*>(data);
 }
 
-/// Where this thread has found a member last. A refresh asks for the drives in the order in which
-/// their pool lists them: the next one stands behind it, and nobody has to look at all before.
-struct FoundLast {
-    const List_t* list;
-    List_Entry_t* entry;
-    std::uint64_t removed;  ///< EntriesRemoved at that time
-
-    /// Null when it may be gone.
-    List_Entry_t* In(const List_t* wanted) const {
-        return list == wanted && removed == EntriesRemoved() ? entry : nullptr;
-    }
-};
-thread_local FoundLast __FoundLast = {nullptr, nullptr, 0};
-
-/// Whether the list, whose lock the caller holds, has the drive.
-bool IsMember(const List_t* list, const char* disk) {
-    if (list == nullptr) return false;
-    List_Entry_t* last = __FoundLast.In(list);
-    List_Entry_t* found = FindText(last, nullptr, disk);
-    if (found == nullptr) found = FindText(list->Head, last, disk);
-    if (found != nullptr) __FoundLast = {list, found, EntriesRemoved()};
-    return found != nullptr;
+/// The first entry of that drive in a pool's list, whose lock the caller holds; null without one.
+const List_Entry_t* FindMember(List_t* list, const char* disk) {
+    return list != nullptr ? EntriesWithId(list, disk, MemberId).Next() : nullptr;
 }
 
 /// What identifies a record in a look-up.
@@ -104,14 +84,14 @@ Chassis_t* FindChassisByTag(const RaidController_t* ctrl, const char* tag) {
 
 void AddDiskToPool(StoragePool_t* pool, const char* disk) {
     if (pool == nullptr || disk == nullptr) return;
-    if (IsMember(pool->Drives, disk)) return;
+    if (FindMember(pool->Drives, disk) != nullptr) return;
     char* copy = StringClone(disk);
     if (AddEntryAtListTail(pool->Drives, copy) != RESULT_OK) free(copy);
 }
 
 void RemoveDiskFromPool(StoragePool_t* pool, const char* disk) {
-    if (pool == nullptr || disk == nullptr || pool->Drives == nullptr) return;
-    List_Entry_t* entry = FindText(pool->Drives->Head, nullptr, disk);
+    if (pool == nullptr || disk == nullptr) return;
+    const List_Entry_t* entry = FindMember(pool->Drives, disk);
     if (entry == nullptr) return;
     void* copy = entry->Data;
     if (RemoveEntryFromListByKey(pool->Drives, copy) == RESULT_OK) free(copy);

@@ -6,10 +6,13 @@
 #include <string.h>
 
 struct ListIndex_t {
-    std::uint32_t chains;          ///< a power of two
-    const List_Entry_t** entries;  ///< of the list, in its order
+    IdOf_t idOf;
+    std::uint32_t size;            ///< positions that have been given
+    std::uint32_t capacity;        ///< also the number of chains; a power of two
+    const List_Entry_t** entries;  ///< in the list's order; those of no chain may have left it
     std::uint32_t* following;      ///< for each entry: the next one's position; 0: none
     std::uint32_t* first;          ///< for each chain; positions count from 1, 0: none
+    std::uint32_t* last;           ///< the same
 };
 
 namespace {
@@ -23,48 +26,66 @@ std::uint32_t HashOf(const char* id) {
     return hash;
 }
 
-std::uint32_t* ChainOf(const ListIndex_t* index, const char* id) {
-    return &index->first[HashOf(id) & (index->chains - 1)];
+std::uint32_t ChainOf(const ListIndex_t* index, const char* id) {
+    return HashOf(id) & (index->capacity - 1);
 }
 
-/// An index of that many entries without any; null when there is no memory.
-ListIndex_t* NewIndex(std::uint32_t size) {
-    std::uint32_t chains = 1;
-    while (chains < size) chains *= 2;
-    const size_t each = sizeof(void*) + sizeof(std::uint32_t);
-    auto* index = static_cast<ListIndex_t*>(
-        calloc(1, sizeof(ListIndex_t) + size * each + chains * sizeof(std::uint32_t)));
+/// An index without entries that has room for half as many more than `size`, so that not every
+/// change of the list needs a new one; null when there is no memory.
+ListIndex_t* NewIndex(std::uint32_t size, IdOf_t idOf) {
+    std::uint32_t capacity = 1;
+    while (capacity <= size + size / 2) capacity *= 2;
+    const size_t each = sizeof(void*) + 3 * sizeof(std::uint32_t);
+    auto* index = static_cast<ListIndex_t*>(calloc(1, sizeof(ListIndex_t) + capacity * each));
     if (index == nullptr) return nullptr;
-    index->chains = chains;
+    index->idOf = idOf;
+    index->capacity = capacity;
     index->entries = reinterpret_cast<const List_Entry_t**>(index + 1);
-    index->following = reinterpret_cast<std::uint32_t*>(index->entries + size);
-    index->first = index->following + size;
+    index->following = reinterpret_cast<std::uint32_t*>(index->entries + capacity);
+    index->first = index->following + capacity;
+    index->last = index->first + capacity;
     return index;
 }
 
-/// Puts the entries into their chains, the last one first: each goes in front of those behind it.
-void FillChains(ListIndex_t* index, std::uint32_t size, IdOf_t idOf) {
-    for (std::uint32_t position = size; position > 0; position--) {
-        const char* id = idOf(index->entries[position - 1]->Data);
-        if (id == nullptr) continue;
-        std::uint32_t* chain = ChainOf(index, id);
-        index->following[position - 1] = *chain;
-        *chain = position;
-    }
+/// Lets a position follow another one in its chain; 0 is before the first and behind the last.
+void Link(ListIndex_t* index, std::uint32_t chain, std::uint32_t before, std::uint32_t position) {
+    (before != 0 ? index->following[before - 1] : index->first[chain]) = position;
 }
 
-/// The list's index, made if there is none yet; null for a short list, and without memory.
+/// Puts an entry behind those that the index has, for which it has room.
+void Append(ListIndex_t* index, const List_Entry_t* entry) {
+    index->entries[index->size] = entry;
+    const std::uint32_t position = ++index->size;
+    const char* id = index->idOf(entry->Data);
+    if (id == nullptr) return;
+    const std::uint32_t chain = ChainOf(index, id);
+    Link(index, chain, index->last[chain], position);
+    index->last[chain] = position;
+}
+
+/// Takes an entry out of the chain of its identifier; whether it was there.
+bool Unchain(ListIndex_t* index, std::uint32_t chain, const List_Entry_t* entry) {
+    std::uint32_t before = 0;
+    std::uint32_t position = index->first[chain];
+    while (position != 0 && index->entries[position - 1] != entry) {
+        before = position;
+        position = index->following[position - 1];
+    }
+    if (position == 0) return false;
+    Link(index, chain, before, index->following[position - 1]);
+    if (index->last[chain] == position) index->last[chain] = before;
+    return true;
+}
+
+/// The list's index, made if there is none yet; null for a short list, without memory, and when it
+/// is of another identifier.
 const ListIndex_t* IndexOf(List_t* list, IdOf_t idOf) {
     if (list->Size <= kShortList) return nullptr;
-    if (list->Index != nullptr) return list->Index;
-    ListIndex_t* index = NewIndex(list->Size);
+    if (list->Index != nullptr) return list->Index->idOf == idOf ? list->Index : nullptr;
+    ListIndex_t* index = NewIndex(list->Size, idOf);
     if (index == nullptr) return nullptr;
-    std::uint32_t size = 0;
     const List_Entry_t* entry = list->Head;
-    for (; entry != nullptr && size < list->Size; entry = entry->Next) {
-        index->entries[size++] = entry;
-    }
-    FillChains(index, size, idOf);
+    for (; entry != nullptr && index->size < list->Size; entry = entry->Next) Append(index, entry);
     return list->Index = index;
 }
 
@@ -78,7 +99,7 @@ EntriesWithId::EntriesWithId(List_t* list, const char* id, IdOf_t idOf)
     : id_(id),
       idOf_(idOf),
       index_(id != nullptr ? IndexOf(list, idOf) : nullptr),
-      position_(index_ != nullptr ? *ChainOf(index_, id) : 0),
+      position_(index_ != nullptr ? index_->first[ChainOf(index_, id)] : 0),
       entry_(index_ == nullptr ? list->Head : nullptr) {}
 
 /// The next entry that may be one.
@@ -98,6 +119,21 @@ const List_Entry_t* EntriesWithId::Next() {
     const List_Entry_t* entry = Following();
     while (entry != nullptr && !SameId(id_, idOf_(entry->Data))) entry = Following();
     return entry;
+}
+
+void IndexTail(List_t* list) {
+    ListIndex_t* index = list->Index;
+    if (index == nullptr) return;
+    // The next look makes a larger one.
+    if (index->size == index->capacity) return DropIndex(list);
+    Append(index, list->Tail);
+}
+
+void UnindexEntry(List_t* list, const List_Entry_t* entry) {
+    ListIndex_t* index = list->Index;
+    if (index == nullptr) return;
+    const char* id = list->Head != nullptr ? index->idOf(entry->Data) : nullptr;
+    if (id == nullptr || !Unchain(index, ChainOf(index, id), entry)) DropIndex(list);
 }
 
 void DropIndex(List_t* list) {

@@ -13,9 +13,10 @@ typedef const char* (*IdOf_t)(const void* data);
 bool SameId(const char* wanted, const char* id);
 
 /// The entries whose records have an identifier, in the list's order; with a null one, all entries.
-/// A long list is looked up in its index, which the first look makes and the next change of the
-/// list drops; without memory for one, the list is walked. A list's records are told apart by the
-/// same identifier always. The caller holds the lock that guards the list.
+/// A long list is looked up in its index, which the first look makes and which follows the list
+/// from then on; without memory for one, and when the list's index is of another identifier, the
+/// list is walked. The caller holds the lock that guards the list, and does not change it before
+/// the end.
 class EntriesWithId {
 public:
     EntriesWithId(List_t* list, const char* id, IdOf_t idOf);
@@ -33,5 +34,12 @@ private:
     const List_Entry_t* entry_;  ///< the next one of a walk
 };
 
-/// To be called whenever entries of the list come or go.
+/// Adds the entry that has come to the list's tail to its index.
+void IndexTail(List_t* list);
+
+/// Takes out of the list's index an entry that has left the list, while its record is still there.
+/// A list that has become empty keeps no index.
+void UnindexEntry(List_t* list, const List_Entry_t* entry);
+
+/// Forgets the list's index: the next look makes one.
 void DropIndex(List_t* list);

@@ -1,10 +1,6 @@
 // Lists and the bounded FIFO.
-#include "PlexorProviderUtilList.h"
-
 #include <stdlib.h>
 #include <strings.h>
-
-#include <atomic>
 
 #include "PlexorProviderLock.h"
 #include "PlexorProviderUtil.h"
@@ -14,8 +10,6 @@ Fifo_t __FIFO = {PTHREAD_MUTEX_INITIALIZER, 20, {}};
 
 namespace {
 
-std::atomic<std::uint64_t> __EntriesRemoved = 0;
-
 List_Entry_t* NewEntry(void* data) {
     auto* entry = static_cast<List_Entry_t*>(calloc(1, sizeof(List_Entry_t)));
     if (entry != nullptr) entry->Data = data;
@@ -24,7 +18,6 @@ List_Entry_t* NewEntry(void* data) {
 
 int EntryAdded(List_t* list, void* data) {
     list->Size++;
-    DropIndex(list);
     syslog(LOG_DEBUG, "Data %p added to the list %p, size %d\n", data, static_cast<void*>(list),
            static_cast<int>(list->Size));
     return RESULT_OK;
@@ -32,18 +25,13 @@ int EntryAdded(List_t* list, void* data) {
 
 void EntryRemoved(List_t* list, List_Entry_t* entry, void* data) {
     list->Size--;
-    DropIndex(list);
+    UnindexEntry(list, entry);
     syslog(LOG_DEBUG, "Data %p removed from list %p, size %d\n", data, static_cast<void*>(list),
            static_cast<int>(list->Size));
-    __EntriesRemoved++;
     free(entry);
 }
 
 }  // namespace
-
-std::uint64_t EntriesRemoved() {
-    return __EntriesRemoved;
-}
 
 int CMStringCmp(const CMPIString* str1, const char* str2) {
     const char* text = StringText(str1);
@@ -62,6 +50,7 @@ int AddEntryAtListHead(List_t* list, void* data) {
     if (list->Head == nullptr) list->Tail = entry;
     entry->Next = list->Head;
     list->Head = entry;
+    DropIndex(list);
     return EntryAdded(list, data);
 }
 
@@ -80,6 +69,7 @@ int AddEntryAtListTail(List_t* list, void* data) {
         list->Tail->Next = entry;
     }
     list->Tail = entry;
+    IndexTail(list);
     return EntryAdded(list, data);
 }
 
@@ -162,6 +152,7 @@ void FreeList(List_t* list, ReleaseFunc_t release) {
         syslog(LOG_DEBUG, "List %p is empty\n", static_cast<void*>(list));
         return;
     }
+    DropIndex(list);
     while (list->Head != nullptr) {
         void* item = nullptr;
         RemoveEntryFromList(list, &item);

@@ -1,5 +1,6 @@
 // Looking up entries by their records' identifiers: short lists are walked, long ones have an
-// index. Either way all entries with the identifier are found, in the list's order.
+// index, which follows their changes. Either way all entries with the identifier are found, in the
+// list's order.
 #include <deque>
 #include <string>
 
@@ -16,7 +17,10 @@ struct Record {
     const char* id;
 };
 
+std::size_t identifiersRead = 0;
+
 const char* idOf(const void* record) {
+    identifiersRead++;
     return static_cast<const Record*>(record)->id;
 }
 
@@ -136,6 +140,24 @@ TEST_P(ListIndexTest, DoesNotFindWhatHasBeenRemovedSince) {
     EXPECT_EQ(1u, found("another").size());
 }
 
+TEST_P(ListIndexTest, FindsTheOthersOfTheSameIdentifierWhenOneHasBeenRemoved) {
+    Items twins;
+    for (int i = 0; i < 4; i++) {
+        twins.push_back(record("twin"));
+        add({twins.back()});
+        addOthers(GetParam() / 4);
+    }
+    EXPECT_EQ(twins, found("twin"));
+    for (const std::size_t removed : {1u, 2u, 0u}) {
+        ASSERT_EQ(0, RemoveEntryFromListByKey(&list, twins[removed]));
+        twins.erase(twins.begin() + static_cast<std::ptrdiff_t>(removed));
+        EXPECT_EQ(twins, found("twin"));
+        twins.push_back(record("twin"));
+        add({twins.back()});
+        EXPECT_EQ(twins, found("twin"));
+    }
+}
+
 TEST_P(ListIndexTest, WithoutMemoryItIsWalked) {
     addOthers(GetParam());
     Record* last = record("last");
@@ -163,12 +185,89 @@ TEST_P(ListIndexMaking, IsMadeOnceAndThenKept) {
     EXPECT_EQ(hasOne ? 1u : 0u, counted.calls());
 }
 
+TEST_P(ListIndexMaking, FollowsTheListUntilItsRoomIsUsedUp) {
+    addOthers(GetParam());
+    add({record("last")});
+    const bool hasOne = GetParam() + 1 > kMostWithoutIndex;
+    found("id0");
+    const FailAllocation counted = FailAllocation::none();
+    for (std::size_t i = 0; i < GetParam() / 2; i++) {
+        Record* added = record("twin");
+        ASSERT_EQ(0, AddEntryAtListTail(&list, added));
+        EXPECT_EQ(Items{added}, found("twin"));
+        ASSERT_EQ(0, RemoveEntryFromListByKey(&list, added));
+        EXPECT_EQ(Items{}, found("twin"));
+    }
+    EXPECT_EQ(GetParam() / 2, counted.calls()) << "the entries";
+    EXPECT_EQ(hasOne, list.Index != nullptr);
+}
+
+TEST_P(ListIndexMaking, SparesALookAtMostOthers) {
+    addOthers(GetParam());
+    found("id0");
+    identifiersRead = 0;
+    for (std::size_t i = 0; i < GetParam(); i++) found(("id" + std::to_string(i)).c_str());
+    EXPECT_LE(identifiersRead / GetParam(), GetParam() > kMostWithoutIndex ? 4u : GetParam());
+}
+
+TEST_P(ListIndexMaking, IsMadeLargerNowAndThen) {
+    addOthers(GetParam());
+    found("id0");
+    const FailAllocation counted = FailAllocation::none();
+    constexpr std::size_t kMore = 2000;
+    for (std::size_t i = 0; i < kMore; i++) {
+        Record* added = numbered(GetParam() + i);
+        ASSERT_EQ(0, AddEntryAtListTail(&list, added));
+        ASSERT_EQ(Items{added}, found(added->id));
+    }
+    EXPECT_GT(counted.calls(), kMore);
+    EXPECT_LE(counted.calls(), kMore + 8);
+    for (void* item : items()) ASSERT_EQ(Items{item}, found(idOf(item)));
+}
+
+TEST_P(ListIndexMaking, IsNotThatOfAnotherIdentifier) {
+    addOthers(GetParam());
+    found("id0");
+    const ListIndex_t* made = list.Index;
+    EntriesWithId entries(&list, "other", [](const void*) { return "other"; });
+    Items all;
+    while (const List_Entry_t* entry = entries.Next()) all.push_back(entry->Data);
+    EXPECT_EQ(items(), all);
+    EXPECT_EQ(made, list.Index);
+}
+
+TEST_P(ListIndexMaking, IsForgottenWhereTheIdentifierOfWhatLeavesHasChanged) {
+    addOthers(GetParam());
+    for (const char* changed : {"other", static_cast<const char*>(nullptr)}) {
+        Record* leaving = record("leaving");
+        add({leaving});
+        EXPECT_EQ(Items{leaving}, found("leaving"));
+        leaving->id = changed;
+        ASSERT_EQ(0, RemoveEntryFromListByKey(&list, leaving));
+        leaving->id = "leaving";
+        EXPECT_EQ(Items{}, found("leaving"));
+    }
+}
+
 TEST_P(ListIndexMaking, IsGoneWhenTheListIsFreed) {
     addOthers(GetParam());
     found("id0");
     FreeList(&list, [](void*) {});
     EXPECT_EQ(nullptr, list.Index);
     EXPECT_EQ(Items{}, found("id0"));
+}
+
+TEST_P(ListIndexMaking, IsGoneWhenTheLastEntryIs) {
+    for (const bool byKey : {true, false}) {
+        addOthers(GetParam());
+        found("id0");
+        while (list.Head != nullptr) {
+            void* item = list.Head->Data;
+            ASSERT_EQ(0, byKey ? RemoveEntryFromListByKey(&list, item)
+                               : RemoveEntryFromList(&list, &item));
+        }
+        EXPECT_EQ(nullptr, list.Index);
+    }
 }
 
 TEST_P(ListIndexMaking, AWrongSizeLeadsNobodyBeyondTheEntriesOrTheIndex) {
