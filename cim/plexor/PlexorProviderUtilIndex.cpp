@@ -8,7 +8,7 @@
 struct ListIndex_t {
     IdOf_t idOf;
     std::uint32_t size;            ///< positions that have been given
-    std::uint32_t capacity;        ///< also the number of chains; a power of two
+    std::uint32_t capacity;        ///< also the number of chains
     const List_Entry_t** entries;  ///< in the list's order; those of no chain may have left it
     std::uint32_t* following;      ///< for each entry: the next one's position; 0: none
     std::uint32_t* first;          ///< for each chain; positions count from 1, 0: none
@@ -27,14 +27,13 @@ std::uint32_t HashOf(const char* id) {
 }
 
 std::uint32_t ChainOf(const ListIndex_t* index, const char* id) {
-    return HashOf(id) & (index->capacity - 1);
+    return HashOf(id) % index->capacity;
 }
 
-/// An index without entries that has room for half as many more than `size`, so that not every
-/// change of the list needs a new one; null when there is no memory.
+/// An index without entries that has room for twice as many as `size`, so that few changes of the
+/// list need a new one; null when there is no memory.
 ListIndex_t* NewIndex(std::uint32_t size, IdOf_t idOf) {
-    std::uint32_t capacity = 1;
-    while (capacity <= size + size / 2) capacity *= 2;
+    const std::uint32_t capacity = size * 2;
     const size_t each = sizeof(void*) + 3 * sizeof(std::uint32_t);
     auto* index = static_cast<ListIndex_t*>(calloc(1, sizeof(ListIndex_t) + capacity * each));
     if (index == nullptr) return nullptr;
@@ -85,7 +84,8 @@ const ListIndex_t* IndexOf(List_t* list, IdOf_t idOf) {
     ListIndex_t* index = NewIndex(list->Size, idOf);
     if (index == nullptr) return nullptr;
     const List_Entry_t* entry = list->Head;
-    for (; entry != nullptr && index->size < list->Size; entry = entry->Next) Append(index, entry);
+    for (; entry != nullptr && index->size < index->capacity; entry = entry->Next)
+        Append(index, entry);
     return list->Index = index;
 }
 
@@ -99,8 +99,14 @@ EntriesWithId::EntriesWithId(List_t* list, const char* id, IdOf_t idOf)
     : id_(id),
       idOf_(idOf),
       index_(id != nullptr ? IndexOf(list, idOf) : nullptr),
-      position_(index_ != nullptr ? index_->first[ChainOf(index_, id)] : 0),
-      entry_(index_ == nullptr ? list->Head : nullptr) {}
+      position_(),
+      entry_() {
+    if (index_ != nullptr) {
+        position_ = index_->first[ChainOf(index_, id)];
+    } else {
+        entry_ = list->Head;
+    }
+}
 
 /// The next entry that may be one.
 const List_Entry_t* EntriesWithId::Following() {

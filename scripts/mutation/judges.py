@@ -156,7 +156,7 @@ class Tests:
 
     def _measure(self):
         """Runs all tests without a mutant, for what each takes."""
-        for _ in range(3):
+        for _ in range(10):
             tests, failed, fault = self._run_all()
             if CHECKER_FAULT not in fault:
                 break

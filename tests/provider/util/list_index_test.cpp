@@ -1,6 +1,8 @@
 // Looking up entries by their records' identifiers: short lists are walked, long ones have an
 // index, which follows their changes. Either way all entries with the identifier are found, in the
 // list's order.
+#include <malloc.h>
+
 #include <deque>
 #include <string>
 
@@ -185,6 +187,15 @@ TEST_P(ListIndexMaking, IsMadeOnceAndThenKept) {
     EXPECT_EQ(hasOne ? 1u : 0u, counted.calls());
 }
 
+TEST_P(ListIndexMaking, TakesFortyBytesForEachEntryThatItIsMadeOf) {
+    addOthers(GetParam());
+    found("id0");
+    ASSERT_EQ(GetParam() > kMostWithoutIndex, list.Index != nullptr);
+    if (list.Index == nullptr) return;
+    EXPECT_GE(malloc_usable_size(list.Index), 40 * GetParam());
+    EXPECT_LE(malloc_usable_size(list.Index), 40 * GetParam() + 80);
+}
+
 TEST_P(ListIndexMaking, FollowsTheListUntilItsRoomIsUsedUp) {
     addOthers(GetParam());
     add({record("last")});
@@ -271,15 +282,16 @@ TEST_P(ListIndexMaking, IsGoneWhenTheLastEntryIs) {
 }
 
 TEST_P(ListIndexMaking, AWrongSizeLeadsNobodyBeyondTheEntriesOrTheIndex) {
-    addOthers(GetParam() + 10);
+    addOthers(GetParam() + 98);
     Record* last = record("last");
     add({last});
     const unsigned int size = list.Size;
     list.Size = size + 10;
     EXPECT_EQ(Items{last}, found("last"));
     DropIndex(&list);
-    list.Size = size - 10;
+    list.Size = size / 3;
     EXPECT_EQ(1u, found("id0").size());
+    EXPECT_EQ(1u, found("id1").size());
     list.Size = size;
 }
 
