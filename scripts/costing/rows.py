@@ -23,7 +23,8 @@ COUNTS = {
     "refresh-unchanged": {"calls": (19, 21), "lines": (25, 11), "allocations": (8, 0)},
     "refresh-reversed": {"calls": (19, 21), "lines": (25, 11), "allocations": (8, 0)},
     "refresh-random": {"calls": (19, 21), "lines": (25, 11), "allocations": (8, 0)},
-    "refresh-all-new": {"calls": (19, 56), "lines": (25, 32), "allocations": (8, 9)},
+    # The tenth: the index of the pool's drives, which is made anew now and then.
+    "refresh-all-new": {"calls": (19, 56), "lines": (25, 32), "allocations": (8, 9.1)},
 }
 RECORD_BYTES = 460        # the controller's share at 24 drives in it
 WALK_RATIO = 1.05         # to the prescribed waits, or to the vendor's answers
