@@ -10,10 +10,9 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <cstdio>
-#include <cstdlib>
-#include <iostream>
 
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "held_vendor.h"
 #include "polling_interval.h"
 #include "provider_session.h"
@@ -137,16 +136,10 @@ int main(int argc, char** argv) {
     app.add_option("--limit", limit, "How much slower the slowest request may become, ms");
     app.add_option("--library", library, "The provider's library");
     app.add_option("--scenario", scenarioFile, "The vendor's array");
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(LOG_UPTO(LOG_EMERG));
-    const testbed::PollingInterval interval(1);
-    try {
-        if (bench::run(testbed::readScenario(scenarioFile), library, count, limit))
-            return EXIT_SUCCESS;
-        std::cerr << "a request was held up for more than " << limit << " ms" << std::endl;
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-    }
-    return EXIT_FAILURE;
+    return bench::runProgram(app, argc, argv, LOG_EMERG, [&] {
+        const testbed::PollingInterval interval(1);
+        if (!bench::run(testbed::readScenario(scenarioFile), library, count, limit))
+            throw bench::BenchError("a request was held up for more than " + std::to_string(limit) +
+                                    " ms");
+    });
 }

@@ -7,11 +7,10 @@
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
-#include <cstdlib>
 #include <functional>
-#include <iostream>
 
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "counted_log.h"
 #include "counted_memory.h"
 #include "measurements.h"
@@ -93,17 +92,10 @@ int main(int argc, char** argv) {
     app.add_option("--drives", drives, "Numbers of drives")->check(CLI::Range(1, 100000));
     app.add_option("--json", json, "File for what was found");
     app.add_option("--library", library, "The provider's library");
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(LOG_UPTO(LOG_EMERG));
-    try {
+    return bench::runProgram(app, argc, argv, LOG_EMERG, [&] {
         bench::countAllocationsOf(library);
         bench::Measurements found;
         for (const int number : drives) bench::measure(found, number, library);
         found.write(json);
-        return EXIT_SUCCESS;
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-        return EXIT_FAILURE;
-    }
+    });
 }

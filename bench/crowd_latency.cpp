@@ -11,12 +11,11 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <cstdlib>
-#include <iostream>
 #include <map>
 #include <thread>
 
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "held_vendor.h"
 #include "measurements.h"
 #include "polling_interval.h"
@@ -156,17 +155,10 @@ int main(int argc, char** argv) {
     app.add_option("--json", json, "File for what was found");
     app.add_option("--library", library, "The provider's library");
     app.add_option("--scenario", scenario, "The vendor's array");
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(LOG_UPTO(LOG_EMERG));
-    const testbed::PollingInterval interval(1);
-    try {
+    return bench::runProgram(app, argc, argv, LOG_EMERG, [&] {
+        const testbed::PollingInterval interval(1);
         bench::Measurements found;
         bench::run(found, testbed::readScenario(scenario), library, crowd);
         found.write(json);
-        return EXIT_SUCCESS;
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-        return EXIT_FAILURE;
-    }
+    });
 }

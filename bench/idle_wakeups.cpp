@@ -5,13 +5,12 @@
 #include <unistd.h>
 
 #include <CLI/CLI.hpp>
-#include <cstdlib>
 #include <filesystem>
 #include <fstream>
-#include <iostream>
 #include <thread>
 
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "measurements.h"
 #include "provider_session.h"
 #include "scenario_parser.h"
@@ -58,16 +57,9 @@ int main(int argc, char** argv) {
     app.add_option("--json", json, "File for what was found");
     app.add_option("--library", library, "The provider's library");
     app.add_option("--scenario", scenario, "The vendor's array");
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(LOG_UPTO(LOG_EMERG));
-    try {
+    return bench::runProgram(app, argc, argv, LOG_EMERG, [&] {
         bench::Measurements found;
         bench::run(found, testbed::readScenario(scenario), library, seconds);
         found.write(json);
-        return EXIT_SUCCESS;
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-        return EXIT_FAILURE;
-    }
+    });
 }

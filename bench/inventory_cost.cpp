@@ -7,12 +7,11 @@
 
 #include <CLI/CLI.hpp>
 #include <algorithm>
-#include <cstdlib>
-#include <iostream>
 #include <map>
 #include <thread>
 
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "counted_log.h"
 #include "drive_shelf.h"
 #include "measurements.h"
@@ -87,17 +86,10 @@ int main(int argc, char** argv) {
         ->check(CLI::Range(0, 10000));
     app.add_option("--json", json, "File for what was found");
     app.add_option("--library", library, "The provider's library");
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(LOG_UPTO(LOG_ERR));
-    try {
+    return bench::runProgram(app, argc, argv, LOG_ERR, [&] {
         bench::Measurements found;
         for (const int count : drives)
             bench::measure(found, count, std::chrono::milliseconds(answerTime), library);
         found.write(json);
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-        return EXIT_FAILURE;
-    }
-    return EXIT_SUCCESS;
+    });
 }

@@ -11,11 +11,10 @@
 #include <CLI/CLI.hpp>
 #include <algorithm>
 #include <cstdio>
-#include <cstdlib>
-#include <iostream>
 #include <thread>
 
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "drive_shelf.h"
 #include "manager_option.h"
 #include "polling_interval.h"
@@ -131,17 +130,11 @@ int main(int argc, char** argv) {
     app.add_flag("--flat", flat, "Fail when objects pile up");
     app.add_option("--library", library, "The provider's library");
     testbed::addManagerOption(app, manager);
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(LOG_UPTO(LOG_EMERG));
-    std::printf("%-10s %4s %12s %12s %12s %9s\n", "after", "", "clones", "others", "calls",
-                "seconds");
-    try {
+    return bench::runProgram(app, argc, argv, LOG_EMERG, [&] {
+        std::printf("%-10s %4s %12s %12s %12s %9s\n", "after", "", "clones", "others", "calls",
+                    "seconds");
         const std::size_t growth = bench::measure(drives, refreshes, library, manager);
-        if (!flat || growth == 0) return EXIT_SUCCESS;
-        std::cerr << growth << " objects have piled up" << std::endl;
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-    }
-    return EXIT_FAILURE;
+        if (flat && growth != 0)
+            throw bench::BenchError(std::to_string(growth) + " objects have piled up");
+    });
 }

@@ -9,10 +9,9 @@
 #include <syslog.h>
 
 #include <CLI/CLI.hpp>
-#include <cstdlib>
-#include <iostream>
 
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "shelf.h"
 
 namespace bench {
@@ -58,14 +57,5 @@ int main(int argc, char** argv) {
     CLI::App app("Measures a refresh of the drives");
     app.add_option("--drives", drives, "Number of drives")->check(CLI::Range(1, 100000));
     app.add_option("--library", library, "The provider's library");
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(LOG_UPTO(LOG_ERR));
-    try {
-        bench::run(drives, library);
-        return EXIT_SUCCESS;
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-        return EXIT_FAILURE;
-    }
+    return bench::runProgram(app, argc, argv, LOG_ERR, [&] { bench::run(drives, library); });
 }

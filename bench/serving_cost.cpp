@@ -12,11 +12,10 @@
 #include <time.h>
 
 #include <CLI/CLI.hpp>
-#include <cstdlib>
-#include <iostream>
 
 #include "bare_provider.h"
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "operations.h"
 #include "shelf.h"
 
@@ -123,14 +122,8 @@ int main(int argc, char** argv) {
     app.add_option("--drives", drives, "Number of drives")->check(CLI::Range(1, 100000));
     app.add_flag("--open", open, "Let all lines of the log through");
     app.add_option("--library", library, "The provider's library");
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(open ? LOG_UPTO(LOG_DEBUG) : LOG_UPTO(LOG_ERR));
-    try {
+    return bench::runProgram(app, argc, argv, LOG_ERR, [&] {
+        if (open) setlogmask(LOG_UPTO(LOG_DEBUG));
         bench::run(drives, library);
-        return EXIT_SUCCESS;
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-        return EXIT_FAILURE;
-    }
+    });
 }

@@ -9,11 +9,10 @@
 #include <atomic>
 #include <cmath>
 #include <cstdio>
-#include <cstdlib>
-#include <iostream>
 #include <thread>
 
 #include "bench_clients.h"
+#include "bench_program.h"
 #include "polling_interval.h"
 #include "provider_session.h"
 #include "scenario_parser.h"
@@ -139,17 +138,10 @@ int main(int argc, char** argv) {
     app.add_option("--tolerance", tolerance, "Largest difference, percent");
     app.add_option("--library", library, "The provider's library");
     app.add_option("--scenario", scenarioFile, "The vendor's array");
-    CLI11_PARSE(app, argc, argv);
-
-    setlogmask(LOG_UPTO(LOG_EMERG));
-    const testbed::PollingInterval interval(1);
-    try {
+    return bench::runProgram(app, argc, argv, LOG_EMERG, [&] {
+        const testbed::PollingInterval interval(1);
         const auto scenario = testbed::readScenario(scenarioFile);
-        if (bench::run(scenario, library, std::chrono::seconds(window), clients, tolerance))
-            return EXIT_SUCCESS;
-        std::cerr << "the number of clients makes a difference to the vendor" << std::endl;
-    } catch (const std::exception& error) {
-        std::cerr << error.what() << std::endl;
-    }
-    return EXIT_FAILURE;
+        if (!bench::run(scenario, library, std::chrono::seconds(window), clients, tolerance))
+            throw bench::BenchError("the number of clients makes a difference to the vendor");
+    });
 }
