@@ -10,6 +10,15 @@ using plexortest::CapturedSyslog;
 using plexortest::LogLine;
 using plexortest::VirtualClock;
 
+// As the library is loaded: read before any test sets them.
+const time_t initialUnloadTime = NextUnloadTime;
+const unsigned int initialIdleMinutes = IdleTimeBeforeTerminating;
+
+TEST(UnloadTime, HasPassedUntilTheFirstRequestWhichPutsItFiveMinutesOff) {
+    EXPECT_EQ(initialUnloadTime, 0);
+    EXPECT_EQ(initialIdleMinutes, 5u);
+}
+
 class UnloadRefusalTest : public plexortest::EntryTest {
 protected:
     void SetUp() override {
