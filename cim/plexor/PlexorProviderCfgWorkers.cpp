@@ -160,19 +160,21 @@ void WaitForWork(bool wasBusyWhenTold) PLEXOR_HOLDS(PlexorThreadMutex) {
     }
 }
 
+/// Runs items until there is none. Whether there was one.
+bool RunItems(CMPIContext* ctx, long index, MutexGuard& lock) PLEXOR_HOLDS(PlexorThreadMutex) {
+    bool anyRun = false;
+    while (RunNextItem(ctx, index, lock)) anyRun = true;
+    return anyRun;
+}
+
 /// Takes items until it is told to leave.
 void WorkUntilTerminated(CMPIContext* ctx, long index, MutexGuard& lock)
     PLEXOR_HOLDS(PlexorThreadMutex) {
-    bool wasBusy = false;
     for (;;) {
-        if (RunNextItem(ctx, index, lock)) {
-            wasBusy = true;
-            continue;
-        }
+        const bool wasBusy = RunItems(ctx, index, lock);
         syslog(LOG_DEBUG, "%s(%ld): no item to process, wait...\n", "PlexorThread", index);
         WaitForWork(wasBusy && ToldToLeave());
         if (ToldToLeave()) return;
-        wasBusy = false;
     }
 }
 

@@ -57,6 +57,8 @@ struct BrokerOptions {
     /// An array of strings refuses CMPI_chars (13), the element stays an empty text.
     bool refusesCharsInArrays = false;
     FilteredKeys filteredKeys = FilteredKeys::PropertiesGo;
+    /// A call that succeeds leaves the caller's status as it was.
+    bool silentSuccess = false;
 
     /// Results of enumerations and association walks come in another order each time.
     bool randomOrder = false;

@@ -51,6 +51,12 @@ private:
     std::unique_lock<std::mutex> turn_;
 };
 
+/// Writes a call's outcome where its caller wants it.
+inline void tellOutcome(const BrokerCore& core, CMPIStatus* status, const CMPIStatus& outcome) {
+    const bool silent = core.options.silentSuccess && outcome.rc == CMPI_RC_OK;
+    if (status != nullptr && !silent) *status = outcome;
+}
+
 /// Answers one call. `truth(outcome)` gives the true result and sets the status when it is not OK.
 template <class Result, class Truth>
 Result answer(BrokerCore& core, CallRecord record, CMPIStatus* status, Truth&& truth) {
@@ -60,7 +66,7 @@ Result answer(BrokerCore& core, CallRecord record, CMPIStatus* status, Truth&& t
     if (call.wantsTruth()) result = truth(outcome);
     call.falsify(result);
     call.conclude(outcome);
-    if (status != nullptr) *status = outcome;
+    tellOutcome(core, status, outcome);
     return result;
 }
 

@@ -58,6 +58,8 @@ constexpr ManagerBehaviour kBehaviours[] = {
         "a property filter without key list takes the keys from the names too"),
     row<&Options::filteredKeys, FilteredKeys::Stay>(
         "filter-keeps-keys", "a property filter without key list spares the key properties"),
+    flag<&Options::silentSuccess>("silent-success",
+                                  "a call that succeeds leaves the caller's status as it was"),
     flag<&Options::randomOrder>("random-order", "gives results in another order each time"),
     {"host-in-paths", "paths in results have a host name", setHostInPaths, hasHostInPaths},
     flag<&Options::unknownClassFails>("unknown-class-fails",
@@ -84,11 +86,12 @@ constexpr const char* kSmall[] = {"flush-function",     "attach-does-nothing", "
 constexpr const char* kLarge[] = {
     "no-flush",     "no-keys",       "no-chars-in-arrays",  "filter-keeps-keys",
     "random-order", "host-in-paths", "unknown-class-fails", "dangling-fails"};
-constexpr const char* kWorst[] = {"no-flush",           "unflushed-end",       "no-keys",
-                                  "no-chars-in-arrays", "filter-drops-names",  "random-order",
-                                  "host-in-paths",      "unknown-class-fails", "dangling-fails",
-                                  "serial-queries",     "numeric-keys",        "factory-per-class",
-                                  "silent-at-stop",     "repeated-stop",       "requests-at-stop"};
+constexpr const char* kWorst[] = {"no-flush",           "unflushed-end",      "no-keys",
+                                  "no-chars-in-arrays", "filter-drops-names", "silent-success",
+                                  "random-order",       "host-in-paths",      "unknown-class-fails",
+                                  "dangling-fails",     "serial-queries",     "numeric-keys",
+                                  "factory-per-class",  "silent-at-stop",     "repeated-stop",
+                                  "requests-at-stop"};
 
 constexpr ManagerKind kKinds[] = {
     {"host", "the host's manager: flush in the context table", {}},

@@ -37,7 +37,7 @@ Result answerOn(const Handle* handle, Entry entry, const char* name, CMPIStatus*
     if (isObjectEntry(entry) && !object->core().watchesObjectCalls()) {
         CMPIStatus outcome = statusOk;
         Result result = truth(*object, outcome);
-        if (status != nullptr) *status = outcome;
+        tellOutcome(object->core(), status, outcome);
         return result;
     }
     CallRecord record;

@@ -73,7 +73,7 @@ void expectOneLine(const Outcome& outcome, const std::string& text) {
 TEST_F(Tool, ManagersAreThoseOfTheManual) {
     const Outcome table = run("managers");
     EXPECT_EQ(table.status, 0);
-    EXPECT_EQ(std::count(table.output.begin(), table.output.end(), '\n'), 22) << table.output;
+    EXPECT_EQ(std::count(table.output.begin(), table.output.end(), '\n'), 23) << table.output;
     EXPECT_NE(contentOf(MANAGERS_MANUAL).find("\n\n" + table.output + "\n"), std::string::npos);
 }
 

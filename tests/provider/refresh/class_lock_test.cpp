@@ -117,6 +117,27 @@ TEST_F(ClassLockTest, ItIsToldOnceWhenItBeginsAndOnceWhenItEnds) {
     EXPECT_EQ(ctrl->BatteryList->Size, 2u);
 }
 
+TEST_F(ClassLockTest, ABuildThatHungIsToldOfWhenItEnds) {
+    FaultRule rule;
+    rule.entry = testbed::Entry::InstanceGetProperty;
+    rule.times = 1;
+    rule.keepResult = true;
+    rule.hook = [this] { gate_.pass(); };
+    const Path battery = addBattery("B1");
+    faults().add(rule);
+    auto hanging = buildElsewhere(battery);
+    const GateOpener opener(gate_);
+    ASSERT_TRUE(gate_.awaitArrivals(1));
+    ahead = 30;
+    process(103);
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR), std::vector<std::string>{kPassedOver});
+    gate_.open();
+    hanging.get();
+    const auto lines = CapturedSyslog::linesAt(LOG_ERR);
+    ASSERT_EQ(lines.size(), 2u);
+    EXPECT_TRUE(lines[1].ends_with(" secs, served again\n")) << lines[1];
+}
+
 TEST_F(ClassLockTest, UntilThenTheSecondWaits) {
     auto hanging = hangingRefresh();
     const GateOpener opener(gate_);

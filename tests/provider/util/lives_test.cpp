@@ -35,6 +35,15 @@ using plexortest::GateOpener;
 using plexortest::VirtualClock;
 using testbed::Entry;
 
+/// As the library is loaded: read before anything begins or ends.
+const unsigned int lifeAtFirst = PresentLife();
+const bool stoppedAtFirst = StopRequested();
+
+TEST(LifeAtFirst, HasNotEnded) {
+    EXPECT_EQ(lifeAtFirst, 1u);
+    EXPECT_FALSE(stoppedAtFirst);
+}
+
 class LivesTest : public plexortest::EntryTest {
 protected:
     void SetUp() override {

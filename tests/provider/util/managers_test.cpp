@@ -84,6 +84,44 @@ TEST_F(LargeManagerTest, ARefusedStringIsSetAsAnObject) {
     EXPECT_EQ(textOf(controller, "IdentifyingDescriptions"), "[Serial Number]");
 }
 
+/// Its calls write a status only when they fail.
+class SilentSuccessTest : public ManagersTest {
+protected:
+    explicit SilentSuccessTest(BrokerOptions options = {})
+        : ManagersTest(silent(std::move(options))) {}
+
+private:
+    static BrokerOptions silent(BrokerOptions options) {
+        options.silentSuccess = true;
+        return options;
+    }
+};
+
+TEST_F(SilentSuccessTest, NothingIsTakenForAFailure) {
+    EXPECT_EQ(textOf(first("Tovexa_PlexorStorageExtent"), "DeviceID"), "tvxStorageExtC0_d1");
+    EXPECT_EQ(textOf(first("Tovexa_PlexorController"), "OtherIdentifyingInfo"), "[C0]");
+    VirtualClock::advance(100);
+    first("Tovexa_PlexorStorageExtent");
+    EXPECT_TRUE(plexortest::WorkersMeet::untilIdle());
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_ERR),
+              (std::vector<std::string>{
+                  "GetSampelInterval: /UserVars/CIMtvx_plexorProviderPollingInterval not found",
+                  "InitPlexorThreads: Sample interval was set to 20 secs\n"}));
+    EXPECT_EQ(CapturedSyslog::linesAt(LOG_WARNING), std::vector<std::string>{});
+}
+
+class SilentLargeManagerTest : public SilentSuccessTest {
+protected:
+    SilentLargeManagerTest() : SilentSuccessTest(withoutKeysAndChars()) {}
+};
+
+TEST_F(SilentLargeManagerTest, KeysAndStringsAreSetAllTheSame) {
+    EXPECT_EQ(textOf(first("Tovexa_PlexorStorageExtent"), "DeviceID"), "tvxStorageExtC0_d1");
+    const testbed::Instance controller = first("Tovexa_PlexorController");
+    EXPECT_EQ(textOf(controller, "Name"), "tvxControllerC0");
+    EXPECT_EQ(textOf(controller, "OtherIdentifyingInfo"), "[C0]");
+}
+
 /// A path with one key, of which anything can be answered.
 struct OneKey {
     CMPIData data = plexortest::dataOf(CMPI_chars, 0);

@@ -34,6 +34,13 @@ protected:
 /// As the library has it when it is loaded: read before anything runs.
 const unsigned int terminateThreadAtFirst = TerminateThread;
 
+TEST_F(WorkersStart, AWorkersStackHasAGuard) {
+    InitPlexorThreads(ctx());
+    std::size_t guard = 0;
+    EXPECT_EQ(pthread_attr_getguardsize(&PlexorThreadAttr, &guard), 0);
+    EXPECT_GT(guard, 0u);
+}
+
 TEST_F(WorkersStart, NobodyIsToldToStopBeforehand) {
     EXPECT_EQ(terminateThreadAtFirst, 0u);
 }
