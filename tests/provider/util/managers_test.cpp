@@ -98,7 +98,10 @@ private:
 };
 
 TEST_F(SilentSuccessTest, NothingIsTakenForAFailure) {
-    EXPECT_EQ(textOf(first("Tovexa_PlexorStorageExtent"), "DeviceID"), "tvxStorageExtC0_d1");
+    const testbed::Instance drive = first("Tovexa_PlexorStorageExtent");
+    EXPECT_EQ(textOf(drive, "DeviceID"), "tvxStorageExtC0_d1");
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).getInstance(drive.path).instances,
+              std::vector<testbed::Instance>{drive});
     EXPECT_EQ(textOf(first("Tovexa_PlexorController"), "OtherIdentifyingInfo"), "[C0]");
     VirtualClock::advance(100);
     first("Tovexa_PlexorStorageExtent");
