@@ -14,7 +14,7 @@ using plexortest::VirtualClock;
 const time_t initialUnloadTime = NextUnloadTime;
 const unsigned int initialIdleMinutes = IdleTimeBeforeTerminating;
 
-TEST(UnloadTime, HasPassedUntilTheFirstRequestWhichPutsItFiveMinutesOff) {
+TEST(UnloadTime, IsLongPastBeforeTheFirstRequestAndTheIdleTimeFiveMinutes) {
     EXPECT_EQ(initialUnloadTime, 0);
     EXPECT_EQ(initialIdleMinutes, 5u);
 }
