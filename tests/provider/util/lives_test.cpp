@@ -38,10 +38,12 @@ using testbed::Entry;
 /// As the library is loaded: read before anything begins or ends.
 const unsigned int lifeAtFirst = PresentLife();
 const bool stoppedAtFirst = StopRequested();
+const time_t completeAtFirst = InitCompleteTime;
 
 TEST(LifeAtFirst, HasNotEnded) {
     EXPECT_EQ(lifeAtFirst, 1u);
     EXPECT_FALSE(stoppedAtFirst);
+    EXPECT_EQ(completeAtFirst, 0) << "nothing has been initialised";
 }
 
 class LivesTest : public plexortest::EntryTest {

@@ -199,6 +199,22 @@ TEST_F(WorkersStart, ItsOnlyWorkersQueueIsEmptiedByWhoeverWaits) {
     EXPECT_TRUE(eventually([this] { return tasks_.ended() == 2; }));
 }
 
+TEST_F(WorkersStart, AfterItsCleanupTheOnlyWorkerIsNoneAnyMore) {
+    FaultRule none;
+    none.entry = Entry::PrepareAttachThread;
+    none.nullResult = true;
+    none.times = 1;
+    faults().add(none);
+    startWorkers(1);
+    stopWorkers();
+    __atomic_store_n(&TerminateThread, 0, __ATOMIC_SEQ_CST);
+    auto* idle = zeroed<Thread_Args_t>();
+    ASSERT_EQ(PutItem(&__FIFO, idle), 0);
+    EXPECT_FALSE(RunQueuedItemAlone(ctx())) << "what is queued is for the next workers";
+    EXPECT_EQ(GetItem(&__FIFO), idle);
+    free(idle);
+}
+
 TEST_F(WorkersStart, StoppingNoWorkerIsHarmless) {
     FaultRule none;
     none.entry = Entry::PrepareAttachThread;
