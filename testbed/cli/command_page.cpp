@@ -16,6 +16,7 @@
 #include "page_about.h"
 #include "page_server.h"
 #include "stop_signals.h"
+#include "whole_line.h"
 
 namespace testbed {
 namespace {
@@ -64,7 +65,7 @@ std::string urlOf(const HttpServerOptions& options, std::uint16_t port) {
         auto outcome = page.answer(request);
         return outcome ? std::move(*outcome) : HttpOutcome(HttpResponse{404, {}, {}});
     });
-    std::cout << "page at " << urlOf(options.http, http.port()) << std::endl;
+    printLine(std::cout, "page at " + urlOf(options.http, http.port()));
     pollfd source = {signals.descriptor(), POLLIN, 0};
     while (poll(&source, 1, -1) < 0) {
     }

@@ -3,7 +3,6 @@
 
 #include <poll.h>
 #include <signal.h>
-#include <syslog.h>
 #include <unistd.h>
 
 #include <CLI/CLI.hpp>
@@ -27,6 +26,7 @@
 #include "stop_signals.h"
 #include "tree_view.h"
 #include "wait_ender.h"
+#include "whole_line.h"
 
 namespace testbed {
 namespace {
@@ -199,16 +199,13 @@ bool serve(const ServeOptions& options) {
     StopSignals signals;
     // Whoever reads the lines may go away; the clients stay.
     signal(SIGPIPE, SIG_IGN);
-    directProviderLog(options.log ? LOG_DEBUG : LOG_ERR,
-                      [show = options.log](int, const std::string& line) {
-                          if (show) std::cerr << line << "\n";
-                      });
+    showProviderLog(options.log);
     AccessOptions access = options.access;
     access.address = options.http.address;
     auto credentials = accessOf(access);
     if (!credentials && isPublic(access.address)) {
-        std::cerr << "plexor-testbed: warning: everybody who reaches " << access.address
-                  << " may ask\n";
+        printLine(std::cerr,
+                  "plexor-testbed: warning: everybody who reaches " + access.address + " may ask");
     }
     WaitEnder ender(signals);
     ServeOptions watched = options;

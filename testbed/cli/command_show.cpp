@@ -1,8 +1,6 @@
 // Loading the provider, waiting for its inventory, and printing it as tree, JSON or check.
 #include "command_show.h"
 
-#include <syslog.h>
-
 #include <CLI/CLI.hpp>
 #include <iostream>
 #include <memory>
@@ -21,6 +19,7 @@
 #include "schema_choice.h"
 #include "terminal.h"
 #include "tree_view.h"
+#include "whole_line.h"
 
 namespace testbed {
 namespace {
@@ -41,13 +40,6 @@ struct ShowOptions {
     ColourChoice colour;
 };
 
-/// The provider's lines go to standard error too, or are masked as managers mask them.
-void directLog(bool show) {
-    directProviderLog(show ? LOG_DEBUG : LOG_ERR, [show](int, const std::string& line) {
-        if (show) std::cerr << line << "\n";
-    });
-}
-
 std::vector<std::string> classesToShow(const ShowOptions& options) {
     if (!options.className.empty()) return {options.className};
     std::vector<std::string> names;
@@ -59,8 +51,9 @@ bool reportFailures(const Inventory& inventory) {
     bool failed = false;
     for (const ClassAnswer& answer : inventory) {
         if (answer.response.rc == CMPI_RC_OK) continue;
-        std::cerr << "plexor-testbed: " << answer.className << ": the provider answered status "
-                  << answer.response.rc << "\n";
+        printLine(std::cerr, "plexor-testbed: " + answer.className +
+                                 ": the provider answered status " +
+                                 std::to_string(answer.response.rc));
         failed = true;
     }
     return failed;
@@ -75,7 +68,7 @@ struct Answers {
 Answers ask(const ShowOptions& options) {
     Scenario scenario = readScenario(options.scenario);
     scenario.manager = chosenManager(scenario, options.manager);
-    directLog(options.log);
+    showProviderLog(options.log);
     ProviderSession session(scenario, locateLibrary(options.library, scenario.manager),
                             options.provider, options.schema, options.nameSpace);
     Answers answers;
@@ -94,7 +87,7 @@ std::string incomplete(const ShowOptions& options) {
 
 int show(const ShowOptions& options) {
     const auto [inventory, complete] = ask(options);
-    if (!complete) std::cerr << "plexor-testbed: " << incomplete(options) << "\n";
+    if (!complete) printLine(std::cerr, "plexor-testbed: " + incomplete(options));
     const bool colours = options.colour.onStandardOutput();
     TreeStyle style = TreeStyle::ofOutput(colours);
     style.problemsOnly = options.problems;

@@ -20,6 +20,7 @@
 #include "scenario_locator.h"
 #include "scenario_parser.h"
 #include "schema_choice.h"
+#include "whole_line.h"
 
 namespace testbed {
 
@@ -83,7 +84,7 @@ std::string timeText(double seconds) {
 void Printer::line(const std::string& text) {
     const std::lock_guard lock(mutex_);
     if (listener_) listener_(text);
-    std::cout << text << std::endl;
+    printLine(std::cout, text);
 }
 
 bool FileWatch::changed() {

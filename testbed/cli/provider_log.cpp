@@ -5,7 +5,10 @@
 
 #include <cstdarg>
 #include <cstdio>
+#include <iostream>
 #include <mutex>
+
+#include "whole_line.h"
 
 namespace testbed {
 namespace {
@@ -29,6 +32,11 @@ void directProviderLog(int priority, std::function<void(int, const std::string&)
     const std::lock_guard lock(sinkMutex);
     currentSink = std::move(sink);
     setlogmask(LOG_UPTO(priority));
+}
+
+void showProviderLog(bool show) {
+    if (!show) return directProviderLog(LOG_ERR, nullptr);
+    directProviderLog(LOG_DEBUG, [](int, const std::string& line) { printLine(std::cerr, line); });
 }
 
 }  // namespace testbed

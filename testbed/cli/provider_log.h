@@ -13,4 +13,8 @@ namespace testbed {
 /// sink gets the formatted line without its newline, on the logging thread, one line at a time.
 void directProviderLog(int priority, std::function<void(int priority, const std::string&)> sink);
 
+/// All lines go to standard error, or, unless they are to be shown, nowhere: they are masked as
+/// managers mask them.
+void showProviderLog(bool show);
+
 }  // namespace testbed

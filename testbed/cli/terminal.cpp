@@ -63,7 +63,7 @@ void Progress::run() {
     for (int seconds = kQuietSeconds;; seconds++) {
         const auto next = start + std::chrono::seconds(seconds);
         if (ended_.wait_until(lock, next, [this] { return end_; })) break;
-        std::cerr << kClearedLine << text_(seconds) << std::flush;
+        std::cerr << (kClearedLine + text_(seconds)) << std::flush;
         shown = true;
     }
     if (shown) std::cerr << kClearedLine << std::flush;

@@ -84,6 +84,5 @@ def serve(*arguments, scenario="healthy-array", port="0", **options):
     """A server, on a free port unless it is said, when it serves."""
     session = Session("serve", "--scenario", scenario_file(scenario) if "/" not in scenario
                       else scenario, "--port", port, *arguments, **options)
-    # A line of the log, from another stream, may stand before it.
-    session.url = session.await_line("serving http").rpartition("serving ")[2]
+    session.url = session.await_line("serving http").removeprefix("serving ")
     return session
