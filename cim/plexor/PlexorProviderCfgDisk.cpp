@@ -111,6 +111,7 @@ bool JoinAndAppend(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIObjectPa
                    int& rc) {
     free(disk->Pool);
     disk->Pool = StringClone(ReadKey(candidate, "InstanceID"));
+    const NoCancellation whole;  // a member without its record would keep requests waiting
     MutexGuard lock(ctrl->CtrlMutex);
     StoragePool_t* pool = FindStoragePoolByID(ctrl, disk->Pool);
     if (pool == nullptr) return false;

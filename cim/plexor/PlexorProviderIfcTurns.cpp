@@ -77,19 +77,6 @@ public:
     WaitingCleanup& operator=(const WaitingCleanup&) = delete;
 };
 
-/// Keeps a cancellation of the thread pending for a scope: a destructor that waits must not be
-/// left.
-class NoCancellation {
-public:
-    NoCancellation() { pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, &before_); }
-    ~NoCancellation() { pthread_setcancelstate(before_, nullptr); }
-    NoCancellation(const NoCancellation&) = delete;
-    NoCancellation& operator=(const NoCancellation&) = delete;
-
-private:
-    int before_;
-};
-
 }  // namespace
 
 // First counted, then the look whether controllers may be walked; those who close them do it the

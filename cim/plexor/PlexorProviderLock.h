@@ -40,6 +40,20 @@ private:
     bool locked_;
 };
 
+/// Keeps a cancellation of the thread pending for a scope: a destructor that waits must not be
+/// left, nor two lists that belong together while only one has changed. A line to the log is a
+/// place where a thread is cancelled.
+class NoCancellation {
+public:
+    NoCancellation() { pthread_setcancelstate(PTHREAD_CANCEL_DISABLE, &before_); }
+    ~NoCancellation() { pthread_setcancelstate(before_, nullptr); }
+    NoCancellation(const NoCancellation&) = delete;
+    NoCancellation& operator=(const NoCancellation&) = delete;
+
+private:
+    int before_;
+};
+
 #if defined(PLEXOR_CHECK_LOCKS)
 /// Tells on standard error, and counts, that `function` was called without a mutex that its caller
 /// has to hold. In checking builds only.

@@ -2,6 +2,9 @@
 #include <pthread.h>
 #include <sched.h>
 
+#include <sstream>
+
+#include "PlexorProviderLock.h"
 #include "deliberate_leaks.h"
 #include "meeting_fixture.h"
 #include "sanitizers.h"
@@ -46,8 +49,7 @@ protected:
         CapturedSyslog::onLine([before](const plexortest::LogLine& line) {
             if (line.text != "BuildControllerInfo, EXIT(0).\n") return;
             before();
-            pthread_cancel(pthread_self());
-            pthread_testcancel();
+            cancelHere();
         });
         auto factory = [this] {
             const testbed::Broker::CallScope scope(broker);
@@ -62,6 +64,11 @@ protected:
     static unsigned int active() {
         const plexortest::WorkersHeld held;
         return ActiveThreads;
+    }
+    /// What a cancellation of this thread meets here.
+    static void cancelHere() {
+        pthread_cancel(pthread_self());
+        pthread_testcancel();
     }
     /// Ends the worker as a manager does; the provider joins it.
     void cancelWorker(int index) {
@@ -84,9 +91,7 @@ TEST_F(CancelledTest, AnIdleWorkerLeavesTheOtherAtWork) {
 TEST_F(CancelledTest, ABuilderMayBeLeftWhileItReleasesWhatItTurnedAway) {
     load();
     CapturedSyslog::onLine([](const plexortest::LogLine& line) {
-        if (line.text != "Battery NULL deleted\n") return;
-        pthread_cancel(pthread_self());
-        pthread_testcancel();
+        if (line.text == "Battery NULL deleted\n") cancelHere();
     });
     auto build = [this] {
         const plexortest::DeliberateLeaks leaks;  // the record of which it tells
@@ -97,6 +102,58 @@ TEST_F(CancelledTest, ABuilderMayBeLeftWhileItReleasesWhatItTurnedAway) {
     EXPECT_EQ(pthread_join(thread, &result), 0);
     EXPECT_EQ(result, PTHREAD_CANCELED);
     CapturedSyslog::onLine({});
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+}
+
+StoragePool_t* firstPool(const RaidController_t* ctrl) {
+    return static_cast<StoragePool_t*>(ctrl->PoolList->Head->Data);
+}
+
+/// Whether every drive that a pool of the controller has as a member has its record: the request
+/// for a volume waits for it.
+bool everyMemberHasARecord(RaidController_t* ctrl) {
+    MutexGuard lock(ctrl->CtrlMutex);
+    for (const List_Entry_t* pool = ctrl->PoolList->Head; pool != nullptr; pool = pool->Next) {
+        const auto* drives = static_cast<StoragePool_t*>(pool->Data)->Drives;
+        for (const List_Entry_t* member = drives->Head; member != nullptr; member = member->Next) {
+            const auto* id = static_cast<const char*>(member->Data);
+            if (FindDiskByDeviceID(ctrl, id) == nullptr) return false;
+        }
+    }
+    return true;
+}
+
+TEST_F(CancelledTest, ADriveThatIsDeletedLeavesItsPoolAllTheSame) {
+    load();
+    RaidController_t* const ctrl = firstController();
+    CapturedSyslog::onLine([](const plexortest::LogLine& line) {
+        if (line.text.find(" removed from controller ") != std::string::npos) cancelHere();
+    });
+    auto remove = [ctrl] { DeleteDisk(ctrl, ctrl->DiskList->Head->Data); };
+    EXPECT_EQ(pthread_join(start(remove), nullptr), 0);
+    CapturedSyslog::onLine(nullptr);
+    EXPECT_EQ(ctrl->DiskList->Size, 0u);
+    EXPECT_TRUE(everyMemberHasARecord(ctrl));
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+}
+
+TEST_F(CancelledTest, ADriveThatJoinsItsPoolGetsIntoTheListAllTheSame) {
+    load();
+    RaidController_t* const ctrl = firstController();
+    EXPECT_EQ(DeleteDisk(ctrl, ctrl->DiskList->Head->Data), RESULT_OK);
+    std::ostringstream joined;
+    joined << " added to the list " << firstPool(ctrl)->Drives << ',';
+    CapturedSyslog::onLine([text = joined.str()](const plexortest::LogLine& line) {
+        if (line.text.find(text) != std::string::npos) cancelHere();
+    });
+    plexortest::VirtualClock::advance(100);
+    requestDrives().get();
+    EXPECT_TRUE(plexortest::eventually(
+        [&joined] { return CapturedSyslog::countContaining(joined.str()) > 0; }));
+    EXPECT_TRUE(plexortest::eventually([] { return active() == 0; }));
+    CapturedSyslog::onLine(nullptr);
+    EXPECT_EQ(ctrl->DiskList->Size, 1u);
+    EXPECT_TRUE(everyMemberHasARecord(ctrl));
     EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
 }
 
