@@ -8,6 +8,18 @@
 
 namespace {
 
+/// Whether this process is one that has more rights than whoever started it.
+bool hasMoreRights = false;
+
+}  // namespace
+
+// In front of the C library's, which cannot be made to believe that.
+extern "C" char* secure_getenv(const char* name) noexcept {
+    return hasMoreRights ? nullptr : getenv(name);
+}
+
+namespace {
+
 using plexortest::CapturedSyslog;
 using plexortest::currentProcessLine;
 using plexortest::formatted;
@@ -101,6 +113,17 @@ TEST_F(EntryDebugWaitTest, OnlyThePresenceOfTheVariableCounts) {
         callFactory();
         EXPECT_EQ(seen, (std::vector<int>{1, 1})) << '"' << value << '"';
     }
+}
+
+TEST_F(EntryDebugWaitTest, NobodyMakesAProcessWaitThatHasMoreRightsThanHe) {
+    setenv("WAIT_PROC", "1", 1);
+    hasMoreRights = true;
+    attachDuring(2);
+    callFactory();
+    hasMoreRights = false;
+    EXPECT_EQ(waitDebug, 0);
+    EXPECT_TRUE(plexortest::logged(LOG_DEBUG, currentProcessLine()));
+    EXPECT_EQ(seen, (std::vector<int>{}));
 }
 
 TEST_F(EntryDebugWaitTest, LaterCallsWaitToo) {
