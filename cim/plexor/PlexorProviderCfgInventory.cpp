@@ -32,6 +32,29 @@ void OpenGate() {
     pthread_cond_broadcast(&PlexorThreadCond);
 }
 
+/// Opens the gate when the inventory ends, be the thread cancelled: what is missing then comes with
+/// the refreshes, which the gate would keep back for ever.
+class InventoryEnd {
+public:
+    InventoryEnd() = default;
+    ~InventoryEnd() { OpenGate(); }
+    InventoryEnd(const InventoryEnd&) = delete;
+    InventoryEnd& operator=(const InventoryEnd&) = delete;
+};
+
+void BuildAllDevices(const CMPIInstanceMI* mi, const CMPIContext* ctx) {
+    const InventoryEnd end;
+    const List_Entry_t* entry = StopRequested() ? nullptr : RaidControllerList->Head;
+    for (; entry != nullptr && !StopRequested(); entry = entry->Next) {
+        auto* ctrl = static_cast<RaidController_t*>(entry->Data);
+        if (ctrl == nullptr) continue;
+        BuildPoolInfo(mi, ctx, ctrl);
+        BuildChassisInfo(mi, ctx, ctrl);
+        BuildLogicalDeviceInfo(mi, ctx, ctrl);
+        StampAll(ctrl);
+    }
+}
+
 }  // namespace
 
 void CloseInventoryGate() PLEXOR_LOCKS_UNCHECKED {
@@ -63,16 +86,6 @@ int BuildDeviceInfoAsync(const CMPIInstanceMI* mi, const CMPIContext*) {
 }
 
 void DoBuildDeviceInfoAsync(CMPIContext* ctx, void* args) {
-    const CMPIInstanceMI* mi = TakeWork<InventoryWork>(args).mi;
-    const List_Entry_t* entry = StopRequested() ? nullptr : RaidControllerList->Head;
-    for (; entry != nullptr && !StopRequested(); entry = entry->Next) {
-        auto* ctrl = static_cast<RaidController_t*>(entry->Data);
-        if (ctrl == nullptr) continue;
-        BuildPoolInfo(mi, ctx, ctrl);
-        BuildChassisInfo(mi, ctx, ctrl);
-        BuildLogicalDeviceInfo(mi, ctx, ctrl);
-        StampAll(ctrl);
-    }
-    OpenGate();
+    BuildAllDevices(TakeWork<InventoryWork>(args).mi, ctx);
     syslog(LOG_DEBUG, "%s done.", __func__);
 }

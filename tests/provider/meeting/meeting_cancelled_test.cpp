@@ -105,6 +105,22 @@ TEST_F(CancelledTest, ABuilderMayBeLeftWhileItReleasesWhatItTurnedAway) {
     EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
 }
 
+TEST_F(CancelledTest, WhatAnInventoryLeavesOutComesWithARefresh) {
+    CapturedSyslog::onLine([](const plexortest::LogLine& line) {
+        if (line.text == "BuildLogicalDeviceInfo, enter...\n") cancelHere();
+    });
+    callFactory();
+    EXPECT_TRUE(plexortest::eventually(
+        [] { return CapturedSyslog::countContaining("BuildLogicalDeviceInfo, enter...") > 0; }));
+    EXPECT_TRUE(plexortest::eventually([this] {
+        plexortest::VirtualClock::advance(100);
+        return requestDrives().get() == 1;
+    }));
+    CapturedSyslog::onLine(nullptr);
+    EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
+    EXPECT_EQ(CapturedSyslog::countContaining("still busy"), 0u);
+}
+
 StoragePool_t* firstPool(const RaidController_t* ctrl) {
     return static_cast<StoragePool_t*>(ctrl->PoolList->Head->Data);
 }
