@@ -36,9 +36,22 @@ CMPIInstance* FindHostInstance(const CMPIContext* ctx, const CMPIObjectPath* pat
 // A request that a cleanup could not wait for may still read the names, hence LoadShared and
 // StoreShared.
 
-void StoreName(char*& field, const CMPIInstance* host, const char* property) {
+/// The names as the manager has them, for whoever stores or frees them.
+struct HostNames {
+    char* system;
+    char* host;
+    char* className;
+};
+
+char* CloneName(const CMPIInstance* host, const char* property) {
     const char* text = ReadString(host, property);
-    if (text != nullptr) StoreShared(field, StringClone(text));
+    return text != nullptr ? StringClone(text) : nullptr;
+}
+
+HostNames ReadNames(const CMPIInstance* host) {
+    char* system = CloneName(host, "Name");
+    char* hostName = CloneName(host, "ElementName");
+    return {system, hostName, CloneName(host, "CreationClassName")};
 }
 
 void ReleaseName(char*& field) {
@@ -47,15 +60,25 @@ void ReleaseName(char*& field) {
 }
 
 /// False after a stop: the names are not this thread's any more.
-bool StoreNames(const CMPIInstance* host) {
+bool StoreIfLifeStands(const HostNames& names) {
     const LifeGuard life;
     if (!life.Stands()) return false;
     // A name that an earlier, incomplete reading left is replaced, not leaked.
     ReleaseSystemInfo();
-    StoreName(__SystemName, host, "Name");
-    StoreName(__HostName, host, "ElementName");
-    StoreName(__SystemClassName, host, "CreationClassName");
+    StoreShared(__SystemName, names.system);
+    StoreShared(__HostName, names.host);
+    StoreShared(__SystemClassName, names.className);
     return true;
+}
+
+/// False after a stop. Nobody who ends the life waits for the manager's answers.
+bool StoreNames(const CMPIInstance* host) {
+    const HostNames names = ReadNames(host);
+    if (StoreIfLifeStands(names)) return true;
+    free(names.system);
+    free(names.host);
+    free(names.className);
+    return false;
 }
 
 }  // namespace
