@@ -31,8 +31,9 @@ void MoveToPool(RaidController_t* ctrl, DiskDrive_t* disk, const char* newPool) 
            OrNull(disk->Pool), newPool);
     MutexGuard lock(ctrl->CtrlMutex);
     RemoveDiskFromPool(FindStoragePoolByID(ctrl, disk->Pool), disk->DeviceID);
+    char* pool = StringClone(newPool);
     free(disk->Pool);
-    disk->Pool = StringClone(newPool);
+    disk->Pool = pool;
 }
 
 void UpdatePool(RaidController_t* ctrl, DiskDrive_t* disk, const CMPIContext* ctx) {

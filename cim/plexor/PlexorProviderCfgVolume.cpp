@@ -130,8 +130,9 @@ void UpdateName(StorageVolume_t* volume, const char* name) {
     if (SameName(volume->ElementName, name)) return;
     syslog(LOG_DEBUG, "%s: volume %s element name changed. Old name %s, new name %s\n", kUpdater,
            volume->DeviceID, OrNull(volume->ElementName), OrNull(name));
+    char* copy = StringClone(name);
     free(volume->ElementName);
-    volume->ElementName = StringClone(name);
+    volume->ElementName = copy;
 }
 
 void Update(RaidController_t* ctrl, StorageVolume_t* volume, const CMPIContext* ctx,

@@ -47,7 +47,7 @@ int AddEntryAtListHead(List_t* list, void* data) {
     if (entry == nullptr) return RESULT_NO_MEMORY;
 
     // An empty list may carry a stale Tail (see RemoveEntryFromListByKey).
-    if (list->Head == nullptr) list->Tail = entry;
+    if (list->Head == nullptr || list->Tail == nullptr) list->Tail = entry;
     entry->Next = list->Head;
     list->Head = entry;
     DropIndex(list);
@@ -63,7 +63,7 @@ int AddEntryAtListTail(List_t* list, void* data) {
     if (entry == nullptr) return RESULT_NO_MEMORY;
 
     // An empty list may carry a stale Tail (see RemoveEntryFromListByKey): never write through it.
-    if (list->Head == nullptr) {
+    if (list->Head == nullptr || list->Tail == nullptr) {
         list->Head = entry;
     } else {
         list->Tail->Next = entry;

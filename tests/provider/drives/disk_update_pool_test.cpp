@@ -168,6 +168,8 @@ TEST_F(DiskUpdatePool, SurvivesACandidateWithoutIdentifier) {
         vendor.tie("CIM_ConcreteComponent", path, objects_.extent);
         ASSERT_EQ(updateDisk(), 0);
         EXPECT_EQ(ctrl->DiskUpdateTime, kLater);
+        EXPECT_STREQ(disk()->Pool, "P1");
+        EXPECT_THAT(members(pool_), ElementsAre(disk()->DeviceID));
         repository.dissociate("Sample_ConcreteComponent", path, objects_.extent);
     }
 }

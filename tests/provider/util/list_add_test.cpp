@@ -125,6 +125,21 @@ TEST_P(ListAdd, ListWithoutHeadIsEmptyWhateverItsTailSays) {
     EXPECT_EQ(elsewhere.Next, nullptr);
 }
 
+TEST_P(ListAdd, AListThatSomebodyMadeWithoutATailGetsOne) {
+    List_Entry_t made = {nullptr, &a};
+    list = {};
+    list.Head = &made;
+    list.Size = 1;
+    EXPECT_EQ(add(&b), 0);
+    ASSERT_NE(list.Tail, nullptr);
+    EXPECT_EQ(list.Tail->Data, &b);
+    EXPECT_EQ(list.Head, list.Tail);
+    EXPECT_EQ(list.Head->Next, GetParam().inFront ? &made : nullptr);
+    EXPECT_EQ(list.Size, 2u);
+    free(list.Head);
+    list = {};
+}
+
 TEST_F(ListTest, BothEndsMayBeMixed) {
     AddEntryAtListTail(&list, &b);
     AddEntryAtListHead(&list, &a);
