@@ -84,7 +84,6 @@ struct List_t {
     List_Entry_t* Head;
     List_Entry_t* Tail;
     unsigned int Size;
-    struct ListIndex_t* Index;  ///< the library's own: see EntriesWithId; null: not made
 };
 
 /// A bounded queue.

@@ -6,6 +6,7 @@
 //   3. a controller's CtrlMutex     its device lists and changing fields
 //   4. the life's mutex             LifeGuard
 //   5. Fifo_t::Mutex                the work queue
+//   6. the mutex of the lists' indexes
 // Those of ClassLock (who holds which *CfgMutex) and of the turns (factory, cleanup) guard their
 // own books; none but the life's is taken under them, nor are they taken under others but
 // PlexorThreadMutex. Work functions run with PlexorThreadMutex released. No broker query is made

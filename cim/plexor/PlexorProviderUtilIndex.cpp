@@ -1,11 +1,22 @@
 // The index of a list: chains of the entries whose identifiers have the same hash. Each chain is in
 // the list's order, so that records with the same identifier are found in that order too.
+//
+// Lists are what others know them as, so the indexes stand beside them, found by the list's
+// address.
 #include "PlexorProviderUtilIndex.h"
 
 #include <stdlib.h>
 #include <string.h>
 
+#include <atomic>
+
+#include "PlexorProviderLock.h"
+
 struct ListIndex_t {
+    const List_t* list;
+    ListIndex_t* next;             ///< of another list, guarded by __IndexMutex
+    unsigned int listSize;         ///< of the list that it knows
+    const List_Entry_t* listTail;  ///< the same
     IdOf_t idOf;
     std::uint32_t size;            ///< positions that have been given
     std::uint32_t capacity;        ///< also the number of chains
@@ -16,6 +27,39 @@ struct ListIndex_t {
 };
 
 namespace {
+
+pthread_mutex_t __IndexMutex = PTHREAD_MUTEX_INITIALIZER;
+constexpr size_t kIndexChains = 64;
+ListIndex_t* __Indexes[kIndexChains] PLEXOR_GUARDED_BY(__IndexMutex);
+// Spares the lists of those without an index the look: who made one did it under their list's lock.
+std::atomic<unsigned int> __IndexCount = 0;
+
+/// Where the chain begins that has the list's index, if there is one.
+ListIndex_t** IndexChainOf(const List_t* list) PLEXOR_HOLDS(__IndexMutex) {
+    return &__Indexes[reinterpret_cast<uintptr_t>(list) / sizeof(List_t) % kIndexChains];
+}
+
+void Keep(ListIndex_t* index, const List_t* list) {
+    index->list = list;
+    const MutexGuard lock(__IndexMutex);
+    ListIndex_t** chain = IndexChainOf(list);
+    index->next = *chain;
+    *chain = index;
+    __IndexCount++;
+}
+
+void Forget(const ListIndex_t* index) {
+    const MutexGuard lock(__IndexMutex);
+    ListIndex_t** place = IndexChainOf(index->list);
+    while (*place != index) place = &(*place)->next;
+    *place = index->next;
+    __IndexCount--;
+}
+
+/// Whether nobody has changed the list in another way since the index has followed it.
+bool Knows(const ListIndex_t* index, const List_t* list) {
+    return index->listSize == list->Size && index->listTail == list->Tail;
+}
 
 /// A walk of so few is not worth an allocation.
 constexpr unsigned int kShortList = 32;
@@ -80,13 +124,18 @@ bool Unchain(ListIndex_t* index, std::uint32_t chain, const List_Entry_t* entry)
 /// is of another identifier.
 const ListIndex_t* IndexOf(List_t* list, IdOf_t idOf) {
     if (list->Size <= kShortList) return nullptr;
-    if (list->Index != nullptr) return list->Index->idOf == idOf ? list->Index : nullptr;
-    ListIndex_t* index = NewIndex(list->Size, idOf);
+    ListIndex_t* index = KeptIndex(list);
+    if (index != nullptr && Knows(index, list)) return index->idOf == idOf ? index : nullptr;
+    DropIndex(list);
+    index = NewIndex(list->Size, idOf);
     if (index == nullptr) return nullptr;
     const List_Entry_t* entry = list->Head;
     for (; entry != nullptr && index->size < index->capacity; entry = entry->Next)
         Append(index, entry);
-    return list->Index = index;
+    index->listSize = list->Size;
+    index->listTail = list->Tail;
+    Keep(index, list);
+    return index;
 }
 
 }  // namespace
@@ -127,23 +176,36 @@ const List_Entry_t* EntriesWithId::Next() {
     return entry;
 }
 
+ListIndex_t* KeptIndex(const List_t* list) {
+    if (__IndexCount.load(std::memory_order_relaxed) == 0) return nullptr;
+    const MutexGuard lock(__IndexMutex);
+    ListIndex_t* index = *IndexChainOf(list);
+    while (index != nullptr && index->list != list) index = index->next;
+    return index;
+}
+
 void IndexTail(List_t* list) {
-    ListIndex_t* index = list->Index;
+    ListIndex_t* index = KeptIndex(list);
     if (index == nullptr) return;
     // The next look makes a larger one.
     if (index->size == index->capacity) return DropIndex(list);
     Append(index, list->Tail);
+    index->listSize++;
+    index->listTail = list->Tail;
 }
 
 void UnindexEntry(List_t* list, const List_Entry_t* entry) {
-    ListIndex_t* index = list->Index;
+    ListIndex_t* index = KeptIndex(list);
     if (index == nullptr) return;
+    index->listSize--;
+    index->listTail = list->Tail;
     const char* id = list->Head != nullptr ? index->idOf(entry->Data) : nullptr;
     if (id == nullptr || !Unchain(index, ChainOf(index, id), entry)) DropIndex(list);
 }
 
 void DropIndex(List_t* list) {
-    if (list->Index == nullptr) return;
-    free(list->Index);
-    list->Index = nullptr;
+    ListIndex_t* index = KeptIndex(list);
+    if (index == nullptr) return;
+    Forget(index);
+    free(index);
 }

@@ -148,11 +148,11 @@ void FreeList(List_t* list, ReleaseFunc_t release) {
     syslog(LOG_DEBUG, "Freeing list %p, release function %p\n", static_cast<void*>(list),
            reinterpret_cast<void*>(release));
     if (list == nullptr) return;
+    DropIndex(list);
     if (IsListEmpty(list)) {
         syslog(LOG_DEBUG, "List %p is empty\n", static_cast<void*>(list));
         return;
     }
-    DropIndex(list);
     while (list->Head != nullptr) {
         void* item = nullptr;
         RemoveEntryFromList(list, &item);

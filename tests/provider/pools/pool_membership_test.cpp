@@ -1,4 +1,5 @@
 // The drives that a pool lists.
+#include "PlexorProviderUtilIndex.h"
 #include "provider_fixture.h"
 
 namespace plexortest {
@@ -79,7 +80,7 @@ TEST_F(LargePoolMembership, ADriveIsListedOnce) {
 }
 
 TEST_F(LargePoolMembership, ADriveIsLookedUpInAnIndex) {
-    EXPECT_NE(pool->Drives->Index, nullptr);
+    EXPECT_NE(KeptIndex(pool->Drives), nullptr);
 }
 
 TEST_F(LargePoolMembership, DrivesThatMoveAwayAndBackDoNotCostALookAtAllEach) {

@@ -28,6 +28,7 @@ static_assert(kIs<decltype(RaidController_t::HealthState), CMPIUint16>);
 static_assert(kIs<decltype(RaidController_t::UpdateEnabled), unsigned char>);
 static_assert(kIs<decltype(RaidController_t::ControllerUpdateTime), time_t>);
 static_assert(kIs<decltype(List_t::Size), unsigned int>);
+static_assert(sizeof(List_t) == 3 * sizeof(void*), "others have lists of their own");
 static_assert(kIs<decltype(Fifo_t::Size), unsigned int>);
 static_assert(kIs<decltype(Array_t::Count), unsigned int>);
 static_assert(sizeof(Array_t::Array) / sizeof(void*) == 8);

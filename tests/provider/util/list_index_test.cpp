@@ -111,7 +111,7 @@ TEST_P(ListIndexTest, NoIdentifierIsThatOfAllEntries) {
     addOthers(GetParam());
     add({record(nullptr), record("last")});
     EXPECT_EQ(items(), found(nullptr));
-    EXPECT_EQ(nullptr, list.Index);
+    EXPECT_EQ(nullptr, KeptIndex(&list));
 }
 
 TEST_P(ListIndexTest, FindsWhatHasBeenAddedSince) {
@@ -166,7 +166,7 @@ TEST_P(ListIndexTest, WithoutMemoryItIsWalked) {
     add({last});
     const FailAllocation failing = FailAllocation::from(1);
     EXPECT_EQ(Items{last}, found("last"));
-    EXPECT_EQ(nullptr, list.Index);
+    EXPECT_EQ(nullptr, KeptIndex(&list));
 }
 
 INSTANTIATE_TEST_SUITE_P(Walked, ListIndexTest, ::testing::Values(0, 1, 6));
@@ -179,21 +179,21 @@ TEST_P(ListIndexMaking, IsMadeOnceAndThenKept) {
     const bool hasOne = GetParam() > kMostWithoutIndex;
     const FailAllocation counted = FailAllocation::none();
     found("id0");
-    EXPECT_EQ(hasOne, list.Index != nullptr);
-    const ListIndex_t* made = list.Index;
+    EXPECT_EQ(hasOne, KeptIndex(&list) != nullptr);
+    const ListIndex_t* made = KeptIndex(&list);
     found("id1");
     found("nobody");
-    EXPECT_EQ(made, list.Index);
+    EXPECT_EQ(made, KeptIndex(&list));
     EXPECT_EQ(hasOne ? 1u : 0u, counted.calls());
 }
 
 TEST_P(ListIndexMaking, TakesFortyBytesForEachEntryThatItIsMadeOf) {
     addOthers(GetParam());
     found("id0");
-    ASSERT_EQ(GetParam() > kMostWithoutIndex, list.Index != nullptr);
-    if (list.Index == nullptr) return;
-    EXPECT_GE(malloc_usable_size(list.Index), 40 * GetParam());
-    EXPECT_LE(malloc_usable_size(list.Index), 40 * GetParam() + 80);
+    ASSERT_EQ(GetParam() > kMostWithoutIndex, KeptIndex(&list) != nullptr);
+    if (KeptIndex(&list) == nullptr) return;
+    EXPECT_GE(malloc_usable_size(KeptIndex(&list)), 40 * GetParam());
+    EXPECT_LE(malloc_usable_size(KeptIndex(&list)), 40 * GetParam() + 112);
 }
 
 TEST_P(ListIndexMaking, FollowsTheListUntilItsRoomIsUsedUp) {
@@ -210,7 +210,7 @@ TEST_P(ListIndexMaking, FollowsTheListUntilItsRoomIsUsedUp) {
         EXPECT_EQ(Items{}, found("twin"));
     }
     EXPECT_EQ(GetParam() / 2, counted.calls()) << "the entries";
-    EXPECT_EQ(hasOne, list.Index != nullptr);
+    EXPECT_EQ(hasOne, KeptIndex(&list) != nullptr);
 }
 
 TEST_P(ListIndexMaking, SparesALookAtMostOthers) {
@@ -239,12 +239,12 @@ TEST_P(ListIndexMaking, IsMadeLargerNowAndThen) {
 TEST_P(ListIndexMaking, IsNotThatOfAnotherIdentifier) {
     addOthers(GetParam());
     found("id0");
-    const ListIndex_t* made = list.Index;
+    const ListIndex_t* made = KeptIndex(&list);
     EntriesWithId entries(&list, "other", [](const void*) { return "other"; });
     Items all;
     while (const List_Entry_t* entry = entries.Next()) all.push_back(entry->Data);
     EXPECT_EQ(items(), all);
-    EXPECT_EQ(made, list.Index);
+    EXPECT_EQ(made, KeptIndex(&list));
 }
 
 TEST_P(ListIndexMaking, IsForgottenWhereTheIdentifierOfWhatLeavesHasChanged) {
@@ -264,7 +264,7 @@ TEST_P(ListIndexMaking, IsGoneWhenTheListIsFreed) {
     addOthers(GetParam());
     found("id0");
     FreeList(&list, [](void*) {});
-    EXPECT_EQ(nullptr, list.Index);
+    EXPECT_EQ(nullptr, KeptIndex(&list));
     EXPECT_EQ(Items{}, found("id0"));
 }
 
@@ -277,7 +277,51 @@ TEST_P(ListIndexMaking, IsGoneWhenTheLastEntryIs) {
             ASSERT_EQ(0, byKey ? RemoveEntryFromListByKey(&list, item)
                                : RemoveEntryFromList(&list, &item));
         }
-        EXPECT_EQ(nullptr, list.Index);
+        EXPECT_EQ(nullptr, KeptIndex(&list));
+    }
+}
+
+TEST_P(ListIndexMaking, IsMadeAnewWhereSomebodyHasChangedTheListByHand) {
+    addOthers(GetParam());
+    Record* last = record("last");
+    add({last});
+    EXPECT_EQ(Items{last}, found("last"));
+    List_Entry_t more = {nullptr, record("more")};
+    List_Entry_t* const tail = list.Tail;
+    tail->Next = list.Tail = &more;
+    list.Size++;
+    EXPECT_EQ(Items{more.Data}, found("more"));
+    List_Entry_t other = {nullptr, record("other")};
+    tail->Next = list.Tail = &other;
+    EXPECT_EQ(Items{other.Data}, found("other"));
+    EXPECT_EQ(Items{}, found("more"));
+    tail->Next = nullptr;
+    list.Tail = tail;
+    list.Size--;
+    EXPECT_EQ(Items{last}, found("last"));
+    EXPECT_EQ(Items{}, found("other"));
+}
+
+TEST(ListIndexes, EachListHasItsOwn) {
+    constexpr std::size_t kLists = 200;  // more than there are chains of them
+    std::deque<Record> records;
+    std::vector<List_t> lists(kLists);
+    const auto found = [](List_t& list, const char* id) {
+        EntriesWithId entries(&list, id, idOf);
+        const List_Entry_t* entry = entries.Next();
+        return entry != nullptr ? entry->Data : nullptr;
+    };
+    for (List_t& list : lists) {
+        for (std::size_t i = 0; i <= kMostWithoutIndex; i++) {
+            AddEntryAtListTail(&list, &records.emplace_back(Record{"one"}));
+        }
+        EXPECT_EQ(found(list, "one"), list.Head->Data);
+    }
+    for (std::size_t i = 0; i < kLists; i++) {
+        List_t& freed = lists[i * 7 % kLists];  // in another order than they came
+        EXPECT_EQ(found(freed, "one"), freed.Head->Data);
+        FreeList(&freed, [](void*) {});
+        EXPECT_EQ(KeptIndex(&freed), nullptr);
     }
 }
 
