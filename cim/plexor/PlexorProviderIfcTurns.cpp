@@ -119,10 +119,7 @@ bool FactoryCall::TakeTurn() {
     // A request that is still walking the list must not see it grow.
     __Requests.Close(false);
     Await(deadline, [this] { return Overtaken() || OldRequestsAreGone(); });
-    if (!Overtaken()) return true;
-    lock.Unlock();
-    EndTurn();
-    return false;
+    return !Overtaken();
 }
 
 void FactoryCall::EndTurn() {
