@@ -59,6 +59,20 @@ TEST_F(InventoryAsync, OneItemIsQueued) {
     EXPECT_EQ(ThreadActivityDone, 0u);
 }
 
+TEST_F(InventoryAsync, TheInterfaceIsHandedOnToEachDevice) {
+    cachedController("C0");
+    vendor.battery(card, "b1");
+    uintptr_t handed = 0;
+    VirtualClock::onSleep([&](unsigned int) {
+        auto* item = static_cast<Thread_Args_t*>(GetItem(&__FIFO));
+        if (item == nullptr) return;
+        handed = item->Arg1;
+        item->Func(ctx(), item);
+    });
+    buildInventory();
+    EXPECT_EQ(handed, reinterpret_cast<uintptr_t>(&mi));
+}
+
 TEST_F(InventoryAsync, OneWorkerIsWokenWithoutTheMutex) {
     const WakeUpCounter wakeUps;
     ASSERT_EQ(BuildDeviceInfoAsync(&mi, ctx()), 0);

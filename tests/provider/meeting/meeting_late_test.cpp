@@ -118,8 +118,10 @@ TEST_F(LateCallsTest, AHangingRequestCostsItsOwnLifeOnly) {
     Gate gate;
     auto request = requestHeldAt(Entry::NewInstance, gate);
     const GivenUpInventory givenUp;
+    const int pinsBefore = pins;
     cleanUpSoon();
     ASSERT_EQ(givenUpLines(), 1u);
+    EXPECT_GT(pins, pinsBefore) << "it is inside the library";
     const std::size_t clones = books().liveClones();
 
     {
