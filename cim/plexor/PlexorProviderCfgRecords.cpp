@@ -193,8 +193,8 @@ int DeletePort(RaidController_t* ctrl, void* device) {
 
 int DeleteDisk(RaidController_t* ctrl, void* device) {
     if (ctrl == nullptr) return RESULT_BAD_ARGUMENT;
-    // Held to the end: no reader may see the drive gone from the list but still in its pool.
     const NoCancellation whole;
+    // Held to the end: no reader may see the drive gone from the list but still in its pool.
     MutexGuard lock(ctrl->CtrlMutex);
     const int rc = RemoveEntryFromListByKey(DevicesOf(ctrl, kDrives), device);
     if (rc != RESULT_OK) return rc;
