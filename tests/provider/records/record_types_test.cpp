@@ -1,6 +1,9 @@
 // The records' fields and the numbers of the enumerations, as clients and the vendor know them.
+#include <malloc.h>
+
 #include <type_traits>
 
+#include "PlexorProviderCfg.h"
 #include "fake_path.h"
 #include "provider_fixture.h"
 
@@ -33,6 +36,13 @@ static_assert(kIs<decltype(Fifo_t::Size), unsigned int>);
 static_assert(kIs<decltype(Array_t::Count), unsigned int>);
 static_assert(sizeof(Array_t::Array) / sizeof(void*) == 8);
 static_assert(sizeof(CMPIUint16) == 2 && sizeof(CMPIUint64) == 8 && sizeof(CMPIBoolean) == 1);
+
+TEST(RecordTypes, ARecordTakesItsSizeAndNotMuchMore) {
+    auto* volume = NewRecord<StorageVolume_t>();
+    ASSERT_NE(volume, nullptr);
+    EXPECT_LT(malloc_usable_size(volume), sizeof *volume + 32);
+    free(volume);
+}
 
 TEST(RecordTypes, OperationalStatusHasItsCimNumbers) {
     const int values[] = {
