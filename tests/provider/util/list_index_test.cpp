@@ -2,6 +2,7 @@
 // index, which follows their changes. Either way all entries with the identifier are found, in the
 // list's order.
 #include <malloc.h>
+#include <unistd.h>
 
 #include <deque>
 #include <string>
@@ -300,6 +301,25 @@ TEST_P(ListIndexMaking, IsMadeAnewWhereSomebodyHasChangedTheListByHand) {
     list.Size--;
     EXPECT_EQ(Items{last}, found("last"));
     EXPECT_EQ(Items{}, found("other"));
+    DropIndex(&list);
+    EXPECT_EQ(KeptIndex(&list), nullptr) << "one made before is still there";
+}
+
+/// The status of a process that has one list with an index: 0 when that is found.
+int statusWithOneIndex() {
+    List_t list = {};
+    Record record = {"one"};
+    while (list.Size <= kMostWithoutIndex) AddEntryAtListTail(&list, &record);
+    const EntriesWithId made(&list, "one", idOf);
+    return KeptIndex(&list) != nullptr ? 0 : 1;
+}
+
+TEST(ListIndexes, TheOnlyOneIsFound) {
+    // Other tests of this process may have left one.
+    const std::string style = GTEST_FLAG_GET(death_test_style);
+    GTEST_FLAG_SET(death_test_style, "threadsafe");
+    EXPECT_EXIT(_exit(statusWithOneIndex()), ::testing::ExitedWithCode(0), "");
+    GTEST_FLAG_SET(death_test_style, style);
 }
 
 TEST(ListIndexes, EachListHasItsOwn) {
