@@ -10,6 +10,15 @@ using testbed::FaultRule;
 
 class WorkersStart : public WorkersTest {
 protected:
+    /// There is no context for the other one.
+    void startTheOnlyWorker() {
+        FaultRule none;
+        none.entry = Entry::PrepareAttachThread;
+        none.nullResult = true;
+        none.times = 1;
+        faults().add(none);
+        startWorkers(1);
+    }
     /// Expects that the start, of which nothing was said, has left nothing.
     void expectNoneStarted() {
         EXPECT_EQ(books().count(Entry::AttachThread), books().count(Entry::DetachThread));
@@ -122,12 +131,7 @@ TEST_F(WorkersStart, NothingIsDoneYet) {
 }
 
 TEST_F(WorkersStart, WithoutAContextThereIsNoWorker) {
-    FaultRule none;
-    none.entry = Entry::PrepareAttachThread;
-    none.nullResult = true;
-    none.times = 1;
-    faults().add(none);
-    startWorkers(1);
+    startTheOnlyWorker();
     tasks_.queue([](CMPIContext*, void*) {});
     ASSERT_TRUE(workersComeToRest());
     EXPECT_EQ(tasks_.ended(), 1);
@@ -176,12 +180,7 @@ TEST_F(WorkersStart, AStopBehindTheIntervalPreparesNoThread) {
 }
 
 TEST_F(WorkersStart, ItsOnlyWorkersQueueIsEmptiedByWhoeverWaits) {
-    FaultRule none;
-    none.entry = Entry::PrepareAttachThread;
-    none.nullResult = true;
-    none.times = 1;
-    faults().add(none);
-    startWorkers(1);
+    startTheOnlyWorker();
     EXPECT_FALSE(RunQueuedItemAlone(ctx())) << "nothing is queued";
     Gate gate;
     const GateOpener opener(gate);
@@ -200,12 +199,7 @@ TEST_F(WorkersStart, ItsOnlyWorkersQueueIsEmptiedByWhoeverWaits) {
 }
 
 TEST_F(WorkersStart, AfterItsCleanupTheOnlyWorkerIsNoneAnyMore) {
-    FaultRule none;
-    none.entry = Entry::PrepareAttachThread;
-    none.nullResult = true;
-    none.times = 1;
-    faults().add(none);
-    startWorkers(1);
+    startTheOnlyWorker();
     stopWorkers();
     __atomic_store_n(&TerminateThread, 0, __ATOMIC_SEQ_CST);
     auto* idle = zeroed<Thread_Args_t>();
