@@ -123,16 +123,16 @@ class Run(unittest.TestCase):
         other = self.run_mutants("--list", "--sample", "3", "--seed", "6")
         self.assertNotEqual(first.stdout, other.stdout)
 
-    def test_the_parts_are_the_whole(self):
+    def test_the_slices_are_the_whole(self):
         whole = self.run_mutants("--list").stdout.splitlines()[:-1]
-        parts = []
+        slices = []
         for number in "12":
-            lines = self.run_mutants("--list", "--part", f"{number}/2").stdout.splitlines()
+            lines = self.run_mutants("--list", "--slice", f"{number}/2").stdout.splitlines()
             self.assertGreater(len(lines), 1)
-            parts += lines[:-1]
-        self.assertEqual(sorted(parts), sorted(whole))
+            slices += lines[:-1]
+        self.assertEqual(sorted(slices), sorted(whole))
         for wrong in ("0/2", "3/2", "1", "a/b"):
-            self.assertEqual(self.run_mutants("--list", "--part", wrong).returncode, 2, wrong)
+            self.assertEqual(self.run_mutants("--list", "--slice", wrong).returncode, 2, wrong)
 
     def test_an_entry_that_names_no_mutant_is_refused(self):
         path = self.root / "tests" / "mutants" / "equivalent.json"
