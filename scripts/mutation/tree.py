@@ -10,7 +10,7 @@ from pathlib import Path
 SOURCES = "cim/plexor"
 _BUILD = "build"  # in the copy, never copied
 # The provider's tests; the second one has functions of its own in front of the provider's.
-PROGRAMS = ("provider-tests", "render-chassis-tests")
+PROGRAMS = ("provider-tests", "interposed-tests")
 
 
 class TreeError(Exception):

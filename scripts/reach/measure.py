@@ -9,7 +9,7 @@ from reach.judge import DEMANDS
 from reach.places import Reach
 
 # What they count is written at their end, as is that of the tool and of libraries that they use.
-PROGRAMS = ("provider-tests", "render-chassis-tests", "faults-test", "testbed-tests", "vendor-tests",
+PROGRAMS = ("provider-tests", "interposed-tests", "faults-test", "testbed-tests", "vendor-tests",
             "schema-tests", "wbem-tests", "page-tests", "ask-tests", "scenario-tests")
 # Tests that are scripts, or need arguments, by their names for ctest; and what they need.
 OTHER_TESTS = r"^(steering\..*|scenario-schema|load\.c_program.*)$"

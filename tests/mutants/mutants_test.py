@@ -62,7 +62,7 @@ find_package(GTest REQUIRED)
 add_subdirectory(cim/plexor)
 add_executable(provider-tests thing_test.cpp)
 target_link_libraries(provider-tests PRIVATE plexor_objects GTest::gtest_main)
-add_executable(render-chassis-tests other_test.cpp)
+add_executable(interposed-tests other_test.cpp)
 """,
     "tests/mutants/equivalent.json": json.dumps([{
         "reason": "nobody asks for it",
