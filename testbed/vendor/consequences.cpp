@@ -4,9 +4,12 @@
 #include <algorithm>
 #include <map>
 #include <optional>
+#include <string_view>
+#include <unordered_map>
 
 #include "array_commands.h"
-#include "raid_group.h"
+#include "group_places.h"
+#include "json_reader.h"
 #include "scenario_parser.h"
 
 namespace testbed {
@@ -31,7 +34,11 @@ public:
     ControllerChange(json& controller, const ControllerDescription& before,
                      const ControllerDescription& after, const Consequences& times,
                      Aftermath& aftermath)
-        : json_(controller), before_(before), after_(after), times_(times), aftermath_(aftermath) {}
+        : json_(controller), before_(before), after_(after), times_(times), aftermath_(aftermath) {
+        for (const DriveDescription& drive : after_.drives) {
+            if (!drive.spareFor.empty()) standIns_[drive.spareFor].push_back(&drive);
+        }
+    }
 
     void followEnclosures() {
         for (const EnclosureDescription& enclosure : after_.enclosures) {
@@ -48,13 +55,13 @@ public:
         for (const PoolDescription& pool : after_.pools) {
             const PoolDescription* old = findById(before_.pools, pool.id);
             if (!old || pool.primordial) continue;
-            std::vector<std::string> places = groupPlaces(before_, *old);
-            if (!hasChanged(pool, places)) continue;
+            GroupPlaces places(groupPlaces(before_, *old), drivesAfter_);
+            if (!hasChanged(pool, places.ids())) continue;
             for (const DriveDescription& drive : after_.drives) {
                 if (holds(drive.pools, pool.id)) followDrive(pool, drive, places);
             }
             callSpares(pool, places);
-            element(pool.id, "pools")["members"] = places;
+            element("pools", pool.id)["members"] = places.ids();
         }
         for (const DriveDescription& drive : after_.drives) {
             if (conditionOf(drive) != Filling) {
@@ -101,13 +108,20 @@ private:
     }
 
     /// To be changed.
-    json& element(const std::string& id, const char* list = "drives") {
+    json& driveElement(const std::string& id) {
+        changed_ = true;
+        if (drives_.empty()) {
+            for (json& element : json_["drives"]) drives_.try_emplace(idOf(element), &element);
+        }
+        return *drives_.at(id);
+    }
+    json& element(const char* list, const std::string& id) {
         changed_ = true;
         return *findElement(json_, list, id);
     }
 
     std::optional<DriveCondition> conditionBefore(const std::string& id) const {
-        const DriveDescription* old = findById(before_.drives, id);
+        const DriveDescription* old = drivesBefore_.find(id);
         return old ? std::optional(conditionOf(*old)) : std::nullopt;
     }
 
@@ -119,7 +133,7 @@ private:
 
     void hide(const DriveDescription& hidden) {
         if (conditionOf(hidden) == Lost) return;
-        json& entry = element(hidden.id);
+        json& entry = driveElement(hidden.id);
         const std::string state = entry.value("state", "online");
         setState(entry, "offline");
         entry["before"] = state;
@@ -127,7 +141,7 @@ private:
 
     void bringBack(const DriveDescription& hidden) {
         if (hidden.before.empty()) return;
-        json& entry = element(hidden.id);
+        json& entry = driveElement(hidden.id);
         entry.erase("before");
         setState(entry, hidden.before);
     }
@@ -135,64 +149,55 @@ private:
     /// Whether a drive of the group has come, gone or changed.
     bool hasChanged(const PoolDescription& pool, const std::vector<std::string>& places) const {
         for (const DriveDescription& drive : after_.drives) {
-            const DriveDescription* old = findById(before_.drives, drive.id);
+            const DriveDescription* old = drivesBefore_.find(drive.id);
             const bool isIn = holds(drive.pools, pool.id);
             const bool wasIn = old && holds(old->pools, pool.id);
             if (isIn != wasIn || (isIn && conditionOf(*old) != conditionOf(drive))) return true;
         }
         return std::any_of(places.begin(), places.end(), [&](const std::string& id) {
-            return findById(before_.drives, id) && !findById(after_.drives, id);
+            return drivesBefore_.find(id) && !drivesAfter_.find(id);
         });
     }
 
-    const DriveDescription* standInFor(const std::string& id,
-                                       const std::vector<std::string>& places) const {
-        for (const DriveDescription& drive : after_.drives) {
-            if (drive.spareFor == id && holds(places, drive.id)) return &drive;
+    const DriveDescription* standInFor(const std::string& id, const GroupPlaces& places) const {
+        const auto found = standIns_.find(id);
+        if (found == standIns_.end()) return nullptr;
+        for (const DriveDescription* drive : found->second) {
+            if (places.placeOf(drive->id)) return drive;
         }
         return nullptr;
     }
 
     void followDrive(const PoolDescription& pool, const DriveDescription& drive,
-                     std::vector<std::string>& places) {
+                     GroupPlaces& places) {
         const DriveCondition now = conditionOf(drive);
         const auto then = conditionBefore(drive.id);
         if (now == then || (now != Sound && now != Filling)) return;
         const DriveDescription* standIn = standInFor(drive.id, places);
         const bool isFilled = now == Sound && then == Filling;
-        if (now == Filling || (!isFilled && (standIn || (!then && placeFor(drive, places))))) {
+        if (now == Filling || (!isFilled && (standIn || (!then && places.placeFor(drive.id))))) {
             fill(drive, standIn, places);
         } else if (standIn) {
-            *std::find(places.begin(), places.end(), standIn->id) = drive.id;
+            places.put(*places.placeOf(standIn->id), drive.id);
             release(*standIn);
         } else if (isFilled && !drive.spareFor.empty()) {
             retire(pool, drive.spareFor);
-        } else if (!holds(places, drive.id)) {
-            places.push_back(drive.id);
+        } else if (!places.placeOf(drive.id)) {
+            places.append(drive.id);
         }
-    }
-
-    /// The drive's own place, or the first one whose drive is lost; NULL when all are taken.
-    std::string* placeFor(const DriveDescription& drive, std::vector<std::string>& places) const {
-        const auto own = std::find(places.begin(), places.end(), drive.id);
-        if (own != places.end()) return &*own;
-        for (std::string& place : places) {
-            const DriveDescription* other = findById(after_.drives, place);
-            if (!other || conditionOf(*other) == Lost) return &place;
-        }
-        return nullptr;
     }
 
     /// A drive gets its data: in the place of a lost one, or back from the spare in its place.
     void fill(const DriveDescription& filled, const DriveDescription* standIn,
-              std::vector<std::string>& places) {
-        json& entry = element(filled.id);
+              GroupPlaces& places) {
+        json& entry = driveElement(filled.id);
         if (conditionOf(filled) != Filling) setState(entry, standIn ? "copy back" : "rebuild");
-        if (!standIn) {
-            std::string* place = placeFor(filled, places);
-            if (!place) place = &places.emplace_back(filled.id);
-            if (*place != filled.id && findById(after_.drives, *place)) entry["spareFor"] = *place;
-            *place = filled.id;
+        if (const auto place = places.placeFor(filled.id); !standIn && place) {
+            const std::string lost = places.ids()[*place];
+            if (lost != filled.id && drivesAfter_.find(lost)) entry["spareFor"] = lost;
+            places.put(*place, filled.id);
+        } else if (!standIn) {
+            places.append(filled.id);
         }
         schedule(subjectOf("drive", after_.id, filled.id), "online",
                  standIn ? times_.copyBack : times_.rebuild);
@@ -206,7 +211,7 @@ private:
 
     /// A spare that has done its work.
     void release(const DriveDescription& spare) {
-        json& entry = element(spare.id);
+        json& entry = driveElement(spare.id);
         entry.erase("spareFor");
         moveToPrimordial(entry);
         setState(entry, "hot spare");
@@ -214,9 +219,9 @@ private:
 
     /// A lost drive whose place another one has taken leaves the group.
     void retire(const PoolDescription& pool, const std::string& id) {
-        const DriveDescription* lost = findById(after_.drives, id);
+        const DriveDescription* lost = drivesAfter_.find(id);
         if (!lost || conditionOf(*lost) != Lost || !holds(lost->pools, pool.id)) return;
-        json& entry = element(id);
+        json& entry = driveElement(id);
         entry.erase("spareFor");
         moveToPrimordial(entry);
         entry["primordial"] = true;
@@ -233,33 +238,34 @@ private:
     }
 
     bool canRebuild(const PoolDescription& pool, const std::vector<std::string>& places) const {
-        const auto conditions = placeConditions(after_, pool.id, places);
+        const auto conditions = placeConditions(drivesAfter_, pool.id, places);
         return std::any_of(after_.volumes.begin(), after_.volumes.end(), [&](const auto& volume) {
             return holds(volume.pools, pool.id) && volume.operationalStatus != kOffline &&
                    volumeStateOver(volume, conditions) != std::string("offline");
         });
     }
 
-    void callSpares(const PoolDescription& pool, std::vector<std::string>& places) {
-        if (!canRebuild(pool, places)) return;
-        const auto conditions = placeConditions(after_, pool.id, places);
-        for (std::size_t i = 0; i < places.size(); ++i) {
+    void callSpares(const PoolDescription& pool, GroupPlaces& places) {
+        if (!canRebuild(pool, places.ids())) return;
+        const auto conditions = placeConditions(drivesAfter_, pool.id, places.ids());
+        for (std::size_t i = 0; i < conditions.size(); ++i) {
+            const std::string old = places.ids()[i];
             // What followDrive has put there is being filled.
-            const DriveDescription* lost = findById(after_.drives, places[i]);
+            const DriveDescription* lost = drivesAfter_.find(old);
             if (conditions[i] != Lost || (lost && conditionOf(*lost) != Lost)) continue;
-            const DriveDescription* size = lost ? lost : findById(before_.drives, places[i]);
+            const DriveDescription* size = lost ? lost : drivesBefore_.find(old);
             const DriveDescription* spare = smallestSpare(size ? size->blocks : 0);
             if (!spare) continue;
             const bool wasStandIn = size && !size->spareFor.empty();
-            if (wasStandIn) retire(pool, places[i]);
-            join(pool, *spare, wasStandIn ? size->spareFor : places[i]);
-            places[i] = spare->id;
+            if (wasStandIn) retire(pool, old);
+            join(pool, *spare, wasStandIn ? size->spareFor : old);
+            places.put(i, spare->id);
         }
     }
 
     void join(const PoolDescription& pool, const DriveDescription& spare, const std::string& lost) {
         taken_.emplace(spare.id, true);
-        json& entry = element(spare.id);
+        json& entry = driveElement(spare.id);
         movePool(entry, pool.id);
         setState(entry, "rebuild");
         entry["spareFor"] = lost;
@@ -269,7 +275,7 @@ private:
     /// Whether a drive has come back as it was, with its data.
     bool hasReturned(const std::vector<std::string>& places) const {
         return std::any_of(places.begin(), places.end(), [&](const std::string& id) {
-            const DriveDescription* drive = findById(after_.drives, id);
+            const DriveDescription* drive = drivesAfter_.find(id);
             return drive && conditionOf(*drive) == Sound && conditionBefore(id) == Lost;
         });
     }
@@ -279,10 +285,11 @@ private:
         if (!pool || pool->primordial) return;
         const std::vector<std::string> places = groupPlaces(after_, *pool);
         if (!hasChanged(*pool, places) && sameMembers(*pool)) return;
-        const std::string state = volumeStateOver(volume, placeConditions(after_, id, places));
+        const std::string state =
+            volumeStateOver(volume, placeConditions(drivesAfter_, id, places));
         if (volume.operationalStatus == kOffline && !hasReturned(places)) return;
-        setState(element(volume.id, "volumes"), state);
-        json& poolElement = element(id, "pools");
+        setState(element("volumes", volume.id), state);
+        json& poolElement = element("pools", id);
         poolElement.erase("operationalStatus");
         poolElement["status"] = state == "optimal"   ? "ok"
                                 : state == "offline" ? "error"
@@ -297,6 +304,10 @@ private:
     json& json_;
     const ControllerDescription& before_;
     const ControllerDescription& after_;
+    const DriveIndex drivesBefore_{before_.drives};
+    const DriveIndex drivesAfter_{after_.drives};
+    std::unordered_map<std::string_view, std::vector<const DriveDescription*>> standIns_;
+    std::unordered_map<std::string, json*> drives_;
     const Consequences& times_;
     Aftermath& aftermath_;
     std::map<std::string, bool> taken_;

@@ -48,31 +48,29 @@ std::vector<std::string> groupPlaces(const ControllerDescription& controller,
                                      const PoolDescription& pool) {
     if (!pool.members.empty()) return pool.members;
     std::vector<std::string> places;
+    std::vector<std::size_t> lost;
     for (const DriveDescription& drive : controller.drives) {
-        if (holds(drive.pools, pool.id) && conditionOf(drive) != Filling) {
-            places.push_back(drive.id);
-        }
+        if (!holds(drive.pools, pool.id) || conditionOf(drive) == Filling) continue;
+        if (conditionOf(drive) == Lost) lost.push_back(places.size());
+        places.push_back(drive.id);
     }
+    auto free = lost.begin();
     for (const DriveDescription& drive : controller.drives) {
         if (!holds(drive.pools, pool.id) || conditionOf(drive) != Filling) continue;
-        const auto lost = std::find_if(places.begin(), places.end(), [&](const std::string& id) {
-            return conditionOf(*findById(controller.drives, id)) == Lost;
-        });
-        if (lost == places.end()) {
-            places.push_back(drive.id);
+        if (free != lost.end()) {
+            places[*free++] = drive.id;
         } else {
-            *lost = drive.id;
+            places.push_back(drive.id);
         }
     }
     return places;
 }
 
-std::vector<DriveCondition> placeConditions(const ControllerDescription& controller,
-                                            const std::string& pool,
+std::vector<DriveCondition> placeConditions(const DriveIndex& drives, const std::string& pool,
                                             const std::vector<std::string>& places) {
     std::vector<DriveCondition> conditions;
     for (const std::string& id : places) {
-        const DriveDescription* drive = findById(controller.drives, id);
+        const DriveDescription* drive = drives.find(id);
         const DriveCondition condition =
             drive && holds(drive->pools, pool) ? conditionOf(*drive) : Lost;
         conditions.push_back(condition == Sound || condition == Filling ? condition : Lost);

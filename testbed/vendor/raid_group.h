@@ -4,6 +4,7 @@
 #include <string>
 #include <vector>
 
+#include "id_index.h"
 #include "scenario.h"
 
 namespace testbed {
@@ -23,9 +24,10 @@ DriveCondition conditionOf(const DriveDescription& drive);
 std::vector<std::string> groupPlaces(const ControllerDescription& controller,
                                      const PoolDescription& pool);
 
+using DriveIndex = IdIndex<DriveDescription>;
+
 /// What each place holds: Sound, Filling or Lost.
-std::vector<DriveCondition> placeConditions(const ControllerDescription& controller,
-                                            const std::string& pool,
+std::vector<DriveCondition> placeConditions(const DriveIndex& drives, const std::string& pool,
                                             const std::vector<std::string>& places);
 
 /// The state word of a volume over these places: optimal, rebuilding, degraded or offline. RAID10

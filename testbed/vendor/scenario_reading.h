@@ -3,6 +3,7 @@
 
 #include <initializer_list>
 #include <string>
+#include <unordered_set>
 
 #include "json_reader.h"
 #include "scenario.h"
@@ -29,10 +30,11 @@ std::vector<Description> readList(JsonReader& reader, const std::string& name,
                                                       const ControllerDescription&),
                                   const ControllerDescription& controller) {
     std::vector<Description> list;
+    std::unordered_set<std::string> ids;
     for (const JsonPlace& place : reader.list(name)) {
         list.push_back(read(place, controller));
-        const Description& latest = list.back();
-        if (findById(list, latest.id) != &latest) place.fail("second \"" + latest.id + "\"");
+        const std::string& id = list.back().id;
+        if (!ids.insert(id).second) place.fail("second \"" + id + "\"");
     }
     return list;
 }

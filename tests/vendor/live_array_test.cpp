@@ -134,6 +134,20 @@ TEST_F(LiveArrayTest, RepeatedDrivesThatACommandAddsFillTheLostOnesPlace) {
               "needed here");
 }
 
+TEST_F(LiveArrayTest, ThousandsOfDrivesByOneCommandJoinTheirGroupSoon) {
+    // As many looks as there are pairs of them would be too many, and triples no end.
+    constexpr std::size_t kDrives = 4000;
+    for (const char* spare : {"small", "large", "fit"}) {
+        array_->apply(std::string("remove drive C0 ") + spare);
+    }
+    array_->apply("fail drive C0 d1");
+    array_->apply("add drive C0 id=x{n} count=4000 pool=G");
+    const std::vector<std::string>& places = controller().pools.at(1).members;
+    ASSERT_EQ(places.size(), 4 + kDrives - 1) << "the first one is in the lost one's place";
+    EXPECT_EQ(places.at(1), "x0");
+    EXPECT_EQ(places.back(), "x3999");
+}
+
 TEST_F(LiveArrayTest, ANewStateIsNotOverruledByOldNumbers) {
     array_->apply("set drive C0 d0 operationalStatus=99");
     EXPECT_EQ(drive("d0"), "99/2 G");
