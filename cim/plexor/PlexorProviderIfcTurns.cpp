@@ -126,8 +126,6 @@ void FactoryCall::EndTurn() {
     if (turn_ == 0) return;
     MutexGuard lock(__TurnMutex);
     if (turn_ == __InitTurns) __Initialising = false;
-    turn_ = 0;
-    member_.reset();
     Announce();
 }
 
@@ -183,8 +181,8 @@ bool CleanupTurn::AwaitFactoryCalls() {
     const bool ended = !CalledFromTheSearch() && Await(__LeaveBy, [] {
         return !__Initialising && __FactoryCalls.ClosedAreGone();
     });
-    if (ended || !__Initialising) return ended;
-    __InitTurns++;
+    if (ended) return true;
+    __InitTurns++;  // the call that has the turn no longer gives it back
     __Initialising = false;
     return false;
 }
