@@ -112,6 +112,8 @@ class Run(unittest.TestCase):
                   for each in json.loads(report.read_text())["mutants"]]
         self.assertIn((7, "killed", ["test Thing.Coded"]), states)
         self.assertEqual({name: (self.root / name).read_text() for name in TREE}, TREE)
+        left = self.run_mutants("--list", "--again", str(report)).stdout.splitlines()
+        self.assertEqual(left, [lines[start].removeprefix("survived: "), *lines[start + 1 : start + 3], "1 mutants"])
         copy = self.root / "build" / "mutants" / "tree" / "cim" / "plexor"
         self.assertEqual((copy / "PlexorProviderThing.cpp").read_text(), THING)
 
