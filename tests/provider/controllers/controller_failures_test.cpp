@@ -195,6 +195,16 @@ TEST_F(ControllerFailures, ShortageDuringAStopLeavesTheListToTheCleanup) {
     EXPECT_EQ(CapturedSyslog::countContaining("deleted"), 0u);
 }
 
+TEST_F(ControllerFailures, AControllerThatIsReadyAfterTheStopIsTurnedAwayInSilence) {
+    addTwo();
+    {
+        const StopAtLine stop("\nPortControllerOp: ", 2);
+        build();
+    }
+    EXPECT_THAT(cached(), ElementsAre("C0"));
+    EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
+}
+
 TEST_F(ControllerFailures, EveryAllocationInTurn) {
     addTwo();
     const std::size_t allocations = forEachFailingAllocation([this](std::size_t) {

@@ -230,6 +230,14 @@ TEST_P(DiskBuildWrongElement, GivesWayToTheNext) {
 
 INSTANTIATE_TEST_SUITE_P(Disk, DiskBuildWrongElement, testing::Range(0, 6));
 
+TEST_F(DiskBuildFailures, MediaThatAreNoInstanceTurnTheDriveAwayAtOnce) {
+    faults().add(wrongElement(0));
+    EXPECT_EQ(buildDisk(), -1);
+    EXPECT_EQ(books().queries().size(), 1u);
+    EXPECT_THAT(CapturedSyslog::linesAt(LOG_ERR), IsEmpty());
+    expectNothingCached();
+}
+
 TEST_F(DiskBuildFailures, ChassisPathsWithoutATextAsTagGiveNoChassis) {
     const CimValue tags[] = {CimValue::null(CMPI_string), CimValue::uint32(7),
                              CimValue::boolean(true)};

@@ -1,4 +1,5 @@
 // The work function of a device's item: builder, mutex, and what becomes of the item.
+#include "PlexorProviderCfgItems.h"
 #include "devices_fixture.h"
 
 namespace plexortest {
@@ -77,6 +78,20 @@ protected:
         EXPECT_TRUE(isFree(ctrl->CtrlMutex));
     }
 };
+
+TEST_F(DevicesProcess, AnItemCarriesAllThatTheWalkHasPutIn) {
+    Thread_Args_t* const item = itemFor(2, vendor.port(card, "P0"));
+    const auto op = reinterpret_cast<CMPIObjectPath*>(item->Arg3);
+    const auto inst = reinterpret_cast<CMPIInstance*>(item->Arg4);
+    const auto work = TakeWork<DeviceWork>(item);
+    EXPECT_EQ(work.ctrl, ctrl);
+    EXPECT_EQ(work.mi, &mi);
+    EXPECT_EQ(work.op, op);
+    EXPECT_EQ(work.inst, inst);
+    EXPECT_EQ(work.deviceCode, 2);
+    op->ft->release(op);
+    inst->ft->release(inst);
+}
 
 class DevicesProcessKind : public DevicesProcess,
                            public testing::WithParamInterface<ProcessedKind> {};

@@ -1,24 +1,8 @@
 // Calls that come back, or come in, when a cleanup no longer waits for them.
-#include <dlfcn.h>
-
-#include <atomic>
 #include <thread>
 
+#include "library_pins.h"
 #include "meeting_fixture.h"
-
-namespace {
-
-std::atomic<int> pins = 0;  // calls that keep the library mapped
-
-}  // namespace
-
-extern "C" {
-void* __real_dlopen(const char* file, int flags);
-void* __wrap_dlopen(const char* file, int flags) {
-    if ((flags & RTLD_NODELETE) != 0) ++pins;
-    return __real_dlopen(file, flags);
-}
-}
 
 namespace {
 
@@ -27,6 +11,7 @@ using plexortest::Gate;
 using plexortest::GateOpener;
 using plexortest::GivenUpInventory;
 using plexortest::HurriedWaits;
+using plexortest::libraryPins;
 using plexortest::VirtualClock;
 using testbed::Entry;
 
@@ -118,10 +103,10 @@ TEST_F(LateCallsTest, AHangingRequestCostsItsOwnLifeOnly) {
     Gate gate;
     auto request = requestHeldAt(Entry::NewInstance, gate);
     const GivenUpInventory givenUp;
-    const int pinsBefore = pins;
+    const int pins = libraryPins();
     cleanUpSoon();
     ASSERT_EQ(givenUpLines(), 1u);
-    EXPECT_GT(pins, pinsBefore) << "it is inside the library";
+    EXPECT_GT(libraryPins(), pins) << "it is inside the library";
     const std::size_t clones = books().liveClones();
 
     {
@@ -162,21 +147,21 @@ TEST_F(LateCallsTest, ACleanupDoesNotWaitForRequestsThatComeAfterIt) {
     auto cleanup = cleanupThatWaits(true);
     const GateOpener opener(after);
     auto second = requestHeldAt(Entry::ResultReturnDone, after);
-    const int pinsBefore = pins;
+    const int pins = libraryPins();
     before.open();
     EXPECT_EQ(first.get(), 1u);
     EXPECT_EQ(cleanup.get(), CMPI_RC_OK);
     EXPECT_EQ(givenUpLines(), 0u);
-    EXPECT_GT(pins, pinsBefore) << "the second is still inside the library";
+    EXPECT_GT(libraryPins(), pins) << "the second is still inside the library";
     after.open();
     EXPECT_EQ(second.get(), 0u);
 }
 
 TEST_F(LateCallsTest, AQuietCleanupLetsTheLibraryGo) {
     load();
-    const int pinsBefore = pins;
+    const int pins = libraryPins();
     EXPECT_EQ(testbed::InstanceClient(broker, &mi).cleanup(true), CMPI_RC_OK);
-    EXPECT_EQ(pins, pinsBefore);
+    EXPECT_EQ(libraryPins(), pins);
 }
 
 TEST_F(LateCallsTest, ATerminatingCleanupHurriesTheOneThatIsUnderWay) {

@@ -7,6 +7,7 @@
 #include <thread>
 
 #include "PlexorProviderCfgClassLock.h"
+#include "real_waits.h"
 #include "reconcile_fixture.h"
 #include "worker_harness.h"
 
@@ -138,6 +139,52 @@ TEST_F(ClassLockTest, ABuildThatHungIsToldOfWhenItEnds) {
     EXPECT_TRUE(lines[1].ends_with(" secs, served again\n")) << lines[1];
 }
 
+TEST_F(ClassLockTest, APoolWalkThatHungIsToldOfWhenItEnds) {
+    addPool("pool0");
+    FaultRule rule;
+    rule.entry = testbed::Entry::InstanceGetProperty;
+    rule.times = 1;
+    rule.keepResult = true;
+    rule.hook = [this] { gate_.pass(); };
+    faults().add(rule);
+    auto hanging = std::async(std::launch::async, [this] {
+        const testbed::Broker::CallScope scope(broker);
+        BuildPoolInfo(&mi, scope.context(), ctrl);
+    });
+    const GateOpener opener(gate_);
+    ASSERT_TRUE(gate_.awaitArrivals(1));
+    ahead = 30;
+    process(104);
+    gate_.open();
+    hanging.get();
+    const auto lines = CapturedSyslog::linesAt(LOG_ERR);
+    ASSERT_EQ(lines.size(), 2u);
+    EXPECT_EQ(lines[0],
+              "ClassLock: controller C0, CIM_StoragePool: a refresh has been under way for 30 "
+              "secs, passed over until it ends\n");
+    EXPECT_TRUE(lines[1].ends_with(" secs, served again\n")) << lines[1];
+}
+
+TEST_F(ClassLockTest, NobodyWaitsForALogThatHangs) {
+    const auto hanging = hangingRefresh();
+    const GateOpener opener(gate_);
+    ahead = 30;
+    std::future<void> ports;
+    std::atomic<bool> served = false;
+    CapturedSyslog::onLine([&](const LogLine& line) {
+        if (line.text != kPassedOver) return;
+        ports = std::async(std::launch::async, [&] {
+            const testbed::Broker::CallScope scope(broker);
+            ProcessDeviceConfigChange(&mi, scope.context(), ctrl, 102);
+            served = true;
+        });
+        EXPECT_TRUE(eventually([&] { return served.load(); }));
+    });
+    process(103);
+    CapturedSyslog::onLine(nullptr);
+    EXPECT_TRUE(served);
+}
+
 TEST_F(ClassLockTest, UntilThenTheSecondWaits) {
     auto hanging = hangingRefresh();
     const GateOpener opener(gate_);
@@ -155,6 +202,20 @@ TEST_F(ClassLockTest, UntilThenTheSecondWaits) {
     EXPECT_EQ(linesWith("Action 103"), 2u);
     EXPECT_EQ(linesWith(", skip"), 1u) << "the second finds it not due";
     EXPECT_EQ(linesWith("ClassLock"), 0u);
+}
+
+TEST_F(ClassLockTest, AWaiterLooksForAStopEverySecond) {
+    const auto hanging = hangingRefresh();
+    const GateOpener opener(gate_);
+    const HurriedWaits hurry(HurriedWaits::Conditions);
+    auto waiting = std::async(std::launch::async, [this] {
+        const testbed::Broker::CallScope scope(broker);
+        ProcessDeviceConfigChange(&mi, scope.context(), ctrl, 103);
+    });
+    EXPECT_TRUE(eventually([] { return HurriedWaits::otherWaits().size() > 10; }));
+    RequestStop();
+    waiting.get();
+    for (const auto wait : HurriedWaits::otherWaits()) EXPECT_LE(wait, std::chrono::seconds(1));
 }
 
 TEST_F(ClassLockTest, AWaitEndsAtAStop) {

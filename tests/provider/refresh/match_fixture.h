@@ -69,10 +69,10 @@ protected:
                                          &deviceCount_, &opCount_);
     }
 
-    /// The flags of all cached entries, like "101".
+    /// The flags of all cached entries, like "101"; nothing but 0 and 1 is known to others.
     std::string flags() const {
         std::string text;
-        for (int i = 0; i < deviceCount_; i++) text += devices_[i].Flag ? '1' : '0';
+        for (int i = 0; i < deviceCount_; i++) text += std::to_string(devices_[i].Flag);
         return text;
     }
     /// The DeviceIDs of the fresh entries that are left, "-" for a matched one.

@@ -5,6 +5,7 @@ namespace plexortest {
 namespace {
 
 using testbed::CimValue;
+using testbed::Entry;
 using testbed::FaultRule;
 using testbed::Instance;
 using testbed::ObjectPath;
@@ -48,6 +49,15 @@ TEST_F(MatchPairs, ResultsInAnotherOrderFindTheirRecords) {
     EXPECT_EQ(keyOf(devices_[0].Instance), "P0");
     EXPECT_EQ(keyOf(devices_[1].Instance), "P1");
     EXPECT_EQ(keyOf(devices_[2].Instance), "P2");
+}
+
+TEST_F(MatchPairs, WithoutRecordsNoIdentityIsRead) {
+    CMPIEnumeration* const fresh = resultsOf({"P0", "P1"});
+    books().recordObjectCalls(true);
+    ASSERT_EQ(match(fresh), 0);
+    EXPECT_EQ(books().count(Entry::PathGetKey), 0u);
+    EXPECT_EQ(books().count(Entry::PathGetClassName), 0u);
+    EXPECT_EQ(left(), "P0 P1 ");
 }
 
 TEST_F(MatchPairs, WhenEveryResultIsMatchedTheNewArrayIsGone) {

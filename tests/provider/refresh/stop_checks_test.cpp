@@ -106,6 +106,8 @@ TEST_F(StopChecks, TheWalkOverTheResultsEndsAtTheRunningOne) {
     }
     EXPECT_EQ(linesWith("added to opArr["), 3u);
     EXPECT_EQ(ports(), Ids{});
+    EXPECT_TRUE(
+        loggedOnce(LOG_DEBUG, "CrossoutDuplicatedEntries EXITED, rc -100, remove 0, add 0\n"));
 }
 
 TEST_F(StopChecks, ThePoolWalkEndsAtTheRunningPool) {

@@ -269,6 +269,17 @@ TEST_P(ListIndexMaking, IsGoneWhenTheListIsFreed) {
     EXPECT_EQ(Items{}, found("id0"));
 }
 
+TEST_P(ListIndexMaking, IsGoneWhenAListThatSomebodyHasEmptiedByHandIsFreed) {
+    addOthers(GetParam());
+    found("id0");
+    const List_t filled = list;
+    list = {};
+    EXPECT_EQ(GetParam() > kMostWithoutIndex, KeptIndex(&list) != nullptr);
+    FreeList(&list, nullptr);
+    EXPECT_EQ(nullptr, KeptIndex(&list));
+    list = filled;
+}
+
 TEST_P(ListIndexMaking, IsGoneWhenTheLastEntryIs) {
     for (const bool byKey : {true, false}) {
         addOthers(GetParam());

@@ -197,6 +197,28 @@ private:
     bool waited_ = false;
 };
 
+TEST_F(LifeStopTest, EndsItsMembersAndNobodyElse) {
+    EXPECT_FALSE(LifeGuard().MemberOfEnded());
+    {
+        const LifeMember always;
+        const LifeMember unlessEnded(LifeMember::When::kUnlessEnded);
+        EXPECT_FALSE(LifeGuard().MemberOfEnded()) << "it stands";
+        RequestStop();
+        EXPECT_TRUE(LifeGuard().MemberOfEnded());
+    }
+    EXPECT_FALSE(LifeGuard().MemberOfEnded());
+    {
+        const LifeMember unlessEnded(LifeMember::When::kUnlessEnded);
+        EXPECT_FALSE(LifeGuard().MemberOfEnded()) << "it has ended";
+        const LifeMember always;
+        EXPECT_TRUE(LifeGuard().MemberOfEnded());
+    }
+    BeginWork();
+    const LifeMember unlessEnded(LifeMember::When::kUnlessEnded);
+    RequestStop();
+    EXPECT_TRUE(LifeGuard().MemberOfEnded());
+}
+
 TEST_F(LifeStopTest, WaitsUntilAControllerIsInTheList) {
     const testbed::ObjectPath profile = vendor.profile();
     vendor.controller("C0", profile);

@@ -84,6 +84,38 @@ TEST_F(LargeManagerTest, ARefusedStringIsSetAsAnObject) {
     EXPECT_EQ(textOf(controller, "IdentifyingDescriptions"), "[Serial Number]");
 }
 
+TEST_F(LargeManagerTest, ARefusedStringIsSetAsAnObjectWhateverTheReason) {
+    const CMPIrc reasons[] = {CMPI_RC_ERR_FAILED, CMPI_RC_ERR_TYPE_MISMATCH,
+                              CMPI_RC_ERR_NOT_SUPPORTED};
+    for (const CMPIrc reason : reasons) {
+        FaultRule refused = refusal(Entry::ArraySetElementAt, reason);
+        refused.times = 1;
+        faults().add(refused);
+        EXPECT_EQ(textOf(first("Tovexa_PlexorController"), "OtherIdentifyingInfo"), "[C0]")
+            << reason;
+    }
+}
+
+/// As large ones are, but for the strings.
+class CharsTakingTest : public ManagersTest {
+protected:
+    CharsTakingTest() : ManagersTest(withoutKeys()) {}
+
+private:
+    static BrokerOptions withoutKeys() {
+        BrokerOptions options = withoutKeysAndChars();
+        options.refusesCharsInArrays = false;
+        return options;
+    }
+};
+
+TEST_F(CharsTakingTest, AStringThatWasTakenIsNotSetTwice) {
+    books().recordObjectCalls(true);
+    books().clearCalls();
+    EXPECT_EQ(textOf(first("Tovexa_PlexorController"), "OtherIdentifyingInfo"), "[C0]");
+    EXPECT_EQ(books().count(Entry::NewString), 0u);
+}
+
 /// Its calls write a status only when they fail.
 class SilentSuccessTest : public ManagersTest {
 protected:

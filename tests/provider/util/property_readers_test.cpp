@@ -2,6 +2,7 @@
 #include "PlexorProviderUtil.h"
 #include "PlexorProviderUtilManager.h"
 #include "fake_instance.h"
+#include "keys_fake_path.h"
 #include "provider_fixture.h"
 
 namespace plexortest {

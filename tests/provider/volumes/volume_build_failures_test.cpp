@@ -1,6 +1,7 @@
 // Volumes that are turned away, and what a failed query or allocation of a build leaves behind.
 #include "odd_values.h"
 #include "volume_fixture.h"
+#include "watched_calls.h"
 #include "worker_harness.h"
 
 namespace plexortest {
@@ -97,7 +98,12 @@ TEST_F(VolumeBuildFailures, NoPoolTurnsTheVolumeAway) {
 TEST_F(VolumeBuildFailures, TurnedAwayLeavesCopiesAndCloneBehind) {
     repository.remove(poolPath_);
     books().recordObjectCalls(true);
-    expectTurnedAway();
+    int freed = 0;
+    {
+        const FreeWatch watch([&freed](const void*) { freed++; });
+        expectTurnedAway();
+    }
+    EXPECT_EQ(freed, 1) << "the record";
     EXPECT_EQ(books().liveClones(), 1u);
     EXPECT_EQ(books().count(Entry::Release), 0u);
     EXPECT_EQ(CapturedSyslog::countContaining("deleted\n"), 0u);

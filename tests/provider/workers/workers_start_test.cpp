@@ -44,6 +44,8 @@ protected:
 const unsigned int terminateThreadAtFirst = TerminateThread;
 
 TEST_F(WorkersStart, AWorkersStackHasAGuard) {
+    // As it is when the library is loaded, whatever earlier tests have left.
+    PlexorThreadAttr = {};
     InitPlexorThreads(ctx());
     std::size_t guard = 0;
     EXPECT_EQ(pthread_attr_getguardsize(&PlexorThreadAttr, &guard), 0);
@@ -191,7 +193,10 @@ TEST_F(WorkersStart, ItsOnlyWorkersQueueIsEmptiedByWhoeverWaits) {
     EXPECT_TRUE(RunQueuedItemAlone(ctx())) << "one without a function is done at once";
     EXPECT_EQ(idle->Arg5, 4711u) << "and not freed";
     free(idle);
-    tasks_.put([](CMPIContext*, void*) {});
+    tasks_.put([](CMPIContext*, void*) {
+        EXPECT_EQ(pthread_mutex_trylock(&PlexorThreadMutex), 0) << "it may queue, and wait";
+        pthread_mutex_unlock(&PlexorThreadMutex);
+    });
     EXPECT_TRUE(RunQueuedItemAlone(ctx()));
     EXPECT_EQ(tasks_.ended(), 1);
     gate.open();

@@ -1,4 +1,5 @@
 // Stopping the workers: who leaves, who stays, and what becomes of the queue.
+#include "library_pins.h"
 #include "real_waits.h"
 #include "watched_calls.h"
 #include "workers_fixture.h"
@@ -39,7 +40,9 @@ TEST_F(WorkersStop, IdleWorkersLeave) {
     startWorkers();
     VirtualClock::reset(kStart);
     const time_t before = VirtualClock::now();
+    const int pins = libraryPins();
     stopWorkers();
+    EXPECT_EQ(libraryPins(), pins);
 
     EXPECT_EQ(TerminateThread, 1u);
     EXPECT_TRUE(loggedOnce(LOG_DEBUG, "Thread 0 exiting...\n"));
@@ -100,12 +103,14 @@ TEST_F(WorkersStop, WaitingForAStuckWorkerIsBounded) {
     Gate gate;
     const GateOpener opener(gate);
     occupyWorkers(2, gate);
+    const int pins = libraryPins();
     {
         const HurriedWaits hurry(HurriedWaits::Joins);
         CleanupPlexorThreads();
         ASSERT_EQ(HurriedWaits::joins().size(), 2u);
         for (const auto join : HurriedWaits::joins()) EXPECT_LE(join, std::chrono::seconds(1));
     }
+    EXPECT_GT(libraryPins(), pins) << "it will come back into the library's code";
     gate.open();
     stopTheRest();
 }
