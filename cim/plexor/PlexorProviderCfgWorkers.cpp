@@ -48,13 +48,9 @@ public:
     ActiveWorker(const ActiveWorker&) = delete;
     ActiveWorker& operator=(const ActiveWorker&) = delete;
 
-    void SetRunning(bool running) { running_ = running; }
-
     /// How many of the present life run an item.
     static unsigned int CountRunning() PLEXOR_HOLDS(PlexorThreadMutex) {
-        return Count([](const ActiveWorker& worker) {
-            return worker.running_ && worker.life_ == PresentLife();
-        });
+        return Count([](const ActiveWorker& worker) { return worker.life_ == PresentLife(); });
     }
     /// How many belong to earlier lives.
     static unsigned int CountOld() PLEXOR_HOLDS(PlexorThreadMutex) {
@@ -73,7 +69,6 @@ private:
 
     static ActiveWorker* first_ PLEXOR_GUARDED_BY(PlexorThreadMutex);
     const unsigned int life_ = OwnLife();
-    bool running_ = false;
     ActiveWorker* next_;
 };
 
@@ -91,21 +86,15 @@ bool ToldToLeave() PLEXOR_HOLDS(PlexorThreadMutex) {
 /// A work function's run, with PlexorThreadMutex released.
 class RunningItem {
 public:
-    RunningItem(ActiveWorker& worker, MutexGuard& lock) PLEXOR_LOCKS_UNCHECKED : worker_(worker),
-                                                                                 lock_(lock) {
-        worker_.SetRunning(true);
-        lock_.Unlock();
-    }
+    explicit RunningItem(MutexGuard& lock) PLEXOR_LOCKS_UNCHECKED : lock_(lock) { lock_.Unlock(); }
     ~RunningItem() PLEXOR_LOCKS_UNCHECKED {
         lock_.Lock();
-        worker_.SetRunning(false);
         pthread_cond_broadcast(&__ItemEnded);
     }
     RunningItem(const RunningItem&) = delete;
     RunningItem& operator=(const RunningItem&) = delete;
 
 private:
-    ActiveWorker& worker_;
     MutexGuard& lock_;
 };
 
@@ -130,10 +119,10 @@ Thread_Args_t* TakeItem() {
 
 /// Runs the next item. False when there is none, or none may begin.
 bool RunNextItem(CMPIContext* ctx, long index, MutexGuard& lock) PLEXOR_HOLDS(PlexorThreadMutex) {
-    ActiveWorker worker;
+    const ActiveWorker worker;
     Thread_Args_t* item = TakeItem();
     if (item == nullptr) return false;
-    const RunningItem running(worker, lock);
+    const RunningItem running(lock);
     syslog(LOG_DEBUG, "%s(%ld): running...\n", "PlexorThread", index);
     ItemSpan span(ctx);
     if (item->Func != nullptr) item->Func(span.Context(), item);

@@ -95,6 +95,7 @@ INSTANTIATE_TEST_SUITE_P(
                  {"DriveA", "VolumeA", "DriveA", "VolumeA", "DriveA"},
                  {3, 1, 3, 1, 3},
                  3 + 1},
+        Sequence{"BatteriesComeBack", {"BatteryA", "PortA", "BatteryA"}, {4, 2, 4}, 4 + 2 + 0},
         Sequence{"AllKindsThereAndBack",
                  {"VolumeA", "PortA", "DriveA", "BatteryA", "DriveA", "PortA", "VolumeA"},
                  {1, 2, 3, 4, 3, 2, 1},

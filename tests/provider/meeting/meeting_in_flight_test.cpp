@@ -1,6 +1,8 @@
 // Who is waited for: the calls of what was closed last, not later ones, not those given up.
 #include <gtest/gtest.h>
 
+#include <thread>
+
 #include "PlexorProviderIfcInFlight.h"
 
 namespace {
@@ -20,6 +22,21 @@ TEST(CallsInFlightTest, OnlyWhatWasThereIsWaitedFor) {
     calls.LeaveClosed(before);
     EXPECT_TRUE(calls.ClosedAreGone());
     EXPECT_TRUE(calls.LeaveOpen(after));
+    EXPECT_FALSE(calls.HasOpen());
+}
+
+TEST(CallsInFlightTest, EveryoneWhoLeavesIsCountedOff) {
+    CallsInFlight calls;
+    const auto comeAndGo = [&calls] {
+        for (int i = 0; i < 200000; i++) EXPECT_TRUE(calls.LeaveOpen(calls.Enter()));
+    };
+    std::thread other(comeAndGo);
+    comeAndGo();
+    other.join();
+    EXPECT_FALSE(calls.HasOpen());
+    const unsigned int next = calls.Enter();
+    EXPECT_TRUE(calls.HasOpen());
+    EXPECT_TRUE(calls.LeaveOpen(next));
     EXPECT_FALSE(calls.HasOpen());
 }
 

@@ -1,4 +1,7 @@
-// Factory calls that get no turn to initialise.
+// Who gets a turn to initialise, or to clean up, and for whom it waits.
+#include <dlfcn.h>
+#include <pthread.h>
+
 #include <thread>
 
 #include "PlexorProviderIfcTurns.h"
@@ -7,9 +10,61 @@
 
 namespace {
 
+std::atomic<int> waits = 0;  // without a limit, on whatever condition
+thread_local int waitsHere = 0;
+
+}  // namespace
+
+// In front of the C library's.
+extern "C" int pthread_cond_wait(pthread_cond_t* cond, pthread_mutex_t* mutex) {
+    static const auto real = reinterpret_cast<int (*)(pthread_cond_t*, pthread_mutex_t*)>(
+        dlsym(RTLD_NEXT, "pthread_cond_wait"));
+    ++waits;
+    ++waitsHere;
+    return real(cond, mutex);
+}
+
+namespace {
+
 using plexortest::HurriedWaits;
 
 using FactoryTurnsTest = plexortest::EntryTest;
+
+using CleanupTurnsTest = plexortest::EntryTest;
+
+TEST_F(CleanupTurnsTest, ACleanupLeavesAfterThoseThatWaitForIt) {
+    std::optional<CleanupTurn> turn(std::in_place, 60, nullptr);
+    ASSERT_TRUE(turn->Taken());
+    const int before = waits;
+    std::thread second([] {
+        const CleanupTurn joined(60, nullptr);
+        EXPECT_FALSE(joined.Taken());
+        EXPECT_FALSE(joined.Refused());
+    });
+    EXPECT_TRUE(plexortest::eventually([before] { return waits > before; }));
+    waitsHere = 0;
+    turn.reset();
+    EXPECT_GT(waitsHere, 0) << "the manager may unmap the library as soon as this one returns";
+    second.join();
+}
+
+TEST_F(CleanupTurnsTest, NewcomersGetASecondToLeave) {
+    CleanupTurn turn(60, nullptr);
+    const RequestInFlight newcomer;
+    const HurriedWaits hurry(HurriedWaits::Conditions);
+    EXPECT_FALSE(turn.AwaitNewcomers());
+    EXPECT_EQ(HurriedWaits::otherWaits(),
+              std::vector<HurriedWaits::Duration>{std::chrono::seconds(1)});
+}
+
+TEST_F(CleanupTurnsTest, ARequestThatWasGivenUpIsNoNewcomer) {
+    const RequestInFlight hanging;
+    CleanupTurn turn(0, nullptr);
+    EXPECT_FALSE(turn.AwaitRequests());
+    const HurriedWaits watched(HurriedWaits::Conditions);
+    EXPECT_TRUE(turn.AwaitNewcomers());
+    EXPECT_TRUE(HurriedWaits::otherWaits().empty());
+}
 
 void cleanUp() {
     const CleanupTurn turn(1, nullptr);

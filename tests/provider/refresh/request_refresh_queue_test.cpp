@@ -1,4 +1,5 @@
 // What a request for a refresh puts into the queue, how it wakes a worker, and the work function.
+#include "PlexorProviderCfgItems.h"
 #include "real_waits.h"
 #include "refresh_fixture.h"
 #include "worker_harness.h"
@@ -40,7 +41,10 @@ TEST_F(RequestRefreshQueue, ItemCarriesWhatTheWorkerNeeds) {
     EXPECT_EQ(item->Arg3, 101u);
     EXPECT_EQ(item->Arg4, 0u);
     EXPECT_EQ(item->Arg5, 0u);
-    free(item);
+    const auto work = TakeWork<RefreshWork>(item);
+    EXPECT_EQ(work.mi, &mi);
+    EXPECT_EQ(work.ctrl, ctrl);
+    EXPECT_EQ(work.action, 101);
 }
 
 TEST_F(RequestRefreshQueue, ExitIsTracedLast) {

@@ -168,6 +168,7 @@ TEST_F(StopChecks, TheWaitForRoomInTheQueueEndsAndTheDeviceIsDropped) {
     EXPECT_EQ(BuildLogicalDeviceInfo(&mi, ctx(), ctrl), 0);
     EXPECT_EQ(sleeps, 3);
     EXPECT_EQ(linesWith("FIFO full, waiting..."), 3u);
+    EXPECT_EQ(linesWith("Added to FIFO: "), 20u) << "nothing is said of the dropped one";
     EXPECT_EQ(queuedItems(), 20u);
     EXPECT_EQ(books().liveClones(), 1u + 2 * 20) << "the controller's path and the queue's";
 }

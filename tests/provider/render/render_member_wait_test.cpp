@@ -4,6 +4,7 @@
 #include <thread>
 
 #include "PlexorProviderIfc.h"
+#include "PlexorProviderUtilLife.h"
 #include "owned_text.h"
 #include "render_recorder.h"
 #include "serve_fixture.h"

@@ -39,11 +39,15 @@ using testbed::Entry;
 const unsigned int lifeAtFirst = PresentLife();
 const bool stoppedAtFirst = StopRequested();
 const time_t completeAtFirst = InitCompleteTime;
+const int initializedAtFirst = _ProviderInitialized;
+const unsigned int inventoryAtFirst = ThreadActivityDone;
 
 TEST(LifeAtFirst, HasNotEnded) {
     EXPECT_EQ(lifeAtFirst, 1u);
     EXPECT_FALSE(stoppedAtFirst);
     EXPECT_EQ(completeAtFirst, 0) << "nothing has been initialised";
+    EXPECT_EQ(initializedAtFirst, 0);
+    EXPECT_EQ(inventoryAtFirst, 0u);
 }
 
 class LivesTest : public plexortest::EntryTest {

@@ -229,6 +229,15 @@ TEST_F(LargeManagerTest, AKeyThatHasNoTextInThePathEitherIsNotAskedForAgain) {
     EXPECT_EQ(text.asked, 3) << "this manager has left it out each time";
 }
 
+TEST_F(LargeManagerTest, AKeyThatWasCopiedIsNotAskedForAgain) {
+    const OneKey key;
+    KeyCopying copied;
+    for (int i = 0; i < 3; i++) {
+        EXPECT_EQ(key.setIn(plexortest::dataOf(CMPI_string, 1), copied), "nothing");
+    }
+    EXPECT_EQ(key.asked, 1);
+}
+
 TEST_F(LargeManagerTest, APropertyThatTheInstanceDoesNotHaveIsNotMissed) {
     const auto notThere = static_cast<CMPIValueState>(CMPI_nullValue | CMPI_notFound);
     EXPECT_EQ(OneKey().setIn(plexortest::dataOf(CMPI_string, 0, notThere)), "nothing");
@@ -297,6 +306,15 @@ TEST_F(LargeManagerTest, WhatARefreshObtainsGoesWithIt) {
     const std::size_t objects = kept();
     for (int i = 0; i < 5; i++) refresh();
     EXPECT_EQ(kept(), objects);
+}
+
+TEST_F(ManagersTest, TheHostsOwnIsAskedOnceForAString) {
+    if (!kContextHasFlush) GTEST_SKIP() << "this build takes every manager for a standard one";
+    faults().add(refusal(Entry::ArraySetElementAt));
+    books().recordObjectCalls(true);
+    books().clearCalls();
+    first("Tovexa_PlexorController");
+    EXPECT_EQ(books().count(Entry::NewString), 0u);
 }
 
 TEST_F(ManagersTest, OneThatCopiesKeysIsAskedNothingMore) {

@@ -28,6 +28,14 @@ protected:
         EXPECT_EQ(idleLines(), 0u);
         expectNobodyLeft();
     }
+    /// What is queued is for the next workers.
+    void expectNobodyWorks() {
+        auto* idle = zeroed<Thread_Args_t>();
+        ASSERT_EQ(PutItem(&__FIFO, idle), 0);
+        EXPECT_FALSE(RunQueuedItemAlone(ctx()));
+        EXPECT_EQ(GetItem(&__FIFO), idle);
+        free(idle);
+    }
     /// A stop at that line of the log is the end of the start.
     void expectTheEndAt(const char* line) {
         const LifeMember member;
@@ -203,15 +211,32 @@ TEST_F(WorkersStart, ItsOnlyWorkersQueueIsEmptiedByWhoeverWaits) {
     EXPECT_TRUE(eventually([this] { return tasks_.ended() == 2; }));
 }
 
+TEST_F(WorkersStart, TheOnlyWorkerThatIsCancelledIsNoneAnyMore) {
+    startTheOnlyWorker();
+    ASSERT_TRUE(workersComeToRest());
+    EXPECT_EQ(pthread_cancel(PlexorThreads[1]), 0);
+    Thread_Args_t idle = {};
+    EXPECT_TRUE(eventually([&] {
+        EXPECT_EQ(PutItem(&__FIFO, &idle), 0);
+        const bool isAlone = RunQueuedItemAlone(ctx());
+        if (!isAlone) GetItem(&__FIFO);
+        return !isAlone;
+    })) << "what is queued is for the next workers";
+}
+
+TEST_F(WorkersStart, WhereNoneCouldBeCreatedThereIsNoOnlyOne) {
+    {
+        const NoNewThreads none;
+        InitPlexorThreads(ctx());
+    }
+    expectNobodyWorks();
+}
+
 TEST_F(WorkersStart, AfterItsCleanupTheOnlyWorkerIsNoneAnyMore) {
     startTheOnlyWorker();
     stopWorkers();
     __atomic_store_n(&TerminateThread, 0, __ATOMIC_SEQ_CST);
-    auto* idle = zeroed<Thread_Args_t>();
-    ASSERT_EQ(PutItem(&__FIFO, idle), 0);
-    EXPECT_FALSE(RunQueuedItemAlone(ctx())) << "what is queued is for the next workers";
-    EXPECT_EQ(GetItem(&__FIFO), idle);
-    free(idle);
+    expectNobodyWorks();
 }
 
 TEST_F(WorkersStart, StoppingNoWorkerIsHarmless) {
