@@ -16,6 +16,7 @@
 namespace {
 
 std::atomic<int> nobodyDetached = 0;  // how often it was tried with a word that names no thread
+std::atomic<pthread_t> latestDetached = 0;
 
 }  // namespace
 
@@ -24,6 +25,7 @@ extern "C" int pthread_detach(pthread_t thread) noexcept {
     static const auto real =
         reinterpret_cast<int (*)(pthread_t)>(dlsym(RTLD_NEXT, "pthread_detach"));
     if (thread == 0) ++nobodyDetached;
+    latestDetached = thread;
     return real(thread);
 }
 
@@ -41,6 +43,7 @@ const bool stoppedAtFirst = StopRequested();
 const time_t completeAtFirst = InitCompleteTime;
 const int initializedAtFirst = _ProviderInitialized;
 const unsigned int inventoryAtFirst = ThreadActivityDone;
+const unsigned int activeAtFirst = ActiveThreads;
 
 TEST(LifeAtFirst, HasNotEnded) {
     EXPECT_EQ(lifeAtFirst, 1u);
@@ -48,6 +51,7 @@ TEST(LifeAtFirst, HasNotEnded) {
     EXPECT_EQ(completeAtFirst, 0) << "nothing has been initialised";
     EXPECT_EQ(initializedAtFirst, 0);
     EXPECT_EQ(inventoryAtFirst, 0u);
+    EXPECT_EQ(activeAtFirst, 0u);
 }
 
 class LivesTest : public plexortest::EntryTest {
@@ -147,9 +151,11 @@ TEST_F(LivesTest, TheSecondIsCompleteBesideAStuckWorkerOfTheFirst) {
     const std::size_t given = books().liveClones();
     EXPECT_GT(given, 0u);
 
+    latestDetached = 0;
     callFactory();
     ASSERT_TRUE(plexortest::eventually([] { return times("DoBuildDeviceInfoAsync done.") == 2; }))
         << "the stuck worker is not waited for";
+    EXPECT_EQ(latestDetached, stuck_) << "nobody will join it any more";
     EXPECT_EQ(drives().instances.size(), 1u);
     EXPECT_GT(books().liveClones(), given);
 

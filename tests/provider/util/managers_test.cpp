@@ -203,6 +203,18 @@ struct OneKey {
 
 const CMPIData kNullText = plexortest::dataOf(CMPI_string, 0, CMPI_nullValue);
 
+/// How often the first key of all is asked for, in the first life and before anybody has been seen
+/// to lack anything.
+const int askedAtFirst = [] {
+    const OneKey key;
+    key.setIn(kNullText);
+    return key.asked;
+}();
+
+TEST(ManagersAtFirst, AreTakenForWhatTheBuildIsFor) {
+    EXPECT_EQ(askedAtFirst, kContextHasFlush ? 0 : 1);
+}
+
 TEST_F(LargeManagerTest, AKeyIsSetOnlyWhereItsNameAndValueCanBeRead) {
     OneKey key;
     EXPECT_EQ(key.setIn(kNullText), "Name a value");
