@@ -100,7 +100,7 @@ TEST_F(RequestRefreshQueue, FullQueueDropsTheRequest) {
 
 TEST_F(RequestRefreshQueue, NoMemoryForTheItemQueuesNothing) {
     const auto fault = FailAllocation::nth(1);
-    request(102);
+    EXPECT_EQ(request(102), 0) << "the next request asks for it again";
     EXPECT_EQ(fault.failures(), 1u);
     EXPECT_EQ(queuedItems(), 0u);
 }
