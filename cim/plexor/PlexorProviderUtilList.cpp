@@ -50,7 +50,7 @@ int AddEntryAtListHead(List_t* list, void* data) {
     if (list->Head == nullptr || list->Tail == nullptr) list->Tail = entry;
     entry->Next = list->Head;
     list->Head = entry;
-    DropIndex(list);
+    // An index misses the entry, which the list's size tells: the next look makes it anew.
     return EntryAdded(list, data);
 }
 

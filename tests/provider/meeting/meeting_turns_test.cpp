@@ -2,6 +2,7 @@
 #include <dlfcn.h>
 #include <pthread.h>
 
+#include <future>
 #include <thread>
 
 #include "PlexorProviderIfcTurns.h"
@@ -46,6 +47,25 @@ TEST_F(CleanupTurnsTest, ACleanupLeavesAfterThoseThatWaitForIt) {
     turn.reset();
     EXPECT_GT(waitsHere, 0) << "the manager may unmap the library as soon as this one returns";
     second.join();
+}
+
+TEST_F(CleanupTurnsTest, ARequestThatLeavesIsNoticedAtOnce) {
+    std::optional<RequestInFlight> request(std::in_place);
+    CleanupTurn turn(3600, nullptr);
+    auto waiting = std::async(std::launch::async, [&turn] { return turn.AwaitRequests(); });
+    EXPECT_EQ(waiting.wait_for(std::chrono::milliseconds(30)), std::future_status::timeout);
+    request.reset();
+    EXPECT_TRUE(waiting.get());
+}
+
+TEST_F(CleanupTurnsTest, AFactoryCallThatWasGivenUpIsNotWaitedForAgain) {
+    const FactoryCall hanging;
+    {
+        CleanupTurn turn(0, nullptr);
+        EXPECT_FALSE(turn.AwaitFactoryCalls());
+    }
+    CleanupTurn turn(0, nullptr);
+    EXPECT_TRUE(turn.AwaitFactoryCalls());
 }
 
 TEST_F(CleanupTurnsTest, NewcomersGetASecondToLeave) {
