@@ -254,9 +254,7 @@ bool OneWorkerActiveAtMost() {
 
 bool RunQueuedItemAlone(const CMPIContext* ctx) {
     if (__LivingWorkers != 1) return false;
-    MutexGuard lock(PlexorThreadMutex);
     Thread_Args_t* item = TakeItem();
-    lock.Unlock();
     if (item == nullptr) return false;
     if (item->Func != nullptr) item->Func(const_cast<CMPIContext*>(ctx), item);
     return true;

@@ -4,7 +4,10 @@
 
 #include <sstream>
 
+#include "PlexorProviderIfcTurns.h"
 #include "PlexorProviderLock.h"
+#include "PlexorProviderUtilLife.h"
+#include "beside.h"
 #include "deliberate_leaks.h"
 #include "meeting_fixture.h"
 #include "sanitizers.h"
@@ -222,6 +225,42 @@ TEST_F(CancelledTest, AnInitialisationCanBeTriedAgain) {
     load();
     EXPECT_EQ(controllers(), 1u);
     EXPECT_EQ(requestDrives().get(), 1u);
+}
+
+TEST_F(CancelledTest, AnInitialisationIsTakenBackWhileItsLifeIsHeldStill) {
+    std::optional<plexortest::GivenUpInventory> givenUp;
+    {
+        const plexortest::Beside others([] {
+            const LifeGuard life;
+            // Read plainly, as nobody but who holds the life still may.
+            static_cast<void>(*static_cast<List_Entry_t* volatile*>(&RaidControllerList->Head));
+        });
+        cancelFactoryWithItsController([&givenUp] { givenUp.emplace(); });
+    }
+    EXPECT_EQ(controllers(), 0u);
+}
+
+TEST_F(CancelledTest, ACleanupWaitsToItsEndForThoseThatWaitForIt) {
+    Gate end;
+    bool ended = false;
+    auto cleanUp = [&] {
+        std::optional<CleanupTurn> turn(std::in_place, 60, nullptr);
+        end.pass();
+        pthread_cancel(pthread_self());
+        turn.reset();
+        ended = true;
+        pthread_testcancel();
+    };
+    const pthread_t first = start(cleanUp);
+    ASSERT_TRUE(end.awaitArrivals(1));
+    auto second = std::async(std::launch::async, [] { return CleanupTurn(60, nullptr).Taken(); });
+    EXPECT_TRUE(stillWaits(second));
+    end.open();
+    EXPECT_FALSE(second.get());
+    void* result = nullptr;
+    EXPECT_EQ(pthread_join(first, &result), 0);
+    EXPECT_EQ(result, PTHREAD_CANCELED) << "behind its end";
+    EXPECT_TRUE(ended);
 }
 
 TEST_F(CancelledTest, AnInitialisationOfAnEndedLifeLeavesTheInventoryToItsCleanup) {

@@ -4,6 +4,7 @@
 
 #include <atomic>
 #include <chrono>
+#include <functional>
 #include <future>
 #include <optional>
 #include <thread>
@@ -11,12 +12,14 @@
 #include "PlexorProviderCfg.h"
 #include "entry_fixture.h"
 #include "real_waits.h"
+#include "watched_calls.h"
 #include "worker_harness.h"
 
 namespace {
 
 std::atomic<int> nobodyDetached = 0;  // how often it was tried with a word that names no thread
 std::atomic<pthread_t> latestDetached = 0;
+std::function<void()> atDetach, atDetachState;  // called in the two functions below
 
 }  // namespace
 
@@ -26,7 +29,14 @@ extern "C" int pthread_detach(pthread_t thread) noexcept {
         reinterpret_cast<int (*)(pthread_t)>(dlsym(RTLD_NEXT, "pthread_detach"));
     if (thread == 0) ++nobodyDetached;
     latestDetached = thread;
+    if (atDetach) atDetach();
     return real(thread);
+}
+extern "C" int pthread_attr_setdetachstate(pthread_attr_t* attributes, int state) noexcept {
+    static const auto real = reinterpret_cast<int (*)(pthread_attr_t*, int)>(
+        dlsym(RTLD_NEXT, "pthread_attr_setdetachstate"));
+    if (atDetachState) atDetachState();
+    return real(attributes, state);
 }
 
 namespace {
@@ -251,6 +261,62 @@ TEST_F(LifeStopTest, DoesNotWaitForAManagerThatHangsInTheHostsNames) {
     EXPECT_EQ(GetSystemName(), nullptr) << "they are not this life's any more";
     EXPECT_EQ(GetHostName(), nullptr);
     EXPECT_EQ(GetSystemClassName(), nullptr);
+}
+
+TEST_F(LifeStopTest, WaitsUntilTheThreadsArePrepared) {
+    // Only what a member of a life starts is refused when it is over.
+    const LifeMember member;
+    atDetachState = [this] { stopMeanwhile(); };
+    InitPlexorThreads(ctx());
+    atDetachState = nullptr;
+    EXPECT_TRUE(stopHadToWait());
+    CleanupPlexorThreads();
+}
+
+TEST_F(LifeStopTest, WaitsUntilAThreadIsStarted) {
+    presentVendor();
+    callFactory();
+    ASSERT_TRUE(inventoryTaken());
+    settleWorkers();
+    Gate gate;
+    testbed::FaultRule rule;
+    rule.entry = Entry::Associators;
+    rule.resultClass = "CIM_Battery";
+    rule.times = 1;
+    rule.hook = [&gate] { gate.pass(); };
+    faults().add(rule);
+    VirtualClock::advance(100);
+    testbed::InstanceClient(broker, &mi).enumerateInstances("Tovexa_PlexorBattery");
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    const plexortest::GivenUpInventory givenUp;
+    {
+        const plexortest::HurriedWaits hurry;
+        EXPECT_EQ(PlexorProviderCleanup(&mi, ctx(), 1).rc, CMPI_RC_OK);
+    }
+    atDetach = [this] { stopMeanwhile(); };
+    callFactory();
+    atDetach = nullptr;
+    EXPECT_TRUE(stopHadToWait());
+    gate.open();
+    EXPECT_TRUE(plexortest::WorkersMeet::untilIdle());
+}
+
+TEST_F(LifeStopTest, WaitsUntilTheNamesOfAHostWithoutAVendorAreReleased) {
+    vendor.host();
+    const char* name = nullptr;
+    testbed::FaultRule profiles;
+    profiles.entry = Entry::EnumerateInstances;
+    profiles.keepResult = true;
+    profiles.hook = [&name] { name = GetSystemName(); };
+    faults().add(profiles);
+    {
+        const plexortest::FreeWatch watch([&](const void* block) {
+            if (block != nullptr && block == name) stopMeanwhile();
+        });
+        callFactory();
+    }
+    EXPECT_NE(name, nullptr);
+    EXPECT_TRUE(stopHadToWait());
 }
 
 TEST_F(LifeStopTest, WaitsUntilAnItemIsQueued) {

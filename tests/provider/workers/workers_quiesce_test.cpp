@@ -52,6 +52,24 @@ TEST_F(WorkersQuiesce, ItWaitsForEveryRunningItem) {
     EXPECT_EQ(tasks_.ended(), 2);
 }
 
+TEST_F(WorkersQuiesce, AHurryThatComesBetweenALookAndTheWaitIsNotLost) {
+    Gate gate;
+    const GateOpener opener(gate);
+    occupyWorkers(1, gate);
+    static std::future<void> hurrying;
+    hurrying = {};
+    EXPECT_FALSE(QuiesceWorkers([] {
+        if (hurrying.valid()) return Deadline::Now();
+        const Deadline late = Deadline::In(3600);
+        hurrying = std::async(std::launch::async, WakeQuiesce);
+        hurrying.wait_for(std::chrono::milliseconds(50));
+        return late;
+    }));
+    hurrying.get();
+    gate.open();
+    EXPECT_TRUE(eventually([this] { return tasks_.ended() == 1; }));
+}
+
 TEST_F(WorkersQuiesce, AnItemRunsUntilItsThreadIsFlushed) {
     if (!kContextHasFlush) GTEST_SKIP() << "no context entry to hold up";
     Gate gate;

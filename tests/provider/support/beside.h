@@ -1,0 +1,35 @@
+// Another thread that is at it all the time, for the thread sanitizer.
+#pragma once
+
+#include <atomic>
+#include <functional>
+#include <thread>
+
+namespace plexortest {
+
+/// Does something over and over on a thread of its own, for a scope.
+class Beside {
+public:
+    explicit Beside(std::function<void()> act)
+        : thread_([this, act = std::move(act)] {
+              while (!done_.load(std::memory_order_relaxed)) act();
+          }) {}
+    ~Beside() {
+        done_.store(true, std::memory_order_relaxed);
+        thread_.join();
+    }
+    Beside(const Beside&) = delete;
+    Beside& operator=(const Beside&) = delete;
+
+private:
+    std::atomic<bool> done_ = false;
+    std::thread thread_;
+};
+
+/// Writes and reads a word without changing it, and without ordering anything.
+template <typename Word>
+void touch(Word& word) {
+    __atomic_fetch_add(&word, 0, __ATOMIC_RELAXED);
+}
+
+}  // namespace plexortest

@@ -1,0 +1,155 @@
+// Words that threads share without a lock, or under one that others hold for longer. What this
+// finds, the thread sanitizer tells: a thread beside the provider's touches them all the time and
+// orders nothing by that.
+#include <stdlib.h>
+
+#include "PlexorProviderUtilLife.h"
+#include "beside.h"
+#include "entry_fixture.h"
+#include "worker_harness.h"
+
+namespace plexortest {
+namespace {
+
+using testbed::Entry;
+using testbed::FaultRule;
+
+void touchAll(RaidController_t* ctrl) {
+    for (time_t RaidController_t::*word :
+         {&RaidController_t::ControllerUpdateTime, &RaidController_t::ChassisUpdateTime,
+          &RaidController_t::PoolUpdateTime, &RaidController_t::VolumeUpdateTime,
+          &RaidController_t::DiskUpdateTime, &RaidController_t::PortUpdateTime,
+          &RaidController_t::BatteryUpdateTime}) {
+        touch(ctrl->*word);
+    }
+}
+
+class SharedWordsTest : public EntryTest {
+protected:
+    void SetUp() override {
+        EntryTest::SetUp();
+        presentVendor();
+        // Its lock would order what it tells of.
+        CapturedSyslog::discard(true);
+    }
+    void TearDown() override {
+        CapturedSyslog::discard(false);
+        EntryTest::TearDown();
+    }
+    void load() {
+        callFactory();
+        ASSERT_TRUE(inventoryTaken());
+        settleWorkers();
+    }
+    CMPIrc cleanUp(bool terminating) {
+        return testbed::InstanceClient(broker, &mi).cleanup(terminating);
+    }
+    void askForAllClasses() {
+        testbed::InstanceClient client(broker, &mi);
+        for (const char* name :
+             {"Tovexa_PlexorController", "Tovexa_PlexorStorageExtent", "Tovexa_PlexorStorageVolume",
+              "Tovexa_PlexorSASSATAPort", "Tovexa_PlexorBattery"}) {
+            client.enumerateInstances(name);
+        }
+    }
+};
+
+TEST_F(SharedWordsTest, ALifeSharesItsOwn) {
+    const Beside others([] {
+        touch(_ProviderInitialized);
+        touch(InitCompleteTime);
+        touch(StateUpdateInterval);
+        touch(NextUnloadTime);
+        touch(IdleTimeBeforeTerminating);
+        touch(Broker);
+        touch(waitDebug);
+    });
+    load();
+    for (int i = 0; i < 3; i++) {
+        VirtualClock::advance(100);
+        askForAllClasses();
+        EXPECT_TRUE(WorkersMeet::untilIdle());
+    }
+    EXPECT_EQ(cleanUp(false), CMPI_RC_DO_NOT_UNLOAD);
+    EXPECT_EQ(cleanUp(true), CMPI_RC_OK);
+}
+
+TEST_F(SharedWordsTest, ADebuggersMarkIsShared) {
+    setenv("WAIT_PROC", "1", 1);
+    VirtualClock::onSleep([](unsigned int) { __atomic_store_n(&waitDebug, 0, __ATOMIC_RELAXED); });
+    {
+        const Beside others([] { touch(waitDebug); });
+        callFactory();
+    }
+    unsetenv("WAIT_PROC");
+    EXPECT_GE(VirtualClock::sleeps().size(), 1u);
+    ASSERT_TRUE(inventoryTaken());
+}
+
+TEST_F(SharedWordsTest, AnInventorySharesTheTimesOfItsClasses) {
+    Gate gate;
+    const GateOpener opener(gate);
+    FaultRule first;
+    first.entry = Entry::Associators;
+    first.assocClass = "CIM_HostedStoragePool";
+    first.times = 1;
+    first.hook = [&gate] { gate.pass(); };
+    faults().add(first);
+    callFactory();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    RaidController_t* const ctrl = firstController();
+    const Beside others([ctrl] { touchAll(ctrl); });
+    gate.open();
+    ASSERT_TRUE(inventoryTaken());
+    settleWorkers();
+}
+
+TEST_F(SharedWordsTest, RefreshesShareTheTimesOfTheirClasses) {
+    load();
+    RaidController_t* const ctrl = firstController();
+    const Beside others([ctrl] {
+        touchAll(ctrl);
+        touch(StateUpdateInterval);
+    });
+    for (int i = 0; i < 3; i++) {
+        VirtualClock::advance(100);
+        askForAllClasses();
+        EXPECT_TRUE(WorkersMeet::untilIdle());
+        CheckAndUpdateControllerInfo(&mi, ctx(), ctrl, nullptr, nullptr);
+    }
+}
+
+TEST_F(SharedWordsTest, NamesAreReadWhileTheyComeAndGo) {
+    const Beside others([] {
+        GetSystemName();
+        GetHostName();
+        GetSystemClassName();
+    });
+    for (int i = 0; i < 5; i++) {
+        EXPECT_EQ(InitSystemInfo(&mi, ctx()), 0);
+        ReleaseSystemInfo();
+    }
+}
+
+// Read plainly, as nobody but who holds the life still may.
+
+TEST_F(SharedWordsTest, AnInitialisationMarksItselfWhileItsLifeIsHeldStill) {
+    const Beside others([] {
+        const LifeGuard life;
+        static_cast<void>(*static_cast<volatile int*>(&_ProviderInitialized));
+    });
+    callFactory();
+    ASSERT_TRUE(inventoryTaken());
+}
+
+TEST_F(SharedWordsTest, AnInventoryOpensItsGateWhileItsLifeIsHeldStill) {
+    const Beside others([] {
+        const LifeGuard life;
+        static_cast<void>(*static_cast<volatile unsigned int*>(&ThreadActivityDone));
+    });
+    callFactory();
+    ASSERT_TRUE(inventoryTaken());
+}
+
+}  // namespace
+}  // namespace plexortest
