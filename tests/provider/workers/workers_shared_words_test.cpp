@@ -3,9 +3,12 @@
 // orders nothing by that.
 #include <stdlib.h>
 
+#include <optional>
+
 #include "PlexorProviderUtilLife.h"
 #include "beside.h"
 #include "entry_fixture.h"
+#include "real_waits.h"
 #include "worker_harness.h"
 
 namespace plexortest {
@@ -65,6 +68,7 @@ TEST_F(SharedWordsTest, ALifeSharesItsOwn) {
         touch(waitDebug);
     });
     load();
+    __atomic_store_n(&IdleTimeBeforeTerminating, 99u, __ATOMIC_RELAXED);
     for (int i = 0; i < 3; i++) {
         VirtualClock::advance(100);
         askForAllClasses();
@@ -149,6 +153,47 @@ TEST_F(SharedWordsTest, AnInventoryOpensItsGateWhileItsLifeIsHeldStill) {
     });
     callFactory();
     ASSERT_TRUE(inventoryTaken());
+}
+
+TEST_F(SharedWordsTest, ARefusedCleanupLooksForControllersWhileTheLifeIsHeldStill) {
+    load();
+    askForAllClasses();
+    settleWorkers();
+    const Beside others([] {
+        const LifeGuard life;
+        auto* const head = static_cast<List_Entry_t* volatile*>(&RaidControllerList->Head);
+        auto* const size = static_cast<volatile unsigned int*>(&RaidControllerList->Size);
+        *head = *head;
+        *size = *size;
+    });
+    for (int i = 0; i < 20; i++) EXPECT_EQ(cleanUp(false), CMPI_RC_DO_NOT_UNLOAD);
+}
+
+TEST_F(SharedWordsTest, AnInventoryIsGivenUpWhileItsLifeIsHeldStill) {
+    load();
+    Gate gate;
+    const GateOpener opener(gate);
+    FaultRule walk;
+    walk.entry = Entry::Associators;
+    walk.resultClass = "CIM_Battery";
+    walk.times = 1;
+    walk.hook = [&gate] { gate.pass(); };
+    faults().add(walk);
+    VirtualClock::advance(100);
+    askForAllClasses();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    std::optional<GivenUpInventory> givenUp(std::in_place);
+    {
+        const Beside others([] {
+            const LifeGuard life;
+            static_cast<void>(*static_cast<List_Entry_t* volatile*>(&RaidControllerList->Head));
+        });
+        const HurriedWaits hurry;
+        EXPECT_EQ(cleanUp(true), CMPI_RC_OK);
+    }
+    EXPECT_EQ(controllers(), 0u);
+    gate.open();
+    EXPECT_TRUE(WorkersMeet::untilIdle());
 }
 
 }  // namespace
