@@ -19,7 +19,8 @@ OTHERS_SECONDS = 60  # what a program with a few quick tests gets
 SLOW_AT_ONCE = 4  # they wait more than they compute
 MEMORY = 4 << 30  # in use: a mutant may allocate for ever, and checkers reserve addresses without end
 OUTPUT = 64 << 20
-CHECKER_FAULT = "LeakSanitizer: SEGV"  # its own: it may stumble over a thread that ends, whatever is tested
+# Also its own: it may stumble over a thread that ends, whatever is tested.
+CHECKER_FAULT = "LeakSanitizer: SEGV"
 
 # Folders of tests/provider in which a source's own tests are, by the beginning of its name.
 NEAR = {
@@ -227,7 +228,8 @@ class Tests:
     def _again(self, outcome, groups):
         """Whether it fails again: what fails only once may be the machine's fault."""
         if outcome.test not in self.times:
-            return outcome.why != CHECKER_FAULT or self.program.run(groups, self._limit(groups)).failed
+            crashed = outcome.why.startswith(CHECKER_FAULT)
+            return not crashed or self.program.run(groups, self._limit(groups)).failed
         alone = [[self.times[outcome.test]]]
         if self.program.run(alone, self._limit(alone)).failed:
             return True

@@ -297,6 +297,8 @@ TEST_F(LifeStopTest, WaitsUntilAThreadIsStarted) {
     callFactory();
     atDetach = nullptr;
     EXPECT_TRUE(stopHadToWait());
+    // Whatever had been queued before the stop came.
+    EXPECT_EQ(PlexorProviderCleanup(&mi, ctx(), 1).rc, CMPI_RC_OK);
     gate.open();
     EXPECT_TRUE(plexortest::WorkersMeet::untilIdle());
 }
