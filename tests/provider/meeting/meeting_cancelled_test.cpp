@@ -231,6 +231,7 @@ TEST_F(CancelledTest, AnInitialisationIsTakenBackWhileItsLifeIsHeldStill) {
     std::optional<plexortest::GivenUpInventory> givenUp;
     {
         const plexortest::Beside others([] {
+            plexortest::touch(_ProviderInitialized);
             const LifeGuard life;
             // Read plainly, as nobody but who holds the life still may.
             static_cast<void>(*static_cast<List_Entry_t* volatile*>(&RaidControllerList->Head));
