@@ -321,6 +321,20 @@ TEST_F(LifeStopTest, WaitsUntilTheNamesOfAHostWithoutAVendorAreReleased) {
     EXPECT_TRUE(stopHadToWait());
 }
 
+TEST_F(LifeStopTest, WaitsUntilTheHostsNamesAreStored) {
+    vendor.host();
+    // What an earlier, incomplete reading has left is released before.
+    __HostName = plexortest::ownedCopy("left over");
+    {
+        const plexortest::FreeWatch watch([this, left = __HostName](const void* block) {
+            if (block == left) stopMeanwhile();
+        });
+        InitSystemInfo(&mi, ctx());
+    }
+    EXPECT_TRUE(stopHadToWait());
+    EXPECT_STREQ(GetSystemName(), "host-uuid");
+}
+
 TEST_F(LifeStopTest, WaitsUntilAnItemIsQueued) {
     // Only what a member of a life queues is refused when it is over.
     const LifeMember member;

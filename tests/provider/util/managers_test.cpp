@@ -4,7 +4,9 @@
 #include <memory>
 
 #include "PlexorProviderCfg.h"
+#include "PlexorProviderUtilLife.h"
 #include "PlexorProviderUtilManager.h"
+#include "beside.h"
 #include "entry_fixture.h"
 #include "fake_instance.h"
 #include "keys_fake_path.h"
@@ -248,6 +250,21 @@ TEST_F(LargeManagerTest, AKeyThatWasCopiedIsNotAskedForAgain) {
         EXPECT_EQ(key.setIn(plexortest::dataOf(CMPI_string, 1), copied), "nothing");
     }
     EXPECT_EQ(key.asked, 1);
+}
+
+TEST_F(LargeManagerTest, RequestsLearnAtTheSameTimeThatKeysAreCopied) {
+    KeyCopying copying;
+    const auto complete = [&copying] {
+        OneKey key;
+        plexortest::FakeInstance fake(plexortest::dataOf(CMPI_string, 1));
+        CompleteKeys(&fake.instance, &key.path, copying);
+    };
+    const plexortest::Beside others(complete);
+    for (int i = 0; i < 10; i++) {
+        complete();
+        others.awaitRound();
+    }
+    EXPECT_EQ(copying.copiedInLife, PresentLife());
 }
 
 TEST_F(LargeManagerTest, APropertyThatTheInstanceDoesNotHaveIsNotMissed) {

@@ -131,7 +131,9 @@ TEST_F(SharedWordsTest, NamesAreReadWhileTheyComeAndGo) {
     });
     for (int i = 0; i < 5; i++) {
         EXPECT_EQ(InitSystemInfo(&mi, ctx()), 0);
+        others.awaitRound();
         ReleaseSystemInfo();
+        others.awaitRound();
     }
 }
 
