@@ -5,6 +5,7 @@
 
 #include <optional>
 
+#include "PlexorProviderUtil.h"
 #include "PlexorProviderUtilLife.h"
 #include "beside.h"
 #include "entry_fixture.h"
@@ -134,6 +135,13 @@ TEST_F(SharedWordsTest, NamesAreReadWhileTheyComeAndGo) {
         others.awaitRound();
         ReleaseSystemInfo();
         others.awaitRound();
+
+        EXPECT_EQ(InitSystemInfo(&mi, ctx()), 0);
+        const auto names = {__SystemName, __HostName, __SystemClassName};
+        others.awaitRound();
+        GiveUpSystemInfo();
+        others.awaitRound();
+        for (char* name : names) free(name);
     }
 }
 
