@@ -22,13 +22,6 @@ protected:
         settleWorkers();
         CapturedSyslog::clear();
     }
-    testbed::FaultRule waitingAt(testbed::Entry entry, Gate& gate) {
-        testbed::FaultRule rule;
-        rule.entry = entry;
-        rule.times = 1;
-        rule.hook = [&gate] { gate.pass(); };
-        return rule;
-    }
     std::future<std::size_t> requestDrives() {
         return std::async(std::launch::async, [this] {
             return testbed::InstanceClient(broker, &mi)

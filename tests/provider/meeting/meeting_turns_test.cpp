@@ -30,8 +30,15 @@ namespace {
 using plexortest::HurriedWaits;
 
 using FactoryTurnsTest = plexortest::EntryTest;
-
 using CleanupTurnsTest = plexortest::EntryTest;
+
+/// What a busy machine has taken of it before it began is not waited for.
+void expectAWaitOf(HurriedWaits::Duration limit) {
+    const auto waited = HurriedWaits::otherWaits();
+    ASSERT_FALSE(waited.empty());
+    EXPECT_LE(waited.front(), limit);
+    EXPECT_GT(waited.front(), limit / 2);
+}
 
 TEST_F(CleanupTurnsTest, ACleanupLeavesAfterThoseThatWaitForIt) {
     std::optional<CleanupTurn> turn(std::in_place, 60, nullptr);
@@ -73,8 +80,7 @@ TEST_F(CleanupTurnsTest, NewcomersGetASecondToLeave) {
     const RequestInFlight newcomer;
     const HurriedWaits hurry(HurriedWaits::Conditions);
     EXPECT_FALSE(turn.AwaitNewcomers());
-    EXPECT_EQ(HurriedWaits::otherWaits(),
-              std::vector<HurriedWaits::Duration>{std::chrono::seconds(1)});
+    expectAWaitOf(std::chrono::seconds(1));
 }
 
 TEST_F(CleanupTurnsTest, ARequestThatWasGivenUpIsNoNewcomer) {
@@ -111,8 +117,7 @@ TEST_F(FactoryTurnsTest, ACallWaitsHalfAMinuteForAnother) {
         FactoryCall second;
         EXPECT_FALSE(second.TakeTurn());
     }).join();
-    EXPECT_EQ(HurriedWaits::otherWaits(),
-              std::vector<HurriedWaits::Duration>{std::chrono::seconds(30)});
+    expectAWaitOf(std::chrono::seconds(30));
     EXPECT_EQ(PresentLife(), life);
 }
 

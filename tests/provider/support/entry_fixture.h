@@ -13,6 +13,7 @@
 #include "instance_client.h"
 #include "provider_fixture.h"
 #include "vendor_objects.h"
+#include "worker_harness.h"
 
 namespace plexortest {
 
@@ -106,6 +107,15 @@ protected:
         vendor.drive(controller, "d1", pool);
         vendor.port(controller, "p1");
         vendor.battery(controller, "b1");
+    }
+
+    /// A rule that lets the first call of `entry` wait at the gate; refine it, and add it.
+    static testbed::FaultRule waitingAt(testbed::Entry entry, Gate& gate) {
+        testbed::FaultRule rule;
+        rule.entry = entry;
+        rule.times = 1;
+        rule.hook = [&gate] { gate.pass(); };
+        return rule;
     }
 
     /// The factory, called by the manager on this thread.

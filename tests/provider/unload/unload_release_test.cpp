@@ -174,11 +174,8 @@ TEST_F(UnloadReleaseTest, WorkLeftInTheQueueIsDropped) {
 // The manager's answer must wait: what a worker is reading must not go under its hands.
 TEST_F(UnloadReleaseTest, WaitsForTheWorkThatIsRunning) {
     Gate gate;
-    testbed::FaultRule slow;
-    slow.entry = Entry::Associators;
+    testbed::FaultRule slow = waitingAt(Entry::Associators, gate);
     slow.assocClass = "CIM_SystemDevice";
-    slow.times = 1;
-    slow.hook = [&gate] { gate.pass(); };
     faults().add(slow);
     const GateOpener opener(gate);
     VirtualClock::advance(100);

@@ -279,11 +279,8 @@ TEST_F(LifeStopTest, WaitsUntilAThreadIsStarted) {
     ASSERT_TRUE(inventoryTaken());
     settleWorkers();
     Gate gate;
-    testbed::FaultRule rule;
-    rule.entry = Entry::Associators;
+    testbed::FaultRule rule = waitingAt(Entry::Associators, gate);
     rule.resultClass = "CIM_Battery";
-    rule.times = 1;
-    rule.hook = [&gate] { gate.pass(); };
     faults().add(rule);
     VirtualClock::advance(100);
     testbed::InstanceClient(broker, &mi).enumerateInstances("Tovexa_PlexorBattery");

@@ -94,11 +94,8 @@ TEST_F(SharedWordsTest, ADebuggersMarkIsShared) {
 TEST_F(SharedWordsTest, AnInventorySharesTheTimesOfItsClasses) {
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule first;
-    first.entry = Entry::Associators;
+    FaultRule first = waitingAt(Entry::Associators, gate);
     first.assocClass = "CIM_HostedStoragePool";
-    first.times = 1;
-    first.hook = [&gate] { gate.pass(); };
     faults().add(first);
     callFactory();
     ASSERT_TRUE(gate.awaitArrivals(1));
@@ -183,11 +180,8 @@ TEST_F(SharedWordsTest, AnInventoryIsGivenUpWhileItsLifeIsHeldStill) {
     load();
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule walk;
-    walk.entry = Entry::Associators;
+    FaultRule walk = waitingAt(Entry::Associators, gate);
     walk.resultClass = "CIM_Battery";
-    walk.times = 1;
-    walk.hook = [&gate] { gate.pass(); };
     faults().add(walk);
     VirtualClock::advance(100);
     askForAllClasses();
