@@ -16,11 +16,13 @@ from mutation.tree import SOURCES, TreeError
 
 QUICK_SECONDS = 0.1  # tests that take longer come last, several at a time
 OTHERS_SECONDS = 60  # what a program with a few quick tests gets
+LEAST_SECONDS = 20  # what a group of tests gets, beside five times what it took before
 SLOW_AT_ONCE = 4  # they wait more than they compute
 MEMORY = 4 << 30  # in use: a mutant may allocate for ever, and checkers reserve addresses without end
 OUTPUT = 64 << 20
 # Also its own: it may stumble over a thread that ends, whatever is tested.
 CHECKER_FAULT = "LeakSanitizer: SEGV"
+HANGS = "hangs"
 
 # Folders of tests/provider in which a source's own tests are, by the beginning of its name.
 NEAR = {
@@ -110,7 +112,7 @@ class Program:
                 break
             else:
                 if time.monotonic() > deadline:
-                    return Outcome(True, "hangs")
+                    return Outcome(True, HANGS)
                 if any(memory_of(entry[0]) > MEMORY for entry in left):
                     return Outcome(True, "takes all memory")
                 time.sleep(0.02)
@@ -223,13 +225,13 @@ class Tests:
 
     @staticmethod
     def _limit(groups):
-        return 20 + 5 * max(sum(test.seconds for test in group) for group in groups)
+        return LEAST_SECONDS + 5 * max(sum(test.seconds for test in group) for group in groups)
 
     def _again(self, outcome, groups):
         """Whether it fails again: what fails only once may be the machine's fault."""
         if outcome.test not in self.times:
-            crashed = outcome.why.startswith(CHECKER_FAULT)
-            return not crashed or self.program.run(groups, self._limit(groups)).failed
+            doubtful = outcome.why == HANGS or outcome.why.startswith(CHECKER_FAULT)
+            return not doubtful or self.program.run(groups, self._limit(groups)).failed
         alone = [[self.times[outcome.test]]]
         if self.program.run(alone, self._limit(alone)).failed:
             return True
