@@ -4,7 +4,9 @@
 #include <stdlib.h>
 
 #include <optional>
+#include <thread>
 
+#include "PlexorProviderLock.h"
 #include "PlexorProviderUtil.h"
 #include "PlexorProviderUtilLife.h"
 #include "beside.h"
@@ -44,6 +46,11 @@ protected:
         callFactory();
         ASSERT_TRUE(inventoryTaken());
         settleWorkers();
+    }
+    /// How many workers.
+    static std::size_t haveLeft() {
+        return CapturedSyslog::count("Thread 0 exiting...\n") +
+               CapturedSyslog::count("Thread 1 exiting...\n");
     }
     CMPIrc cleanUp(bool terminating) {
         return testbed::InstanceClient(broker, &mi).cleanup(terminating);
@@ -140,6 +147,45 @@ TEST_F(SharedWordsTest, NamesAreReadWhileTheyComeAndGo) {
         others.awaitRound();
         for (char* name : names) free(name);
     }
+}
+
+TEST_F(SharedWordsTest, AWordThatWasResetIsForgottenBesideAWorkerThatWasLeftBehind) {
+    // What a worker says last comes before its last look.
+    CapturedSyslog::discard(false);
+    load();
+    Gate gate;
+    const GateOpener opener(gate);
+    FaultRule walk = waitingAt(Entry::Associators, gate);
+    walk.resultClass = "CIM_Battery";
+    faults().add(walk);
+    VirtualClock::advance(100);
+    askForAllClasses();
+    ASSERT_TRUE(gate.awaitArrivals(1));
+    // One that is busy when it is told to leave stays for another wake-up.
+    ASSERT_TRUE(eventually([] {
+        const WorkersHeld held;
+        return IsFifoEmpty(&__FIFO) && ActiveThreads == 1;
+    }));
+    std::optional<GivenUpInventory> givenUp(std::in_place);
+    {
+        const HurriedWaits hurry;
+        EXPECT_EQ(cleanUp(true), CMPI_RC_OK);
+    }
+    ASSERT_TRUE(eventually([] { return haveLeft() == 1; }));
+    gate.open();
+    // On a thread of its own, which orders nothing for the one that calls the factory.
+    std::thread host([] {
+        for (bool reset = false; !reset; std::this_thread::yield()) {
+            const MutexGuard lock(PlexorThreadMutex);
+            reset = ActiveThreads == 0;
+            if (reset) StoreShared(TerminateThread, 0u);
+        }
+    });
+    while (LoadShared(TerminateThread) != 0) std::this_thread::yield();
+    callFactory();
+    host.join();
+    EXPECT_TRUE(inventoryTaken());
+    EXPECT_TRUE(eventually([] { return haveLeft() == 2; })) << "after which the broker may go";
 }
 
 // Read plainly, as nobody but who holds the life still may.
