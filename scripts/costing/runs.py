@@ -37,9 +37,10 @@ def run(command, **more):
 
 
 def build(root, directory):
-    """The benchmarks, with what is there already left as it is configured."""
-    if not (directory / "CMakeCache.txt").exists():
-        run(["cmake", "--preset", "release", "-B", directory], cwd=root, stdout=subprocess.DEVNULL)
+    """The benchmarks, which the tests' build leaves out; all else stays as it is configured."""
+    preset = [] if (directory / "CMakeCache.txt").exists() else ["--preset", "release"]
+    run(["cmake", *preset, "-S", root, "-B", directory, "-DPLEXOR_BUILD_BENCH=ON"],
+        cwd=root, stdout=subprocess.DEVNULL)
     run(["cmake", "--build", directory, "--target", "cost-programs"], stdout=subprocess.DEVNULL)
     if not (directory / "bin/serving-cost").exists():
         raise RunError("google-benchmark is missing: scripts/install-deps costs")

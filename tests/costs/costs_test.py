@@ -8,6 +8,7 @@ import importlib.machinery
 import io
 import json
 import pathlib
+import subprocess
 import sys
 import tempfile
 import unittest
@@ -21,6 +22,22 @@ SERVING = {"masked/names/24/bare": 100.0, "masked/names/24/provider": 111.0,
            "masked/names/24/ratio": 1.10}  # the middle one of the ratios, not that of the middle times
 COUNTS = {"get/24/calls": 26, "get/240/calls": 26, "get/1000/calls": 26}
 
+
+# Benchmarks that a build may leave out, and something else that it was told.
+PROJECT = """\
+cmake_minimum_required(VERSION 3.25)
+project(Thing NONE)
+option(PLEXOR_BUILD_BENCH "Build the benchmarks" ON)
+if(PLEXOR_BUILD_BENCH)
+    file(WRITE ${CMAKE_BINARY_DIR}/told "${TOLD}")
+    add_custom_target(cost-programs
+        COMMAND ${CMAKE_COMMAND} -E make_directory bin
+        COMMAND ${CMAKE_COMMAND} -E touch bin/serving-cost)
+endif()
+"""
+PRESETS = {"version": 5, "configurePresets": [
+    {"name": "release", "generator": "Ninja", "cacheVariables": {"TOLD": "by the preset"}},
+]}
 
 def judged(measurements, *options):
     """Exit status and lines of the table for these measurements."""
@@ -76,6 +93,32 @@ class Page(unittest.TestCase):
         with contextlib.redirect_stdout(out):
             costs.main(["--judge", str(SOURCE / "docs/performance.json"), "--markdown"])
         self.assertIn(out.getvalue(), page)
+
+
+class Build(unittest.TestCase):
+    def setUp(self):
+        folder = tempfile.TemporaryDirectory()
+        self.addCleanup(folder.cleanup)
+        self.root = pathlib.Path(folder.name)
+        self.build = self.root / "build"
+        (self.root / "CMakeLists.txt").write_text(PROJECT)
+        (self.root / "CMakePresets.json").write_text(json.dumps(PRESETS))
+
+    def told(self):
+        """What a build was told that has the benchmarks now."""
+        with contextlib.redirect_stdout(io.StringIO()):
+            costs.build(self.root, self.build)
+        self.assertTrue((self.build / "bin/serving-cost").exists())
+        return (self.build / "told").read_text()
+
+    def test_a_new_build_is_the_preset_s(self):
+        self.assertEqual(self.told(), "by the preset")
+
+    def test_a_build_that_left_the_benchmarks_out_gets_them(self):
+        subprocess.run(["cmake", "-G", "Ninja", "-S", self.root, "-B", self.build,
+                        "-DPLEXOR_BUILD_BENCH=OFF", "-DTOLD=by its owner"],
+                       check=True, stdout=subprocess.DEVNULL)
+        self.assertEqual(self.told(), "by its owner")
 
 
 if __name__ == "__main__":
