@@ -63,6 +63,15 @@ protected:
             client.enumerateInstances(name);
         }
     }
+    /// In a refresh of the batteries.
+    void holdAWorker(Gate& gate) {
+        FaultRule walk = waitingAt(Entry::Associators, gate);
+        walk.resultClass = "CIM_Battery";
+        faults().add(walk);
+        VirtualClock::advance(100);
+        askForAllClasses();
+        ASSERT_TRUE(gate.awaitArrivals(1));
+    }
 };
 
 TEST_F(SharedWordsTest, ALifeSharesItsOwn) {
@@ -155,12 +164,7 @@ TEST_F(SharedWordsTest, AWordThatWasResetIsForgottenBesideAWorkerThatWasLeftBehi
     load();
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule walk = waitingAt(Entry::Associators, gate);
-    walk.resultClass = "CIM_Battery";
-    faults().add(walk);
-    VirtualClock::advance(100);
-    askForAllClasses();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    holdAWorker(gate);
     // One that is busy when it is told to leave stays for another wake-up.
     ASSERT_TRUE(eventually([] {
         const WorkersHeld held;
@@ -226,12 +230,7 @@ TEST_F(SharedWordsTest, AnInventoryIsGivenUpWhileItsLifeIsHeldStill) {
     load();
     Gate gate;
     const GateOpener opener(gate);
-    FaultRule walk = waitingAt(Entry::Associators, gate);
-    walk.resultClass = "CIM_Battery";
-    faults().add(walk);
-    VirtualClock::advance(100);
-    askForAllClasses();
-    ASSERT_TRUE(gate.awaitArrivals(1));
+    holdAWorker(gate);
     std::optional<GivenUpInventory> givenUp(std::in_place);
     {
         const Beside others([] {
