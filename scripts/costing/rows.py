@@ -13,7 +13,7 @@ SERVING_RATIO = 1.10      # to a provider that answers with constants, the log m
 SERVING_DRIVES = 1000     # up to that many drives
 MASKED_LINE_NS = 20
 # What four times as many drives may cost each: 1 is linear, 4 would be each drive looking at all. Memory
-# further away takes its share, twice as much where others use the processor's cache too.
+# further away takes its share, more in some runs than in others.
 LINEAR = 2
 # Calls, lines and allocations, masked: a fixed part and one for each drive.
 COUNTS = {

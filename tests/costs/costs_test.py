@@ -39,6 +39,7 @@ PRESETS = {"version": 5, "configurePresets": [
     {"name": "release", "generator": "Ninja", "cacheVariables": {"TOLD": "by the preset"}},
 ]}
 
+
 def judged(measurements, *options):
     """Exit status and lines of the table for these measurements."""
     with tempfile.NamedTemporaryFile("w", suffix=".json") as file:
